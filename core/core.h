@@ -1,0 +1,109 @@
+// Toolbar core: memory blocks, pointer lists, strings, the client registry,
+// the manager and its item catalog. What the rest of the library may call.
+#pragma once
+
+#include "qbr_records.h"
+
+// ---- Memory blocks ------------------------------------------------------
+// Movable global memory, locked for life; the address is the identity.
+UINT MemoryBlockAlloc(void **out, UINT size, UINT shared);
+void MemoryBlockFree(void *block);
+UINT MemoryBlockResize(void **inout, UINT size);
+UINT BlockMove(void *dest, const void *src, UINT size);
+UINT BlockCopy(void *dest, const void *src, UINT size);
+UINT BlockFill(void *dest, BYTE value, UINT size);
+
+// Typed convenience over MemoryBlockAlloc for the library's records.
+template <typename T> inline UINT MemoryBlockAllocRecord(T **out, UINT shared = 0) {
+    void *block = nullptr;
+    UINT ok = MemoryBlockAlloc(&block, static_cast<UINT>(sizeof(T)), shared);
+    *out = static_cast<T *>(block);
+    return ok;
+}
+
+// ---- Pointer lists ------------------------------------------------------
+PointerList *PointerListCreate(UINT initialCapacity, UINT growStep, UINT shared);
+void PointerListDestroy(PointerList *list);
+UINT PointerListCount(const PointerList *list);
+ULONG_PTR PointerListGet(const PointerList *list, UINT index);
+UINT PointerListAppend(PointerList *list, ULONG_PTR value);
+UINT PointerListInsertAt(PointerList *list, UINT index, ULONG_PTR value);
+UINT PointerListInsertBefore(PointerList *list, ULONG_PTR neighbour, ULONG_PTR value);
+UINT PointerListInsertAfter(PointerList *list, ULONG_PTR neighbour, ULONG_PTR value);
+UINT PointerListReserve(PointerList *list, UINT capacity);
+UINT PointerListFind(const PointerList *list, ULONG_PTR value, UINT *index);
+UINT PointerListRemoveAt(PointerList *list, UINT index);
+UINT PointerListRemove(PointerList *list, ULONG_PTR value);
+UINT PointerListRemoveBefore(PointerList *list, ULONG_PTR neighbour);
+UINT PointerListRemoveAfter(PointerList *list, ULONG_PTR neighbour);
+void PointerListCompact(PointerList *list);
+
+// Typed view over a list of record pointers: the same list, without casts.
+template <typename T> inline T *ListAt(const PointerList *list, UINT index) {
+    return reinterpret_cast<T *>(PointerListGet(list, index));
+}
+template <typename T> inline ULONG_PTR ListValue(T *record) {
+    return reinterpret_cast<ULONG_PTR>(record);
+}
+
+// ---- Strings and comma tokens --------------------------------------------
+UINT StringCopy(LPSTR dest, LPCSTR src);
+UINT StringDuplicate(LPSTR *out, LPCSTR src);
+UINT StringAppend(LPSTR *inout, LPCSTR tail);
+UINT StringsEqual(LPCSTR a, LPCSTR b);
+LPSTR FindCharOrEnd(LPSTR text, char ch);
+int ReadTokenInt(LPSTR text);
+UINT ReadTokenId(LPSTR text);
+UINT ReadTokenFlags(LPSTR text);
+void ReadTokenText(LPSTR text, LPSTR out);
+
+// ---- Client registry -----------------------------------------------------
+extern PointerList *clientTable;
+extern UINT clientCount;
+
+ToolbarClient *CurrentClient();
+ToolbarClient *RegisterClient(HINSTANCE instance, HelpTextProc helpTextProc);
+void UnregisterClient(ToolbarClient *client);
+UINT AdoptModuleInstance(HWND frame);
+UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int *imageHeight,
+                      int *textButtonWidth, int *textButtonHeight);
+UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight);
+
+// ---- Manager and catalog --------------------------------------------------
+UINT AddButtonItem(ToolbarManager *manager, UINT id, UINT imageIndex);
+UINT AddSeparatorItem(ToolbarManager *manager, UINT id, int width, int height);
+UINT ItemAdd(ToolbarManager *manager, UINT kind, UINT id, UINT category, void *data);
+void ItemRemove(ToolbarManager *manager, ToolbarItem *item);
+ToolbarItem *ItemFindById(const PointerList *items, UINT id);
+ToolbarItem *ItemNext(const PointerList *items, const ToolbarItem *previous);
+UINT ItemGetId(const ToolbarItem *item, UINT *out);
+UINT ItemGetCategory(const ToolbarItem *item, UINT *out);
+UINT ItemGetKind(const ToolbarItem *item, UINT *out);
+UINT ItemSetCategory(ToolbarItem *item, UINT category);
+void *ItemGetData(const ToolbarItem *item);
+UINT ItemGetSize(const ToolbarItem *item, int *width, int *height);
+
+UINT ButtonGetImageIndex(const ButtonData *data, UINT *out);
+UINT ButtonSetImageIndex(ButtonData *data, UINT value);
+UINT ButtonGetBehaviour(const ButtonData *data);
+UINT ButtonSetBehaviour(ButtonData *data, UINT value);
+UINT ButtonGetState(const ButtonData *data);
+UINT ButtonSetState(ButtonData *data, UINT state);
+UINT ButtonIsEnabled(const ButtonData *data);
+UINT ButtonSetEnabled(ButtonData *data, UINT enabled);
+UINT ButtonIsPressed(const ButtonData *data);
+UINT ButtonSetPressed(ButtonData *data, UINT pressed);
+
+void RepaintItem(ToolbarManager *manager, ToolbarItem *item);
+int RequestHelpText(UINT id, UINT kind, LPSTR buffer, int size);
+LPCSTR LoadLibraryText(UINT id);
+
+// The buffer size every caller of RequestHelpText passes.
+constexpr int kHelpTextSize = 254;
+
+// ---- Counters that leak tests read -----------------------------------------
+// Live memory blocks and live GDI objects (fonts, brushes, bitmaps, DCs) that
+// the library made and has not yet released. The platform cannot tell us how
+// many GDI objects a process holds, so the library counts its own.
+LONG LiveMemoryBlocks();
+LONG LiveGdiObjects();

@@ -1,0 +1,23 @@
+// The library's count of its own GDI objects, and the one way it makes fonts.
+#include "core/gdi.h"
+
+#include "core/core.h"
+
+static LONG liveGdiObjects = 0;
+
+void GdiCountMade() { ++liveGdiObjects; }
+void GdiCountDeleted() { --liveGdiObjects; }
+LONG LiveGdiObjects() { return liveGdiObjects; }
+
+HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName) {
+    LOGFONTA font;
+    BlockFill(&font, 0, sizeof(font));
+    {
+        ScreenDC screen;
+        font.lfHeight = -MulDiv(points, GetDeviceCaps(screen, LOGPIXELSY), 72);
+    }
+    font.lfWeight = 400;
+    font.lfPitchAndFamily = pitchAndFamily;
+    if (faceName) lstrcpynA(font.lfFaceName, faceName, LF_FACESIZE);
+    return GdiTrack(CreateFontIndirectA(&font));
+}

@@ -1,0 +1,133 @@
+/*
+ * Quaybar: dockable, floating, user-customisable toolbars for Win32 frames.
+ *
+ * The public interface. Every call is a plain C function on the host's one
+ * message thread. A result of 1 means success and 0 failure; a lookup gives
+ * the thing or 0; a null record or window gives 0 and does nothing.
+ *
+ * Order of use: store the program's instance in moduleInstance, call
+ * QBR_Initialize, then QBR_SetNotifyMessages and the global settings, then a
+ * manager per frame window (catalog, image strip, docks and toolbars). At the
+ * end: QBR_DestroyManager for each frame, then QBR_Terminate.
+ */
+#ifndef QUAYBAR_H
+#define QUAYBAR_H
+
+#include <windows.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* Item kinds. */
+#define ITEM_SEPARATOR 0
+#define ITEM_BUTTON 1
+
+/* What a completed press does to a button. */
+#define BTN_PUSH 1
+#define BTN_CHECK 2
+#define BTN_LATCH 4
+
+/* State bits of a button. */
+#define BS_ON 1
+#define BS_MIXED 2
+#define BS_DISABLED 4
+#define BS_PRESSED 8
+
+/* Kinds of text asked of the host's HelpTextProc. */
+#define HELP_QUICK 0
+#define HELP_DESCRIPTION 1
+#define HELP_BUTTON_TEXT 2
+#define HELP_CATEGORY 3
+
+/* Toolbar flag word: show group, place group and four independent bits. */
+#define TBF_VISIBLE 0x0001u
+#define TBF_HIDDEN 0x0002u
+#define TBF_DOCKED 0x0010u
+#define TBF_FLOATING 0x0020u
+#define TBF_NO_FLOAT_SEPARATORS 0x1000u
+#define TBF_LOCKED_ITEMS 0x2000u
+#define TBF_LOCKED_PLACE 0x4000u
+#define TBF_USER_CREATED 0x8000u
+
+/* Dock sides. */
+#define DOCK_TOP 0
+#define DOCK_LEFT 1
+#define DOCK_RIGHT 2
+
+typedef struct ToolbarManager ToolbarManager;
+
+/* The host's text callback: writes the text of an item or category into
+   buffer (at most size characters with the terminator) and gives its
+   length; 0 or less means there is no such text. */
+typedef int(CALLBACK *HelpTextProc)(UINT id, UINT kind, LPSTR buffer, int size);
+
+/* Instance that holds the library's resources (window classes, dialog
+   templates, strings 5101 to 5108). The host stores its own instance here
+   before it creates anything; the resources are linked into the host. */
+extern HINSTANCE moduleInstance;
+
+/* Client and global settings. */
+UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc);
+void QBR_Terminate(void);
+void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage);
+void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight,
+                          int textButtonWidth, int textButtonHeight);
+void QBR_SetQuickHelp(UINT on);
+UINT QBR_GetQuickHelp(void);
+void QBR_SetCustomize(UINT on);
+UINT QBR_GetCustomize(void);
+void QBR_SetButtonText(UINT on);
+UINT QBR_GetButtonText(void);
+
+/* Manager, catalog and buttons. */
+ToolbarManager *QBR_CreateManager(HWND frame);
+void QBR_DestroyManager(ToolbarManager *manager);
+UINT QBR_SetCategories(ToolbarManager *manager, const UINT *ids, UINT count);
+UINT QBR_AddButtons(ToolbarManager *manager, const UINT *ids, UINT count);
+UINT QBR_AssignCategory(ToolbarManager *manager, UINT category, const UINT *ids, UINT count);
+UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName);
+UINT QBR_SetButtonBehaviour(ToolbarManager *manager, UINT id, UINT behaviour);
+UINT QBR_SetButtonState(ToolbarManager *manager, UINT id, UINT state);
+UINT QBR_SetRadioRange(ToolbarManager *manager, UINT first, UINT last, UINT onId);
+UINT QBR_SetButtonEnabled(ToolbarManager *manager, UINT id, UINT enabled);
+UINT QBR_SetButtonPressed(ToolbarManager *manager, UINT id, UINT pressed);
+UINT QBR_SetButtonImage(ToolbarManager *manager, UINT id, UINT imageIndex);
+UINT QBR_GetButtonImage(ToolbarManager *manager, UINT id, UINT *imageIndex);
+UINT QBR_GetButtonBehaviour(ToolbarManager *manager, UINT id);
+UINT QBR_GetButtonState(ToolbarManager *manager, UINT id);
+UINT QBR_IsButtonEnabled(ToolbarManager *manager, UINT id);
+UINT QBR_IsButtonPressed(ToolbarManager *manager, UINT id);
+UINT QBR_GetToolbarCount(ToolbarManager *manager);
+HWND QBR_GetToolbar(ToolbarManager *manager, UINT index);
+
+/* Toolbars. A toolbar is named by the handle of its docked pane. */
+HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock,
+                       const UINT *ids, UINT idCount);
+void QBR_DestroyToolbar(HWND pane);
+UINT QBR_GetToolbarFlags(HWND pane);
+void QBR_SetToolbarFlags(HWND pane, UINT flags);
+void QBR_ReplaceToolbarFlags(HWND pane, UINT flags);
+UINT QBR_IsToolbarFloating(HWND pane);
+UINT QBR_IsToolbarVisible(HWND pane);
+void QBR_GetToolbarTitle(HWND window, LPSTR buffer, int size);
+HWND QBR_GetToolbarDock(HWND pane);
+
+/* Docks. */
+HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side);
+HWND QBR_GetDock(ToolbarManager *manager, UINT side);
+void QBR_DestroyDock(HWND window);
+
+/* The layout table: the arrangement of one manager as text keys and values. */
+UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count);
+UINT QBR_GetLayoutEntry(UINT index, LPSTR key, LPSTR value);
+void QBR_FreeLayout(void);
+UINT QBR_BeginLayout(void);
+UINT QBR_AddLayoutEntry(LPCSTR key, LPCSTR value);
+UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif /* QUAYBAR_H */

@@ -1,0 +1,36 @@
+// Mouse interaction: the toolbar window procedure, the shared tracking state,
+// button presses, toolbar and item dragging, and the toolbar menu.
+#pragma once
+
+#include "qbr_records.h"
+
+// The one tracking record of the process, shared by all toolbars.
+struct MouseTrack {
+    ToolbarRecord *menuToolbar;
+    UINT dragCopy;
+    int dragLastY;
+    int dragLastX;
+    ToolbarItem *hitItem;
+    UINT hitItemId;
+    RECT dragFrame;
+    UINT dragActive;
+    RECT hitRect;
+    UINT pressActive;
+    UINT closeBoxInverted;
+    UINT closePressActive;
+};
+
+extern MouseTrack mouseTrack;
+extern UINT appActive;
+extern UINT borderSizing;
+
+LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam);
+void OnToolbarLeftDown(HWND window, int x, int y, UINT keys);
+void OnToolbarLeftUp(HWND window, int x, int y, UINT keys);
+void OnToolbarRightDown(HWND window, int x, int y, UINT keys);
+void OnToolbarRightUp(HWND window, int x, int y, UINT keys);
+void OnToolbarMouseMove(HWND window, int x, int y, UINT keys);
+
+void DrawDragFrame(const RECT *rect);
+void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar);
+void OnToolbarCommand(HWND window, UINT id);

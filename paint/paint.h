@@ -1,0 +1,41 @@
+// Painting: the image strip recoloured to the system colours, one button in
+// each state, the toolbar surface and the caption of floating frames.
+#pragma once
+
+#include "qbr_records.h"
+
+// ---- Shared drawing objects (made for the first client, freed with the last)
+extern BOOL newerSystem;
+extern HFONT buttonFont;
+extern HDC stripDC;
+extern HDC maskDC;
+extern COLORREF colorHighlight;
+extern COLORREF colorFace;
+extern COLORREF colorShadow;
+extern COLORREF colorFrame;
+extern HBRUSH ditherBrush;
+
+UINT PaintResourcesStart();
+void PaintResourcesEnd();
+HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource);
+UINT RefreshPaintColors();
+HBITMAP MakeDitherBitmap();
+void StripCellOf(UINT imageIndex, UINT *column, UINT *row);
+
+// ---- One button --------------------------------------------------------------
+UINT BeginButtonPaint(ToolbarManager *manager, HDC dc);
+void EndButtonPaint();
+void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState);
+void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, UINT erode);
+void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color);
+
+// ---- Surface and caption -----------------------------------------------------
+extern HFONT captionFont;
+extern int captionHeight;
+
+UINT CaptionFontStart();
+void CaptionFontEnd();
+void PaintToolbar(HWND window);
+void PaintFloatingCaption(HWND window, HDC dc);
+void PaintCloseBox(HWND window, HDC dc);
+void CloseBoxRect(HWND window, RECT *rect);

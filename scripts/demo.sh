@@ -1,0 +1,29 @@
+#!/usr/bin/env bash
+# Installs what is missing, builds, and runs the demonstration program: on your
+# display when $DISPLAY is set, else under Xvfb, where it takes a screenshot
+# (BUILD_DIR/demo.png) a few seconds after start-up and closes the program.
+#   scripts/demo.sh [BUILD_DIR]
+set -eu
+here=$(cd "$(dirname "$0")/.." && pwd)
+build=${1:-$here/build}
+"$here/scripts/setup.sh"
+"$here/scripts/build.sh" "$build"
+if [ -n "${DISPLAY:-}" ]; then
+    exec "$here/scripts/wine-run.sh" "$build" "$build/bin/qbrdemo.exe"
+fi
+"$here/scripts/wine-env.sh" start "$build"
+# shellcheck disable=SC1091
+. "$build/wine-env/exports.sh"
+wine "$build/bin/qbrdemo.exe" </dev/null >>"$build/wine-env/log.txt" 2>&1 &
+pid=$!
+ctl="$build/bin/qbr_ctl.exe"
+wine "$ctl" wait "Quaybar Demo" 15000 </dev/null || echo "demo: the main window did not appear" >&2
+sleep 2
+/usr/bin/import -display "$DISPLAY" -window root "$build/demo.png"
+echo "screenshot: $build/demo.png"
+# Close it as a user would, so that it writes its settings on the way out.
+wine "$ctl" close "Quaybar Demo" </dev/null || true
+for _ in $(seq 1 100); do kill -0 $pid 2>/dev/null || break; sleep 0.1; done
+kill $pid 2>/dev/null || true
+wait $pid 2>/dev/null || true
+"$here/scripts/wine-env.sh" stop "$build"

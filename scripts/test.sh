@@ -1,0 +1,10 @@
+#!/usr/bin/env bash
+# Installs what is missing, builds, and runs every test under Wine with CTest.
+#   scripts/test.sh [BUILD_DIR]
+set -eu
+here=$(cd "$(dirname "$0")/.." && pwd)
+build=${1:-$here/build}
+"$here/scripts/setup.sh"
+"$here/scripts/build.sh" "$build"
+cd "$build"
+ctest --output-on-failure --timeout 900

@@ -1,0 +1,422 @@
+// The spine: memory blocks, pointer lists, token readers, the client registry,
+// the manager's catalog and the button setters.
+#include <cstring>
+#include <vector>
+
+#include "core/core.h"
+#include "harness.h"
+#include "quaybar.h"
+
+extern "C" int CApiRoundTrip(void);
+
+// ---- Pointer lists ---------------------------------------------------------------
+
+// Values of a list, for comparing with a table.
+static std::vector<ULONG_PTR> Values(const PointerList *list) {
+    std::vector<ULONG_PTR> out;
+    for (UINT i = 0; i < PointerListCount(list); ++i) out.push_back(PointerListGet(list, i));
+    return out;
+}
+
+using V = std::vector<ULONG_PTR>;
+constexpr ULONG_PTR a = 0xA, b = 0xB, c = 0xC, x = 0x99;
+
+static PointerList *ListABC() {
+    PointerList *list = PointerListCreate(3, 3, 0);
+    PointerListAppend(list, a);
+    PointerListAppend(list, b);
+    PointerListAppend(list, c);
+    return list;
+}
+
+TEST(PointerListTest, EmptyListHasNoArrayUntilFirstInsertion) {
+    PointerList *list = PointerListCreate(0, 4, 0);
+    ASSERT_NE(nullptr, list);
+    EXPECT_EQ(nullptr, list->items);
+    EXPECT_EQ(0u, PointerListCount(list));
+    EXPECT_EQ(0u, PointerListGet(list, 0));
+    EXPECT_EQ(0u, PointerListRemoveAt(list, 0));
+    EXPECT_EQ(0u, PointerListRemove(list, a));
+    EXPECT_EQ(0u, PointerListRemoveBefore(list, 0));
+    EXPECT_EQ(0u, PointerListRemoveAfter(list, 0));
+    EXPECT_EQ(0u, PointerListInsertBefore(list, a, x));
+    PointerListCompact(list);
+    EXPECT_EQ(nullptr, list->items);
+    EXPECT_EQ(1u, PointerListAppend(list, a));
+    EXPECT_EQ(4u, list->capacity);
+    PointerListDestroy(list);
+}
+
+TEST(PointerListTest, NeighbourInsertsAndRemoves) {
+    struct Case {
+        const char *what;
+        UINT (*op)(PointerList *);
+        UINT result;
+        V after;
+    };
+    const Case cases[] = {
+        {"insert before 0 appends", [](PointerList *l) { return PointerListInsertBefore(l, 0, x); }, 1, {a, b, c, x}},
+        {"insert after 0 prepends", [](PointerList *l) { return PointerListInsertAfter(l, 0, x); }, 1, {x, a, b, c}},
+        {"insert before b", [](PointerList *l) { return PointerListInsertBefore(l, b, x); }, 1, {a, x, b, c}},
+        {"insert after c", [](PointerList *l) { return PointerListInsertAfter(l, c, x); }, 1, {a, b, c, x}},
+        {"insert before missing", [](PointerList *l) { return PointerListInsertBefore(l, x, a); }, 0, {a, b, c}},
+        {"insert after missing", [](PointerList *l) { return PointerListInsertAfter(l, x, a); }, 0, {a, b, c}},
+        {"remove before 0 takes last", [](PointerList *l) { return PointerListRemoveBefore(l, 0); }, 1, {a, b}},
+        {"remove before b takes a", [](PointerList *l) { return PointerListRemoveBefore(l, b); }, 1, {b, c}},
+        {"remove before a refused", [](PointerList *l) { return PointerListRemoveBefore(l, a); }, 0, {a, b, c}},
+        {"remove after 0 takes first", [](PointerList *l) { return PointerListRemoveAfter(l, 0); }, 1, {b, c}},
+        {"remove after b takes c", [](PointerList *l) { return PointerListRemoveAfter(l, b); }, 1, {a, b}},
+        {"remove after c refused", [](PointerList *l) { return PointerListRemoveAfter(l, c); }, 0, {a, b, c}},
+        {"remove at count refused", [](PointerList *l) { return PointerListRemoveAt(l, 3); }, 0, {a, b, c}},
+        {"insert at count appends", [](PointerList *l) { return PointerListInsertAt(l, 3, x); }, 1, {a, b, c, x}},
+        {"insert at 1", [](PointerList *l) { return PointerListInsertAt(l, 1, x); }, 1, {a, x, b, c}},
+        {"remove value b", [](PointerList *l) { return PointerListRemove(l, b); }, 1, {a, c}},
+    };
+    for (const Case &k : cases) {
+        PointerList *list = ListABC();
+        EXPECT_EQ(k.result, k.op(list)) << k.what;
+        EXPECT_EQ(k.after, Values(list)) << k.what;
+        PointerListDestroy(list);
+    }
+}
+
+TEST(PointerListTest, GrowsByStepAndNeverShrinksOnRemoval) {
+    PointerList *list = PointerListCreate(5, 5, 0);
+    for (ULONG_PTR v = 1; v <= 5; ++v) PointerListAppend(list, v);
+    EXPECT_EQ(5u, list->capacity);
+    PointerListAppend(list, 6);
+    EXPECT_EQ(10u, list->capacity);
+    while (PointerListCount(list)) PointerListRemoveAt(list, 0);
+    EXPECT_EQ(10u, list->capacity);
+    EXPECT_NE(nullptr, list->items);
+    PointerListAppend(list, 7);
+    PointerListCompact(list);
+    EXPECT_EQ(1u, list->capacity);
+    EXPECT_EQ(V{7}, Values(list));
+    PointerListDestroy(list);
+}
+
+TEST(PointerListTest, NullListIsAcceptedEverywhere) {
+    EXPECT_EQ(0u, PointerListCount(nullptr));
+    EXPECT_EQ(0u, PointerListGet(nullptr, 0));
+    EXPECT_EQ(0u, PointerListAppend(nullptr, a));
+    EXPECT_EQ(0u, PointerListInsertAt(nullptr, 0, a));
+    EXPECT_EQ(0u, PointerListRemove(nullptr, a));
+    UINT index = 7;
+    EXPECT_EQ(0u, PointerListFind(nullptr, a, &index));
+    EXPECT_EQ(7u, index);
+    PointerListCompact(nullptr);
+    PointerListDestroy(nullptr);
+}
+
+// ---- Memory blocks and strings ------------------------------------------------------
+
+TEST(MemoryBlockTest, AllocResizeAndOverlappingMoves) {
+    LONG before = LiveMemoryBlocks();
+    void *block = nullptr;
+    ASSERT_EQ(1u, MemoryBlockAlloc(&block, 0, 0));
+    ASSERT_NE(nullptr, block);
+    EXPECT_EQ(before + 1, LiveMemoryBlocks());
+    ASSERT_EQ(1u, MemoryBlockResize(&block, 16));
+    char *text = static_cast<char *>(block);
+    std::memcpy(text, "abcdefgh", 9);
+    ASSERT_EQ(1u, MemoryBlockResize(&block, 4096));
+    EXPECT_STREQ("abcdefgh", static_cast<char *>(block));
+    text = static_cast<char *>(block);
+    BlockMove(text + 2, text, 6); // forward overlap
+    EXPECT_EQ(0, std::memcmp(text, "ababcdef", 8));
+    BlockMove(text, text + 2, 6); // backward overlap
+    EXPECT_EQ(0, std::memcmp(text, "abcdefef", 8));
+    char copy[7] = {};
+    BlockCopy(copy, "123456", 6); // a word and two bytes
+    EXPECT_STREQ("123456", copy);
+    BlockFill(copy, 'z', 3);
+    EXPECT_STREQ("zzz456", copy);
+    MemoryBlockFree(block);
+    EXPECT_EQ(before, LiveMemoryBlocks());
+}
+
+TEST(StringTest, DuplicateAppendAndCompare) {
+    LPSTR s = nullptr;
+    ASSERT_EQ(1u, StringDuplicate(&s, "Top"));
+    ASSERT_EQ(1u, StringAppend(&s, " Dock"));
+    EXPECT_STREQ("Top Dock", s);
+    EXPECT_EQ(1u, StringsEqual(s, "Top Dock"));
+    EXPECT_EQ(0u, StringsEqual(s, "top dock"));
+    char text[] = "abc";
+    EXPECT_EQ(text + 1, FindCharOrEnd(text, 'b'));
+    EXPECT_EQ(text + 3, FindCharOrEnd(text, ','));
+    MemoryBlockFree(s);
+}
+
+TEST(TokenTest, ReadersConsumeOneTokenEach) {
+    struct Case {
+        const char *input;
+        int value;
+        const char *rest;
+    };
+    const Case cases[] = {
+        {"12,34", 12, "34"},       {"34", 34, ""},          {"", 0, ""},
+        {"-7x,9", -7, "9"},        {" \t+5,1", 5, "1"},     {"abc,2", 0, "2"},
+        {"4294967297,0", 1, "0"}, // accumulated in 32 bits, wrapping
+        {",,3", 0, ",3"},
+    };
+    for (const Case &k : cases) {
+        char buffer[64];
+        std::strcpy(buffer, k.input);
+        EXPECT_EQ(k.value, ReadTokenInt(buffer)) << k.input;
+        EXPECT_STREQ(k.rest, buffer) << k.input;
+    }
+    char empty[4] = "";
+    for (int i = 0; i < 3; ++i) EXPECT_EQ(0, ReadTokenInt(empty));
+    char three[] = "Standard,Style,Align";
+    char out[32];
+    ReadTokenText(three, out);
+    EXPECT_STREQ("Standard", out);
+    EXPECT_STREQ("Style,Align", three);
+    char flags[] = "32801,100";
+    EXPECT_EQ(32801u, ReadTokenFlags(flags));
+    EXPECT_EQ(100u, ReadTokenId(flags));
+}
+
+// ---- Client registry ---------------------------------------------------------------------
+
+TEST(ClientRegistryTest, LifeCycleDefaultsAndSecondStart) {
+    EXPECT_EQ(nullptr, CurrentClient());
+    EXPECT_EQ(0u, QBR_GetCustomize());
+    int w = -1;
+    EXPECT_EQ(0u, GetButtonSizes(&w, nullptr, nullptr, nullptr));
+    EXPECT_EQ(-1, w);
+    QBR_Terminate(); // without a client: nothing
+
+    for (int round = 0; round < 2; ++round) {
+        LONG blocks = LiveMemoryBlocks();
+        ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+        ToolbarClient *client = CurrentClient();
+        ASSERT_NE(nullptr, client);
+        EXPECT_EQ(1u, clientCount);
+        EXPECT_EQ(1u, QBR_GetQuickHelp());
+        EXPECT_EQ(1u, QBR_GetCustomize());
+        EXPECT_EQ(0u, QBR_GetButtonText());
+        int m[6];
+        ASSERT_EQ(1u, GetButtonMetrics(&m[0], &m[1], &m[2], &m[3], &m[4], &m[5]));
+        EXPECT_EQ((std::vector<int>{24, 22, 16, 15, 48, 44}), std::vector<int>(m, m + 6));
+        QBR_Terminate();
+        EXPECT_EQ(nullptr, CurrentClient());
+        EXPECT_EQ(0u, clientCount);
+        EXPECT_EQ(nullptr, clientTable);
+        EXPECT_EQ(0u, QBR_GetQuickHelp());
+        EXPECT_EQ(blocks, LiveMemoryBlocks()) << "round " << round;
+    }
+}
+
+TEST_F(ClientTest, SettersStoreValuesUnchanged) {
+    QBR_SetButtonMetrics(30, 0, 0, 0, 0, 0);
+    int m[6];
+    GetButtonMetrics(&m[0], &m[1], &m[2], &m[3], &m[4], &m[5]);
+    EXPECT_EQ((std::vector<int>{30, 22, 16, 15, 48, 44}), std::vector<int>(m, m + 6));
+    QBR_SetButtonMetrics(0, 0, 0, 0, 0, 0);
+
+    QBR_SetQuickHelp(5);
+    EXPECT_EQ(5u, QBR_GetQuickHelp());
+    QBR_SetCustomize(0);
+    EXPECT_EQ(0u, QBR_GetCustomize());
+    QBR_SetNotifyMessages(0, 0);
+    EXPECT_EQ(0u, CurrentClient()->pressMessage);
+
+    int w, h, iw, ih;
+    QBR_SetButtonText(1);
+    GetButtonSizes(&w, &h, &iw, &ih);
+    EXPECT_EQ((std::vector<int>{48, 44, 16, 15}), (std::vector<int>{w, h, iw, ih}));
+    QBR_SetButtonText(0);
+    GetButtonSizes(&w, &h, nullptr, nullptr);
+    EXPECT_EQ((std::vector<int>{24, 22}), (std::vector<int>{w, h}));
+}
+
+TEST(ClientRegistryTest, SecondClientInOneProcessIsCountedButNeverFound) {
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+    ToolbarClient *first = CurrentClient();
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+    EXPECT_EQ(2u, clientCount);
+    EXPECT_EQ(first, CurrentClient());
+    ToolbarClient *second = ListAt<ToolbarClient>(clientTable, 1);
+    // Tear the second down by hand, as its thread key finds the first.
+    PointerListDestroy(second->managers);
+    UnregisterClient(second);
+    QBR_Terminate();
+    EXPECT_EQ(0u, clientCount);
+}
+
+// ---- Manager and catalog -----------------------------------------------------------------
+
+class ManagerTest : public ClientTest {
+  protected:
+    void SetUp() override {
+        ClientTest::SetUp();
+        manager = QBR_CreateManager(nullptr);
+        ASSERT_NE(nullptr, manager);
+    }
+    void TearDown() override {
+        QBR_DestroyManager(manager);
+        ClientTest::TearDown();
+    }
+    ToolbarManager *manager = nullptr;
+};
+
+TEST_F(ManagerTest, NewManagerHoldsTheSharedSeparator) {
+    ASSERT_EQ(1u, PointerListCount(manager->items));
+    ToolbarItem *separator = ItemFindById(manager->items, 0);
+    ASSERT_NE(nullptr, separator);
+    EXPECT_EQ(static_cast<UINT>(ITEM_SEPARATOR), separator->kind);
+    int w, h;
+    ASSERT_EQ(1u, ItemGetSize(separator, &w, &h));
+    EXPECT_EQ(10, w);
+    EXPECT_EQ(10, h);
+    EXPECT_EQ(separator, ItemNext(manager->items, nullptr));
+    EXPECT_EQ(nullptr, ItemNext(manager->items, separator));
+    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
+    EXPECT_EQ(nullptr, QBR_GetToolbar(manager, 0));
+    EXPECT_EQ(1u, QBR_AddButtons(manager, nullptr, 0));
+    EXPECT_EQ(1u, manager->items->capacity);
+}
+
+TEST_F(ManagerTest, CatalogImageIndicesCategoriesAndSizes) {
+    std::vector<UINT> ids;
+    for (UINT i = 0; i < 31; ++i) ids.push_back(100 + i);
+    ASSERT_EQ(1u, QBR_AddButtons(manager, ids.data(), 31));
+    EXPECT_EQ(32u, PointerListCount(manager->items));
+    EXPECT_EQ(32u, manager->items->capacity);
+    for (UINT k = 0; k < 31; ++k) {
+        UINT index = 999;
+        ASSERT_EQ(1u, QBR_GetButtonImage(manager, 100 + k, &index));
+        EXPECT_EQ(k, index);
+    }
+    UINT unused;
+    EXPECT_EQ(0u, QBR_GetButtonImage(manager, 0, &unused));
+    EXPECT_EQ(0u, QBR_GetButtonImage(manager, 5000, &unused));
+
+    const UINT cats[] = {3001, 3002};
+    ASSERT_EQ(1u, QBR_SetCategories(manager, cats, 2));
+    EXPECT_EQ(2u, manager->categoryCount);
+    const UINT some[] = {101, 4242, 102};
+    EXPECT_EQ(1u, QBR_AssignCategory(manager, 3002, some, 3));
+    UINT category = 0;
+    ItemGetCategory(ItemFindById(manager->items, 102), &category);
+    EXPECT_EQ(3002u, category);
+    ItemGetCategory(ItemFindById(manager->items, 103), &category);
+    EXPECT_EQ(0u, category);
+
+    int w, h;
+    ItemGetSize(ItemFindById(manager->items, 100), &w, &h);
+    EXPECT_EQ(24, w);
+    EXPECT_EQ(22, h);
+    QBR_SetButtonText(1);
+    ItemGetSize(ItemFindById(manager->items, 100), &w, &h);
+    EXPECT_EQ(48, w);
+    EXPECT_EQ(44, h);
+    QBR_SetButtonText(0);
+}
+
+TEST_F(ManagerTest, ButtonSettersCompareFirst) {
+    const UINT ids[] = {1, 2};
+    QBR_AddButtons(manager, ids, 2);
+    struct Case {
+        const char *what;
+        UINT (*set)(ToolbarManager *, UINT, UINT);
+        UINT argument;
+        UINT (*get)(ToolbarManager *, UINT);
+        UINT expected;
+    };
+    const Case cases[] = {
+        {"state on", QBR_SetButtonState, 1, QBR_GetButtonState, 1},
+        {"state on again", QBR_SetButtonState, 1, QBR_GetButtonState, 1},
+        {"state 3 is off", QBR_SetButtonState, 3, QBR_GetButtonState, 0},
+        {"state mixed", QBR_SetButtonState, 2, QBR_GetButtonState, 2},
+        {"disable", QBR_SetButtonEnabled, 0, QBR_IsButtonEnabled, 0},
+        {"enable with 2", QBR_SetButtonEnabled, 2, QBR_IsButtonEnabled, 1},
+        {"press", QBR_SetButtonPressed, 1, QBR_IsButtonPressed, BS_PRESSED},
+        {"press again", QBR_SetButtonPressed, 7, QBR_IsButtonPressed, BS_PRESSED},
+        {"release", QBR_SetButtonPressed, 0, QBR_IsButtonPressed, 0},
+        {"behaviour", QBR_SetButtonBehaviour, BTN_LATCH, QBR_GetButtonBehaviour, BTN_LATCH},
+    };
+    for (const Case &k : cases) {
+        EXPECT_EQ(1u, k.set(manager, 1, k.argument)) << k.what;
+        EXPECT_EQ(k.expected, k.get(manager, 1)) << k.what;
+    }
+    // Mixed and on are never set together.
+    QBR_SetButtonState(manager, 2, 2);
+    QBR_SetButtonState(manager, 2, 1);
+    EXPECT_EQ(static_cast<UINT>(BS_ON), ItemFindById(manager->items, 2)->data
+                                            ? static_cast<ButtonData *>(ItemFindById(manager->items, 2)->data)->state
+                                            : 0);
+    for (auto set : {QBR_SetButtonState, QBR_SetButtonEnabled, QBR_SetButtonPressed, QBR_SetButtonBehaviour,
+                     QBR_SetButtonImage}) {
+        EXPECT_EQ(0u, set(manager, 0, 1)) << "the separator is no button";
+        EXPECT_EQ(0u, set(manager, 77, 1)) << "an id outside the catalog";
+    }
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 77));
+}
+
+TEST_F(ManagerTest, RadioRanges) {
+    const UINT ids[] = {201, 202, 203, 204, 205, 207, 208};
+    QBR_AddButtons(manager, ids, 7);
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 212, 201, 204)) << "an empty range";
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 204));
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 204, 204, 204));
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 204));
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 201, 205, 202));
+    EXPECT_EQ((std::vector<UINT>{0, 1, 0, 0, 0}),
+              (std::vector<UINT>{QBR_GetButtonState(manager, 201), QBR_GetButtonState(manager, 202),
+                                 QBR_GetButtonState(manager, 203), QBR_GetButtonState(manager, 204),
+                                 QBR_GetButtonState(manager, 205)}));
+    // 206 is missing: the ids below it change, the ids above keep their state.
+    QBR_SetButtonState(manager, 208, 1);
+    EXPECT_EQ(0u, QBR_SetRadioRange(manager, 201, 208, 203));
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 203));
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 202));
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 208));
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 201, 205, 999)) << "an onId outside switches all off";
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 203));
+}
+
+TEST_F(ManagerTest, HelpTextWithCallbackAndLibraryStrings) {
+    char buffer[256] = "untouched";
+    EXPECT_EQ(4, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
+    EXPECT_STREQ("Q101", buffer);
+    EXPECT_EQ(5, RequestHelpText(3001, HELP_CATEGORY, buffer, kHelpTextSize));
+    EXPECT_STREQ("C3001", buffer);
+    EXPECT_STREQ("Insert Item...", LoadLibraryText(5101));
+    EXPECT_STREQ("Right Dock", LoadLibraryText(5108));
+    EXPECT_STREQ("", LoadLibraryText(5999));
+}
+
+TEST(HelpTextTest, NoCallbackGivesEmptyTextAndNoClientLeavesBuffer) {
+    char buffer[16] = "untouched";
+    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
+    EXPECT_STREQ("untouched", buffer);
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
+    EXPECT_STREQ("", buffer);
+    QBR_Terminate();
+}
+
+TEST(LeakTest, ManagersAndClientsReleaseEveryBlock) {
+    LONG blocks = LiveMemoryBlocks();
+    LONG gdi = LiveGdiObjects();
+    for (int round = 0; round < 3; ++round) {
+        ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+        ToolbarManager *one = QBR_CreateManager(nullptr);
+        ToolbarManager *two = QBR_CreateManager(nullptr);
+        const UINT ids[] = {1, 2, 3, 4, 5, 6, 7};
+        QBR_AddButtons(one, ids, 7);
+        QBR_SetCategories(one, ids, 3);
+        QBR_SetCategories(one, ids, 2); // a later call replaces the first
+        QBR_DestroyManager(one);
+        QBR_DestroyManager(two);
+        QBR_Terminate();
+    }
+    EXPECT_EQ(blocks, LiveMemoryBlocks());
+    EXPECT_EQ(gdi, LiveGdiObjects());
+}
+
+TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CApiRoundTrip()); }

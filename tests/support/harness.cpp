@@ -1,0 +1,175 @@
+#include "harness.h"
+
+#include <cstdio>
+#include <sstream>
+
+#include "quaybar.h"
+
+void Pump() {
+    MSG msg;
+    for (int round = 0; round < 3; ++round) {
+        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            TranslateMessage(&msg);
+            DispatchMessageA(&msg);
+        }
+    }
+}
+
+void PumpFor(DWORD ms) {
+    DWORD start = GetTickCount();
+    while (GetTickCount() - start < ms) {
+        Pump();
+        MsgWaitForMultipleObjects(0, nullptr, FALSE, 5, QS_ALLINPUT);
+    }
+    Pump();
+}
+
+static std::vector<Heard> frameLog;
+std::vector<Heard> &FrameLog() { return frameLog; }
+void ClearFrameLog() { frameLog.clear(); }
+int CountHeard(UINT message) {
+    int n = 0;
+    for (const Heard &h : frameLog) n += h.message == message;
+    return n;
+}
+
+std::string Describe(const std::vector<Heard> &messages) {
+    std::ostringstream out;
+    for (const Heard &h : messages) {
+        const char *name = h.message == WM_COMMAND       ? "WM_COMMAND"
+                           : h.message == kPressMessage   ? "press"
+                           : h.message == kReleaseMessage ? "release"
+                           : h.message == WM_SIZE         ? "WM_SIZE"
+                                                          : "?";
+        out << name << "(" << std::hex << "0x" << h.wParam << ", 0x" << h.lParam << std::dec << ") ";
+    }
+    return out.str();
+}
+
+static LRESULT CALLBACK RecordingFrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    switch (message) {
+    case WM_COMMAND:
+    case kPressMessage:
+    case kReleaseMessage:
+        frameLog.push_back({message, wParam, lParam});
+        return 0;
+    case WM_SIZE:
+        frameLog.push_back({message, wParam, lParam});
+        break;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+HWND CreateRecordingFrame(int x, int y, int width, int height) {
+    static bool registered = false;
+    if (!registered) {
+        WNDCLASSA wc = {};
+        wc.lpfnWndProc = RecordingFrameProc;
+        wc.hInstance = GetModuleHandleA(nullptr);
+        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
+        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
+        wc.lpszClassName = "QbrTestFrame";
+        registered = RegisterClassA(&wc) != 0;
+    }
+    HWND frame = CreateWindowExA(0, "QbrTestFrame", "Test Frame", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, x, y,
+                                 width, height, nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
+    ShowWindow(frame, SW_SHOWNORMAL);
+    UpdateWindow(frame);
+    Pump();
+    return frame;
+}
+
+int CALLBACK TestHelpText(UINT id, UINT kind, LPSTR buffer, int size) {
+    static const char prefixes[] = "QDBC";
+    if (kind > 3) return 0;
+    return std::snprintf(buffer, static_cast<size_t>(size), "%c%u", prefixes[kind], id);
+}
+
+void ClientTest::SetUp() {
+    moduleInstance = GetModuleHandleA(nullptr);
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+    QBR_SetNotifyMessages(kPressMessage, kReleaseMessage);
+}
+
+void ClientTest::TearDown() { QBR_Terminate(); }
+
+void FrameTest::SetUp() {
+    ClientTest::SetUp();
+    frame = CreateRecordingFrame();
+    manager = QBR_CreateManager(frame);
+    ASSERT_NE(nullptr, manager);
+    ClearFrameLog();
+}
+
+void FrameTest::TearDown() {
+    QBR_DestroyManager(manager);
+    DestroyWindow(frame);
+    Pump();
+    ClientTest::TearDown();
+}
+
+void FrameTest::AddButtons(UINT first, UINT count) {
+    std::vector<UINT> ids;
+    for (UINT i = 0; i < count; ++i) ids.push_back(first + i);
+    ASSERT_EQ(1u, QBR_AddButtons(manager, ids.data(), count));
+}
+
+HWND FrameTest::MakeDock(UINT side) { return QBR_CreateDock(manager, frame, side); }
+
+RECT WindowRectInParent(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    if (GetWindowLongA(window, GWL_STYLE) & WS_CHILD) {
+        HWND parent = GetParent(window);
+        POINT a = {r.left, r.top}, b = {r.right, r.bottom};
+        ScreenToClient(parent, &a);
+        ScreenToClient(parent, &b);
+        r = RECT{a.x, a.y, b.x, b.y};
+    }
+    return r;
+}
+
+RECT ClientRectOf(HWND window) {
+    RECT r;
+    GetClientRect(window, &r);
+    return r;
+}
+
+Pixels ReadWindowPixels(HWND window) {
+    UpdateWindow(window);
+    Pump();
+    Pixels out;
+    RECT client;
+    GetClientRect(window, &client);
+    out.width = client.right;
+    out.height = client.bottom;
+    if (out.width <= 0 || out.height <= 0) return out;
+    HDC source = GetDC(window);
+    HDC memory = CreateCompatibleDC(source);
+    BITMAPINFO info = {};
+    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
+    info.bmiHeader.biWidth = out.width;
+    info.bmiHeader.biHeight = -out.height; // top-down
+    info.bmiHeader.biPlanes = 1;
+    info.bmiHeader.biBitCount = 32;
+    void *bits = nullptr;
+    HBITMAP dib = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
+    HGDIOBJ old = SelectObject(memory, dib);
+    BitBlt(memory, 0, 0, out.width, out.height, source, 0, 0, SRCCOPY);
+    GdiFlush();
+    out.colors.resize(static_cast<size_t>(out.width) * out.height);
+    auto *raw = static_cast<const DWORD *>(bits);
+    for (size_t i = 0; i < out.colors.size(); ++i) {
+        DWORD p = raw[i]; // 0x00RRGGBB
+        out.colors[i] = RGB((p >> 16) & 0xff, (p >> 8) & 0xff, p & 0xff);
+    }
+    SelectObject(memory, old);
+    DeleteObject(dib);
+    DeleteDC(memory);
+    ReleaseDC(window, source);
+    return out;
+}
+
+std::ostream &operator<<(std::ostream &out, const RECT &r) {
+    return out << "(" << r.left << "," << r.top << "," << r.right << "," << r.bottom << ")";
+}
