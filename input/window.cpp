@@ -1,0 +1,145 @@
+// The window procedure of both toolbar windows, pane and floating frame, and
+// the mouse state that all toolbars of the process share.
+#include "core/core.h"
+#include "input/input.h"
+#include "paint/paint.h"
+#include "toolbar/toolbar.h"
+
+MouseTrack mouseTrack = {};
+UINT appActive = 1; // moves are served before the first WM_ACTIVATEAPP
+UINT borderSizing = 0;
+
+constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
+
+// The pane makes its floating frame, links the two and makes the record. The
+// frame passes through here too, and does nothing.
+static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
+    if (!(create->style & WS_CHILD)) return 0;
+    HWND frame = CreateWindowExA(0, create->lpszClass, create->lpszName, kFrameStyle, CW_USEDEFAULT, CW_USEDEFAULT,
+                                 create->cx, create->cy, GetParent(create->hwndParent), nullptr, create->hInstance,
+                                 create->lpCreateParams);
+    if (!frame) return -1;
+    SetTwinWindow(frame, window);
+    SetTwinWindow(window, frame);
+    if (!CreateToolbarRecord(window)) {
+        DestroyWindow(frame);
+        return -1;
+    }
+    return 0;
+}
+
+static void OnSize(HWND window) {
+    InvalidateRect(window, nullptr, TRUE);
+    RefitToolbar(window, ROLE_SELF);
+}
+
+static void OnSetText(HWND window, WPARAM wParam, LPARAM lParam) {
+    // The title is read from the floating frame everywhere. A later change
+    // of title is not provided for: the text is handed on, not stored.
+    if (IsToolbarPane(window))
+        if (HWND frame = GetTwinWindow(window)) SendMessageA(frame, WM_SETTEXT, wParam, lParam);
+}
+
+// Painting goes to the toolbar's active window. A paint message for the other
+// window of the pair must still be answered, or it would come back forever.
+static void OnPaint(HWND window) {
+    PaintToolbar(window);
+    ValidateRect(window, nullptr);
+}
+
+static void ActivateHostFrame(HWND window) {
+    if (ToolbarManager *manager = ManagerOfToolbar(window)) SetActiveWindow(manager->frame);
+}
+
+// The library moves and sizes its own windows all the time, and none of those
+// changes may come back as a refit: the WM_SIZE that DefWindowProc would make
+// of WM_WINDOWPOSCHANGED is let through only after the user pressed a border.
+static LRESULT OnWindowPosChanged(HWND window, WPARAM wParam, LPARAM lParam) {
+    if (!borderSizing) return 0;
+    borderSizing = 0;
+    ActivateHostFrame(window);
+    return DefWindowProcA(window, WM_WINDOWPOSCHANGED, wParam, lParam);
+}
+
+static LRESULT OnNcLeftDown(HWND window, WPARAM hitCode, LPARAM lParam) {
+    if (hitCode >= HTLEFT && hitCode <= HTBOTTOMRIGHT) borderSizing = 1;
+    return DefWindowProcA(window, WM_NCLBUTTONDOWN, hitCode, lParam);
+}
+
+static void OnDoubleClick(HWND window, LPARAM lParam) {
+    int x = static_cast<int>(LOWORD(lParam)), y = static_cast<int>(HIWORD(lParam));
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    if (HitTestToolbar(pane, x, y, nullptr, nullptr)) return; // on a button: the click did it all
+    UINT flags = QBR_GetToolbarFlags(pane);
+    if (IsFloatingFrame(window)) {
+        RECT box;
+        CloseBoxRect(window, &box);
+        POINT p = {x, y};
+        if (PtInRect(&box, p))
+            QBR_SetToolbarFlags(pane, TBF_HIDDEN);
+        else if (!(flags & TBF_LOCKED_PLACE))
+            QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_DOCKED);
+    } else if (!(flags & TBF_LOCKED_PLACE)) {
+        QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_FLOATING);
+    }
+}
+
+// Mouse handlers take the cursor from GetCursorPos, not from the message.
+using MouseHandler = void (*)(HWND, int, int, UINT);
+static void WithCursor(HWND window, WPARAM keys, MouseHandler handler) {
+    POINT p;
+    GetCursorPos(&p);
+    ScreenToClient(window, &p);
+    handler(window, p.x, p.y, static_cast<UINT>(keys));
+}
+
+LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    switch (message) {
+    case WM_CREATE:
+        return OnCreate(window, reinterpret_cast<const CREATESTRUCTA *>(lParam));
+    case WM_SIZE:
+        OnSize(window);
+        return 0;
+    case WM_SETTEXT:
+        OnSetText(window, wParam, lParam);
+        return 0;
+    case WM_PAINT:
+        OnPaint(window);
+        return 0;
+    case WM_ACTIVATEAPP:
+        appActive = static_cast<UINT>(wParam);
+        return 0;
+    case WM_MOUSEACTIVATE:
+        ActivateHostFrame(window);
+        return MA_NOACTIVATE;
+    case WM_GETMINMAXINFO:
+        reinterpret_cast<MINMAXINFO *>(lParam)->ptMinTrackSize = POINT{0, 0};
+        return 0;
+    case WM_WINDOWPOSCHANGED:
+        return OnWindowPosChanged(window, wParam, lParam);
+    case WM_NCLBUTTONDOWN:
+        return OnNcLeftDown(window, wParam, lParam);
+    case WM_COMMAND:
+        OnToolbarCommand(window, LOWORD(wParam));
+        return 0;
+    case WM_MOUSEMOVE:
+        if (appActive) WithCursor(window, wParam, OnToolbarMouseMove);
+        return 0;
+    case WM_LBUTTONDOWN:
+        WithCursor(window, wParam, OnToolbarLeftDown);
+        return 0;
+    case WM_LBUTTONUP:
+        WithCursor(window, wParam, OnToolbarLeftUp);
+        return 0;
+    case WM_LBUTTONDBLCLK:
+        OnDoubleClick(window, lParam);
+        return 0;
+    case WM_RBUTTONDOWN:
+        WithCursor(window, wParam, OnToolbarRightDown);
+        return 0;
+    case WM_RBUTTONUP:
+        WithCursor(window, wParam, OnToolbarRightUp);
+        return 0;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}

@@ -1,0 +1,494 @@
+// Toolbars in real windows: the flow walk's worked examples on real panes and
+// floating frames, item edits and their refits, the window pair, button text.
+#include <map>
+#include <vector>
+
+#include "core/core.h"
+#include "dock/dock.h"
+#include "harness.h"
+#include "paint/paint.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+constexpr UINT S = 0; // the shared separator's id
+
+class ToolbarTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(1, 30); // ids 1..30
+        top = MakeDock(DOCK_TOP);
+        ASSERT_NE(nullptr, top);
+    }
+    HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr, int x = 0,
+              int y = 0, int width = 0) {
+        HWND pane = QBR_CreateToolbar("T", flags, x, y, width, 0, dock ? dock : top, ids.data(),
+                                      static_cast<UINT>(ids.size()));
+        Pump();
+        return pane;
+    }
+    ToolbarItem *Item(UINT id) { return ItemFindById(manager->items, id); }
+    std::vector<UINT> Ids(HWND pane) {
+        std::vector<UINT> out;
+        ToolbarRecord *record = RecordOfWindow(pane);
+        for (UINT i = 0; i < PointerListCount(record->items); ++i) out.push_back(ItemAt(record, i)->id);
+        return out;
+    }
+    // Gives the window of `role` a client area whose item area has this right
+    // edge, without a refit (the library's own sizes bring no WM_SIZE).
+    void SetAreaRight(HWND pane, int role, int right, int clientHeight = 200) {
+        HWND target = ResolveRoleWindow(pane, role);
+        RECT outer, client;
+        GetWindowRect(target, &outer);
+        GetClientRect(target, &client);
+        int extraW = (outer.right - outer.left) - client.right, extraH = (outer.bottom - outer.top) - client.bottom;
+        SetWindowPos(target, nullptr, 0, 0, right + kAreaRight + extraW, clientHeight + extraH,
+                     SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    }
+    std::vector<RECT> Rects(HWND pane) {
+        ToolbarRecord *record = RecordOfWindow(pane);
+        std::vector<RECT> out;
+        for (UINT i = 0; i < PointerListCount(record->items); ++i) {
+            RECT r = {-1, -1, -1, -1};
+            GetItemRect(record, i, &r);
+            out.push_back(r);
+        }
+        return out;
+    }
+    HWND top = nullptr;
+};
+
+const RECT None = {-1, -1, -1, -1};
+
+TEST_F(ToolbarTest, WorkedExampleRowsDockedAndFloating) {
+    const UINT A = 1, B = 2, K = 3, D = 4;
+    HWND pane = Make({A, B, K, S, D});
+    ToolbarRecord *record = RecordOfWindow(pane);
+    int ft = captionHeight + 3; // a frame's area starts below its caption band
+    struct Case {
+        UINT flags;
+        int right;
+        std::vector<RECT> expected;
+    };
+    const Case cases[] = {
+        {TBF_VISIBLE | TBF_DOCKED, 80,
+         {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(6, 25, 16, 47), Rect(15, 25, 39, 47)}},
+        {TBF_VISIBLE | TBF_FLOATING, 80,
+         {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), Rect(52, ft, 76, ft + 22), None,
+          Rect(6, ft + 22, 30, ft + 44)}},
+        // GetItemRect gives a separator its row's height.
+        {TBF_VISIBLE | TBF_DOCKED, 90,
+         {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(75, 3, 85, 25), Rect(6, 25, 30, 47)}},
+    };
+    for (const Case &k : cases) {
+        record->flags = k.flags;
+        SetAreaRight(pane, (k.flags & TBF_FLOATING) ? ROLE_FLOATING : ROLE_DOCKED, k.right);
+        std::vector<RECT> got = Rects(pane);
+        ASSERT_EQ(k.expected.size(), got.size());
+        for (size_t i = 0; i < got.size(); ++i)
+            EXPECT_EQ(k.expected[i], got[i]) << "item " << i << " flags " << k.flags << " right " << k.right;
+    }
+    // Area right 90, docked: S fits behind K and does not count for the
+    // measure; the break list holds D alone.
+    record->flags = TBF_VISIBLE | TBF_DOCKED;
+    SetAreaRight(pane, ROLE_DOCKED, 90);
+    RECT area = {6, 3, 90, 0};
+    ASSERT_EQ(1u, MeasureToFit(pane, ROLE_DOCKED, &area));
+    EXPECT_EQ(Rect(6, 3, 76, 47), area);
+    ComputeRowBreaks(pane, ROLE_DOCKED);
+    ASSERT_EQ(1u, PointerListCount(record->dockedBreaks));
+    EXPECT_EQ(Item(D), ListAt<ToolbarItem>(record->dockedBreaks, 0));
+}
+
+TEST_F(ToolbarTest, HitTestOwnsSharedColumnsAndSeparatorsAreDead) {
+    HWND pane = Make({1, 2, 3, S, 4});
+    SetAreaRight(pane, ROLE_DOCKED, 90);
+    struct Case {
+        int x, y;
+        UINT id; // 0: nothing
+    } const cases[] = {
+        {6, 3, 1},   {30, 10, 1}, {31, 10, 2}, {53, 25, 2}, // right and bottom edges count as inside
+        {80, 5, 0},  {80, 20, 0},                           // the separator and the gap under it
+        {6, 26, 4},  {5, 10, 0},  {40, 60, 0},
+    };
+    for (const auto &k : cases) {
+        UINT id = 999;
+        RECT r;
+        ToolbarItem *hit = HitTestToolbar(pane, k.x, k.y, &id, &r);
+        EXPECT_EQ(k.id, hit ? id : 0u) << k.x << "," << k.y;
+    }
+}
+
+TEST_F(ToolbarTest, NaturalSizesColumnsAndEmptyToolbars) {
+    HWND pane = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8});
+    int w, h;
+    NaturalSizeHorizontal(pane, &w, &h);
+    EXPECT_EQ(203, w);
+    EXPECT_EQ(22, h);
+    NaturalSizeVertical(pane, &w, &h);
+    EXPECT_EQ(24, w);
+    EXPECT_EQ(187, h);
+    RecordOfWindow(pane)->flags = TBF_VISIBLE | TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS;
+    NaturalSizeHorizontal(pane, &w, &h);
+    EXPECT_EQ(185, w);
+
+    // A column in an area 30 wide: the separator's row takes B's 22.
+    HWND column = Make({1, S, 2});
+    SetAreaRight(column, ROLE_DOCKED, 30);
+    std::vector<RECT> got = Rects(column);
+    EXPECT_EQ(Rect(6, 3, 30, 25), got[0]);
+    EXPECT_EQ(Rect(6, 25, 16, 47), got[1]);
+    EXPECT_EQ(Rect(6, 47, 30, 69), got[2]);
+
+    // An area narrower than a button: the top row stays blank.
+    HWND narrow = Make({1, 2});
+    SetAreaRight(narrow, ROLE_DOCKED, 20);
+    got = Rects(narrow);
+    EXPECT_EQ(Rect(6, 25, 30, 47), got[0]);
+    EXPECT_EQ(Rect(6, 47, 30, 69), got[1]);
+    RECT area = {6, 3, 20, 0};
+    MeasureToFit(narrow, ROLE_DOCKED, &area);
+    EXPECT_EQ(Rect(6, 3, 30, 69), area);
+
+    HWND empty = Make({});
+    NaturalSizeHorizontal(empty, &w, &h);
+    EXPECT_EQ(0, w + h);
+    area = {6, 3, 200, 0};
+    MeasureToFit(empty, ROLE_DOCKED, &area);
+    EXPECT_EQ(Rect(6, 3, 30, 25), area) << "an empty toolbar asks for one button";
+    EXPECT_EQ(nullptr, HitTestToolbar(empty, 10, 10, nullptr, nullptr));
+    UINT index = 9;
+    InsertionIndexAtPoint(RecordOfWindow(empty), 10, 10, &index);
+    EXPECT_EQ(0u, index);
+
+    // Only separators, floating without floating separators: nothing placed.
+    HWND seps = Make({S, S});
+    RecordOfWindow(seps)->flags = TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS;
+    area = {6, 13, 200, 0};
+    MeasureToFit(seps, ROLE_FLOATING, &area);
+    EXPECT_EQ(0, area.right);
+    EXPECT_EQ(0, area.bottom);
+}
+
+TEST_F(ToolbarTest, FourGroupsOfThreeKeepTheirRowsOnAFrame) {
+    HWND pane = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING);
+    ToolbarRecord *record = RecordOfWindow(pane);
+    RECT area = {6, 13, 86, 0};
+    MeasureToFit(pane, ROLE_FLOATING, &area);
+    EXPECT_EQ(76, area.right);
+    EXPECT_EQ(13 + 4 * 22, area.bottom);
+    // Sized to that, each separator wraps at its group's end and is dropped.
+    SetAreaRight(pane, ROLE_FLOATING, 76);
+    ComputeRowBreaks(pane, ROLE_FLOATING);
+    std::vector<ToolbarItem *> breaks;
+    for (UINT i = 0; i < PointerListCount(record->floatingBreaks); ++i)
+        breaks.push_back(ListAt<ToolbarItem>(record->floatingBreaks, i));
+    EXPECT_EQ((std::vector<ToolbarItem *>{Item(4), Item(7), Item(10)}), breaks);
+}
+
+TEST_F(ToolbarTest, DropGrowsATopDockedRowButWrapsInASideDock) {
+    const UINT A = 1, X = 9, B = 2, K = 3;
+    HWND pane = Make({A, X, B, K});
+    RECT area = {6, 3, 76, 0};
+    ASSERT_EQ(1u, MeasureAfterDrop(pane, ROLE_DOCKED, Item(X), &area));
+    EXPECT_EQ(Rect(6, 3, 99, 25), area);
+    area = {6, 3, 76, 0};
+    MeasureToFit(pane, ROLE_DOCKED, &area);
+    EXPECT_EQ(Rect(6, 3, 76, 47), area);
+    // Dropped item fits and nothing after it wraps: same as without the mark.
+    area = {6, 3, 200, 0};
+    MeasureAfterDrop(pane, ROLE_DOCKED, Item(K), &area);
+    EXPECT_EQ(Rect(6, 3, 99, 25), area);
+
+    HWND left = MakeDock(DOCK_LEFT);
+    ASSERT_NE(nullptr, left);
+    HWND side = Make({A, X, B, K}, TBF_VISIBLE | TBF_DOCKED, left);
+    area = {6, 3, 76, 0};
+    MeasureAfterDrop(side, ROLE_DOCKED, Item(X), &area);
+    EXPECT_EQ(Rect(6, 3, 76, 47), area);
+}
+
+TEST_F(ToolbarTest, InsertionIndexAtPoints) {
+    HWND pane = Make({1, 2, 3, S, 4});
+    SetAreaRight(pane, ROLE_DOCKED, 90);
+    ToolbarRecord *record = RecordOfWindow(pane);
+    struct Case {
+        int x, y;
+        UINT index;
+    } const cases[] = {
+        {20, 10, 0}, {29, 10, 0}, // the right half of a button is still its own index
+        {40, 10, 1}, {80, 5, 4},  // on a separator: behind it
+        {88, 10, 4},              // right of a row: the first item of the next row
+        {50, 1, 0},               // above the first row
+        {60, 30, 5},              // right of the last item of the last row: the count
+        {10, 200, 5},
+    };
+    for (const auto &k : cases) {
+        UINT index = 99;
+        ASSERT_EQ(1u, InsertionIndexAtPoint(record, k.x, k.y, &index));
+        EXPECT_EQ(k.index, index) << k.x << "," << k.y;
+    }
+}
+
+TEST_F(ToolbarTest, EditsRefuseDoublesAndCleanSeparators) {
+    HWND pane = Make({1, S, 2, S, 4});
+    ToolbarRecord *record = RecordOfWindow(pane);
+    EXPECT_EQ(0u, InsertItemAt(record, 0, Item(2))) << "a button stands once";
+    EXPECT_EQ(0u, InsertItemAt(record, 0, nullptr));
+    EXPECT_EQ((std::vector<UINT>{1, S, 2, S, 4}), Ids(pane));
+    EXPECT_EQ(1u, InsertItemAfter(record, Item(S), Item(S))) << "separators may stand side by side";
+    EXPECT_EQ((std::vector<UINT>{1, S, S, 2, S, 4}), Ids(pane));
+    EXPECT_EQ(1u, RemoveItem(record, Item(2)));
+    EXPECT_EQ((std::vector<UINT>{1, S, S, 4}), Ids(pane)) << "one pass turns three equal neighbours into two";
+    EXPECT_EQ(0u, RemoveItemBefore(record, Item(1)));
+    EXPECT_EQ(0u, RemoveItemAfter(record, Item(4)));
+    EXPECT_EQ(1u, InsertItemAt(record, 99, Item(7))) << "an index past the end appends";
+    EXPECT_EQ((std::vector<UINT>{1, S, S, 4, 7}), Ids(pane));
+
+    struct Case {
+        std::vector<UINT> before, after;
+    } const cases[] = {
+        {{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S}, {}}, {{S, S}, {}}, {{1}, {1}}, {{}, {}},
+    };
+    for (const Case &k : cases) {
+        HWND t = Make(k.before);
+        CleanSeparators(RecordOfWindow(t));
+        EXPECT_EQ(k.after, Ids(t));
+    }
+    HWND as = Make({1, S});
+    RemoveItem(RecordOfWindow(as), Item(1));
+    EXPECT_TRUE(Ids(as).empty());
+}
+
+TEST_F(ToolbarTest, CreationPlacesTheFrameAndShowsTheRightWindow) {
+    HWND docked = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8});
+    HWND frame = ResolveRoleWindow(docked, ROLE_FLOATING);
+    EXPECT_TRUE(IsWindowVisible(docked));
+    EXPECT_FALSE(IsWindowVisible(frame));
+    int bx = GetSystemMetrics(SM_CXBORDER), by = GetSystemMetrics(SM_CYBORDER);
+    int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME);
+    RECT r = WindowRectInParent(docked);
+    EXPECT_EQ(203 + 12 + 2 * bx, r.right - r.left);
+    EXPECT_EQ(22 + 7 + 2 * by, r.bottom - r.top);
+    r = WindowRectInParent(frame);
+    EXPECT_EQ(Rect(0, 0, 203 + 12 + 2 * fx, 22 + 6 + 2 * fy + captionHeight), r);
+
+    // "Palette" of the demonstration: 100 wide at (300, 200) wraps into rows
+    // and the refit narrows the frame to what the rows need.
+    HWND palette = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING, nullptr, 300,
+                        200, 100);
+    HWND paletteFrame = ResolveRoleWindow(palette, ROLE_FLOATING);
+    EXPECT_TRUE(IsWindowVisible(paletteFrame));
+    EXPECT_FALSE(IsWindowVisible(palette));
+    r = WindowRectInParent(paletteFrame);
+    EXPECT_EQ(300, r.left);
+    EXPECT_EQ(200, r.top);
+    EXPECT_LE(r.right, 400);
+    RECT area;
+    GetItemArea(palette, ROLE_FLOATING, &area);
+    EXPECT_EQ(52 + 24, area.right) << "three buttons a row";
+    EXPECT_EQ(captionHeight + 3 + 4 * 22, area.bottom) << "four groups of three, one a row";
+    EXPECT_EQ(paletteFrame, ResolveRoleWindow(palette, ROLE_ACTIVE));
+    EXPECT_EQ(paletteFrame, ResolveRoleWindow(paletteFrame, ROLE_ACTIVE));
+    EXPECT_EQ(docked, ResolveRoleWindow(frame, ROLE_ACTIVE));
+    EXPECT_EQ(nullptr, ResolveRoleWindow(docked, ROLE_BOTH));
+    EXPECT_EQ(nullptr, ResolveRoleWindow(nullptr, ROLE_SELF));
+
+    // Flags 0 show nothing; ROLE_ACTIVE is then the pane.
+    HWND none = Make({1}, 0);
+    EXPECT_FALSE(IsWindowVisible(none));
+    EXPECT_FALSE(IsWindowVisible(ResolveRoleWindow(none, ROLE_FLOATING)));
+    EXPECT_EQ(none, ResolveRoleWindow(none, ROLE_ACTIVE));
+    EXPECT_EQ(0u, QBR_IsToolbarVisible(none));
+}
+
+// Counts the top-level and child windows of this thread.
+int CountWindows() {
+    int n = 0;
+    EnumThreadWindows(
+        GetCurrentThreadId(),
+        [](HWND w, LPARAM p) -> BOOL {
+            ++*reinterpret_cast<int *>(p);
+            EnumChildWindows(w, [](HWND, LPARAM q) -> BOOL { return ++*reinterpret_cast<int *>(q), TRUE; }, p);
+            return TRUE;
+        },
+        reinterpret_cast<LPARAM>(&n));
+    return n;
+}
+
+TEST_F(ToolbarTest, FloatingAndDockingCreateNoWindowAndTellTheFrame) {
+    HWND pane = Make({1, 2, 3});
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    int windows = CountWindows();
+    ClearFrameLog();
+    QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    EXPECT_TRUE(IsWindowVisible(frameWindow));
+    EXPECT_FALSE(IsWindowVisible(pane));
+    EXPECT_FALSE(IsWindowVisible(top)) << "the dock hides with nothing docked in it";
+    EXPECT_EQ(1, CountHeard(WM_SIZE));
+    ClearFrameLog();
+    QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_FLOATING); // nothing changes
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE));
+    QBR_SetToolbarFlags(pane, TBF_HIDDEN);
+    QBR_SetToolbarFlags(pane, TBF_DOCKED); // place changes bits only while hidden
+    Pump();
+    EXPECT_FALSE(IsWindowVisible(frameWindow));
+    EXPECT_FALSE(IsWindowVisible(pane));
+    EXPECT_EQ(static_cast<UINT>(TBF_HIDDEN | TBF_DOCKED), QBR_GetToolbarFlags(pane));
+    QBR_SetToolbarFlags(pane, TBF_VISIBLE);
+    Pump();
+    EXPECT_TRUE(IsWindowVisible(pane));
+    EXPECT_TRUE(IsWindowVisible(top));
+    EXPECT_EQ(windows, CountWindows());
+    // Bits outside the groups are not stored by a plain set.
+    QBR_SetToolbarFlags(pane, TBF_LOCKED_PLACE);
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(pane) & TBF_LOCKED_PLACE);
+    QBR_ReplaceToolbarFlags(pane, TBF_VISIBLE | TBF_DOCKED | TBF_LOCKED_PLACE);
+    EXPECT_NE(0u, QBR_GetToolbarFlags(pane) & TBF_LOCKED_PLACE);
+    // A frame's handle is not a toolbar in the public calls.
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(frameWindow));
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(frame)) << "a window that is no toolbar";
+    char title[32];
+    QBR_GetToolbarTitle(frameWindow, title, sizeof(title));
+    EXPECT_STREQ("T", title);
+    QBR_GetToolbarTitle(frame, title, sizeof(title));
+    EXPECT_STREQ("", title);
+}
+
+TEST_F(ToolbarTest, EditsRefitBothWindows) {
+    HWND pane = Make({1, 2, 3});
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    RECT paneBefore = WindowRectInParent(pane), frameBefore = WindowRectInParent(frameWindow);
+    ClearFrameLog();
+    ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(pane), 3, Item(4)));
+    Pump();
+    EXPECT_EQ(23, (WindowRectInParent(pane).right - paneBefore.right));
+    EXPECT_EQ(23, (WindowRectInParent(frameWindow).right - frameBefore.right)) << "the hidden frame too";
+    EXPECT_EQ(0, CountHeard(WM_SIZE)) << "the top dock keeps its full-screen width and its height";
+    ASSERT_EQ(1u, RemoveItem(RecordOfWindow(pane), Item(4)));
+    Pump();
+    EXPECT_EQ(paneBefore, WindowRectInParent(pane));
+    EXPECT_EQ(frameBefore.right - frameBefore.left,
+              WindowRectInParent(frameWindow).right - WindowRectInParent(frameWindow).left);
+}
+
+// Counts the paints a toolbar window receives.
+std::map<HWND, int> paints;
+WNDPROC originalProc = nullptr;
+LRESULT CALLBACK CountingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
+    if (m == WM_PAINT) ++paints[w];
+    return CallWindowProcA(originalProc, w, m, wp, lp);
+}
+
+TEST_F(ToolbarTest, ButtonSettersRepaintOnlyOnARealChangeOnEveryToolbar) {
+    HWND one = Make({1, 2, 3});
+    HWND two = Make({3, 1});
+    originalProc = reinterpret_cast<WNDPROC>(
+        SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc)));
+    SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc));
+    Pump();
+    struct Step {
+        const char *what;
+        UINT (*set)(ToolbarManager *, UINT, UINT);
+        UINT value;
+        int paintsEach;
+    } const steps[] = {
+        {"on", QBR_SetButtonState, 1, 1},           {"on again", QBR_SetButtonState, 1, 0},
+        {"3 turns it off", QBR_SetButtonState, 3, 1}, {"3 on an off button", QBR_SetButtonState, 3, 0},
+        {"disable", QBR_SetButtonEnabled, 0, 1},    {"enable with 2", QBR_SetButtonEnabled, 2, 1},
+        {"enable again", QBR_SetButtonEnabled, 1, 0}, {"press", QBR_SetButtonPressed, 1, 1},
+        {"press again", QBR_SetButtonPressed, 1, 0}, {"image", QBR_SetButtonImage, 5, 1},
+        {"image again", QBR_SetButtonImage, 5, 1},  {"behaviour", QBR_SetButtonBehaviour, BTN_CHECK, 0},
+    };
+    for (const Step &s : steps) {
+        paints.clear();
+        EXPECT_EQ(1u, s.set(manager, 1, s.value)) << s.what;
+        Pump();
+        EXPECT_EQ(s.paintsEach, paints[one]) << s.what;
+        EXPECT_EQ(s.paintsEach, paints[two]) << s.what;
+    }
+    SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(originalProc));
+    SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(originalProc));
+}
+
+// Rows of a window: the item rectangles' distinct tops and the count in each.
+std::vector<int> RowCounts(HWND pane) {
+    std::map<LONG, int> rows;
+    ToolbarRecord *record = RecordOfWindow(pane);
+    for (UINT i = 0; i < PointerListCount(record->items); ++i) {
+        RECT r;
+        if (GetItemRect(record, i, &r)) ++rows[r.top];
+    }
+    std::vector<int> out;
+    for (auto &row : rows) out.push_back(row.second);
+    return out;
+}
+
+TEST_F(ToolbarTest, ButtonTextKeepsEveryToolbarsRows) {
+    std::vector<UINT> fifteen;
+    for (UINT id = 1; id <= 15; ++id) fifteen.push_back(id);
+    // Five buttons a row: an item area of 5 x 23 + 1 pixels.
+    int frameWidth = 116 + 12 + 2 * GetSystemMetrics(SM_CXFRAME);
+    HWND floating = Make(fifteen, TBF_VISIBLE | TBF_FLOATING, nullptr, 200, 150, frameWidth);
+    HWND docked = Make({1, 2, 3, S, 4, 5});
+    ASSERT_EQ((std::vector<int>{5, 5, 5}), RowCounts(floating));
+    ToolbarRecord *record = RecordOfWindow(docked);
+    for (UINT on : {1u, 0u, 1u, 0u}) {
+        QBR_SetButtonText(on);
+        Pump();
+        EXPECT_EQ((std::vector<int>{5, 5, 5}), RowCounts(floating)) << "button text " << on;
+        EXPECT_EQ((std::vector<int>{6}), RowCounts(docked)) << "button text " << on;
+        RECT r;
+        GetItemRect(record, 0, &r);
+        EXPECT_EQ(on ? 48 : 24, r.right - r.left);
+    }
+}
+
+TEST_F(ToolbarTest, StaleHandlesAndForeignWindowsGiveZero) {
+    HWND pane = Make({1});
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    EXPECT_EQ(manager, ManagerOfToolbar(pane));
+    QBR_DestroyToolbar(pane);
+    Pump();
+    EXPECT_FALSE(IsWindow(pane));
+    EXPECT_FALSE(IsWindow(frameWindow));
+    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
+    EXPECT_EQ(nullptr, ManagerOfToolbar(pane)) << "the cache must not outlive the toolbar";
+    EXPECT_EQ(nullptr, ManagerOfToolbar(frame));
+    EXPECT_EQ(nullptr, ManagerOfToolbar(top));
+    QBR_SetToolbarFlags(frame, TBF_VISIBLE);
+    QBR_DestroyToolbar(frame); // not a toolbar: left alone
+    EXPECT_TRUE(IsWindow(frame));
+    EXPECT_EQ(nullptr, QBR_CreateToolbar("X", TBF_VISIBLE, 0, 0, 0, 0, frame, nullptr, 0))
+        << "a window that is no dock";
+}
+
+} // namespace
+
+TEST(ToolbarLeakTest, ToolbarsAndManagersReleaseEverything) {
+    LONG blocks = LiveMemoryBlocks();
+    for (int round = 0; round < 2; ++round) {
+        moduleInstance = GetModuleHandleA(nullptr);
+        ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+        HWND frame = CreateRecordingFrame();
+        ToolbarManager *manager = QBR_CreateManager(frame);
+        const UINT ids[] = {1, 2, 3, 0, 4};
+        QBR_AddButtons(manager, ids, 3);
+        HWND top = QBR_CreateDock(manager, frame, DOCK_TOP);
+        HWND left = QBR_CreateDock(manager, frame, DOCK_LEFT);
+        HWND a = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 5);
+        QBR_CreateToolbar("B", TBF_VISIBLE | TBF_FLOATING, 50, 50, 0, 0, left, ids, 4);
+        QBR_SetButtonText(1);
+        QBR_SetButtonText(0);
+        QBR_DestroyToolbar(a);
+        QBR_DestroyManager(manager);
+        DestroyWindow(frame);
+        Pump();
+        QBR_Terminate();
+    }
+    EXPECT_EQ(blocks, LiveMemoryBlocks());
+}

@@ -1,0 +1,341 @@
+// The two windows of a toolbar: the pane in a dock and the floating frame.
+// Both exist for the toolbar's whole life; docking and floating only hide the
+// one and show the other, and every edit refits both.
+#include <initializer_list>
+
+#include "core/core.h"
+#include "dock/dock.h"
+#include "input/input.h"
+#include "paint/paint.h"
+#include "toolbar/toolbar.h"
+
+const char kToolbarClassName[] = "QBR_ToolbarWindow";
+
+constexpr DWORD kPaneStyle = WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN | WS_BORDER;
+
+static HWND cachedToolbarPane = nullptr;
+static ToolbarManager *cachedToolbarManager = nullptr;
+
+// ---- Identity -------------------------------------------------------------------
+
+static bool HasClass(HWND window, const char *name) {
+    char buffer[32];
+    return window && GetClassNameA(window, buffer, sizeof(buffer)) && lstrcmpA(buffer, name) == 0;
+}
+
+UINT IsFloatingFrame(HWND window) {
+    return HasClass(window, kToolbarClassName) && (GetWindowLongA(window, GWL_STYLE) & WS_POPUP) ? 1 : 0;
+}
+
+UINT IsToolbarPane(HWND window) {
+    return HasClass(window, kToolbarClassName) && (GetWindowLongA(window, GWL_STYLE) & WS_CHILD) ? 1 : 0;
+}
+
+void SetTwinWindow(HWND window, HWND twin) { SetWindowLongPtrA(window, 0, reinterpret_cast<LONG_PTR>(twin)); }
+
+HWND GetTwinWindow(HWND window) {
+    // Only a toolbar window's extra word is a twin link.
+    return HasClass(window, kToolbarClassName) ? reinterpret_cast<HWND>(GetWindowLongPtrA(window, 0)) : nullptr;
+}
+
+HWND ResolveRoleWindow(HWND window, int role) {
+    if (!window) return nullptr;
+    LONG style = GetWindowLongA(window, GWL_STYLE);
+    switch (role) {
+    case ROLE_DOCKED:
+        return (style & WS_CHILD) ? window : GetTwinWindow(window);
+    case ROLE_FLOATING:
+        return (style & WS_POPUP) ? window : GetTwinWindow(window);
+    case ROLE_ACTIVE: {
+        HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+        return QBR_IsToolbarFloating(pane) ? ResolveRoleWindow(pane, ROLE_FLOATING) : pane;
+    }
+    case ROLE_SELF:
+        return window;
+    default:
+        return nullptr;
+    }
+}
+
+ToolbarManager *ManagerOfToolbar(HWND window) {
+    if (window && window == cachedToolbarPane) return cachedToolbarManager;
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    HWND dock = pane ? GetParent(pane) : nullptr;
+    // A window that is not one of our panes in one of our docks has no
+    // manager: its parent's extra word is someone else's.
+    if (!HasClass(pane, kToolbarClassName) || !HasClass(dock, kDockClassName)) return nullptr;
+    cachedToolbarPane = pane;
+    cachedToolbarManager = reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(dock, 0));
+    return cachedToolbarManager;
+}
+
+void ForgetToolbarWindow(HWND window) {
+    if (window && window == cachedToolbarPane) {
+        cachedToolbarPane = nullptr;
+        cachedToolbarManager = nullptr;
+    }
+}
+
+void ForgetManager(const ToolbarManager *manager) {
+    if (manager && manager == cachedToolbarManager) {
+        cachedToolbarPane = nullptr;
+        cachedToolbarManager = nullptr;
+    }
+}
+
+HWND DockOfToolbar(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    return pane ? GetParent(pane) : nullptr;
+}
+
+UINT IsSideDocked(HWND window) {
+    UINT side;
+    return GetDockSide(DockOfToolbar(window), &side) && side != DOCK_TOP ? 1 : 0;
+}
+
+// ---- Creation -------------------------------------------------------------------
+
+HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
+    auto instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(dock, GWLP_HINSTANCE));
+    WNDCLASSA wc;
+    if (!GetClassInfoA(instance, kToolbarClassName, &wc)) {
+        wc = WNDCLASSA{};
+        wc.style = CS_DBLCLKS;
+        wc.lpfnWndProc = ToolbarWindowProc;
+        wc.cbWndExtra = sizeof(LONG_PTR); // the twin window
+        wc.hInstance = instance;
+        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
+        wc.lpszClassName = kToolbarClassName;
+        if (!RegisterClassA(&wc)) return nullptr;
+    }
+    // The pane's WM_CREATE makes the floating frame and the record.
+    return CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
+}
+
+// ---- Coordinates ----------------------------------------------------------------
+
+void ScreenRectToClient(HWND window, RECT *rect) {
+    POINT p[2] = {{rect->left, rect->top}, {rect->right, rect->bottom}};
+    ScreenToClient(window, &p[0]);
+    ScreenToClient(window, &p[1]);
+    *rect = RECT{p[0].x, p[0].y, p[1].x, p[1].y};
+}
+
+void ClientRectToScreen(HWND window, RECT *rect) {
+    POINT p[2] = {{rect->left, rect->top}, {rect->right, rect->bottom}};
+    ClientToScreen(window, &p[0]);
+    ClientToScreen(window, &p[1]);
+    *rect = RECT{p[0].x, p[0].y, p[1].x, p[1].y};
+}
+
+void ScreenPointToClient(HWND window, int *x, int *y) {
+    POINT p = {*x, *y};
+    ScreenToClient(window, &p);
+    *x = p.x;
+    *y = p.y;
+}
+
+void ClientPointToScreen(HWND window, int *x, int *y) {
+    POINT p = {*x, *y};
+    ClientToScreen(window, &p);
+    *x = p.x;
+    *y = p.y;
+}
+
+// ---- The role walk and rectangles ---------------------------------------------------
+
+// Brings ROLE_ACTIVE and ROLE_SELF down to ROLE_DOCKED or ROLE_FLOATING, with
+// the window to act on. Any other role has no window.
+static bool SettleRole(HWND &window, int &role) {
+    if (role == ROLE_ACTIVE) {
+        window = ResolveRoleWindow(window, ROLE_ACTIVE);
+        role = ROLE_SELF;
+    }
+    if (role == ROLE_SELF) role = IsFloatingFrame(window) ? ROLE_FLOATING : ROLE_DOCKED;
+    return role == ROLE_DOCKED || role == ROLE_FLOATING;
+}
+
+void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    GetWindowRect(target, rect);
+    if (role == ROLE_DOCKED) ScreenRectToClient(GetParent(target), rect);
+}
+
+void GetItemArea(HWND window, int role, RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    RECT client;
+    GetClientRect(target, &client);
+    if (role == ROLE_DOCKED)
+        *rect = RECT{kAreaLeft, kPaneAreaTop, client.right - kAreaRight, client.bottom - kPaneAreaBottom};
+    else
+        *rect = RECT{kAreaLeft, captionHeight + kFrameAreaTop, client.right - kAreaRight, client.bottom - kFrameAreaBottom};
+}
+
+static int Width(const RECT &r) { return r.right - r.left; }
+static int Height(const RECT &r) { return r.bottom - r.top; }
+
+// SetWindowPos for the library's own moves: never activating, never touching
+// the z-order, and only with the parts that change.
+static void PlaceWindow(HWND window, const RECT &target, bool moved, bool sized) {
+    UINT flags = SWP_NOZORDER | SWP_NOACTIVATE;
+    if (!moved) flags |= SWP_NOMOVE;
+    if (!sized) flags |= SWP_NOSIZE;
+    SetWindowPos(window, nullptr, moved ? target.left : 0, moved ? target.top : 0, sized ? Width(target) : 0,
+                 sized ? Height(target) : 0, flags);
+}
+
+void MoveToolbarWindow(HWND window, int role, const RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    RECT present;
+    GetToolbarWindowRect(target, role, &present);
+    bool moved = rect->left != present.left || rect->top != present.top;
+    bool sized = Width(*rect) != Width(present) || Height(*rect) != Height(present);
+    if (!moved && !sized) return;
+    PlaceWindow(target, *rect, moved, sized);
+    ComputeRowBreaks(target, role);
+}
+
+void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    RECT outer, area;
+    GetToolbarWindowRect(target, role, &outer);
+    GetItemArea(target, role, &area);
+    if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
+    // Whatever the window spends outside its item area stays the same.
+    RECT size = {0, 0, Width(*rect) + Width(outer) - Width(area), Height(*rect) + Height(outer) - Height(area)};
+    PlaceWindow(target, size, false, true);
+}
+
+void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    InvalidateRect(target, rect, FALSE);
+    UpdateWindow(target);
+}
+
+// ---- Sizing and refits -------------------------------------------------------------
+
+UINT SizeToolbarWindows(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    UINT ok = IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height)
+                                 : NaturalSizeHorizontal(pane, &width, &height);
+    if (!ok) return 0;
+    // The margins of the item areas, plus what WS_BORDER takes around the
+    // pane and WS_THICKFRAME around the frame: each item area comes out
+    // exactly the natural size.
+    RECT paneSize = {0, 0, width + kAreaLeft + kAreaRight + 2 * GetSystemMetrics(SM_CXBORDER),
+                     height + kPaneAreaTop + kPaneAreaBottom + 2 * GetSystemMetrics(SM_CYBORDER)};
+    PlaceWindow(pane, paneSize, false, true);
+    ComputeRowBreaks(pane, ROLE_DOCKED);
+    RECT frameSize = {0, 0, width + kAreaLeft + kAreaRight + 2 * GetSystemMetrics(SM_CXFRAME),
+                      height + kFrameAreaTop + kFrameAreaBottom + 2 * GetSystemMetrics(SM_CYFRAME) + captionHeight};
+    PlaceWindow(ResolveRoleWindow(pane, ROLE_FLOATING), frameSize, false, true);
+    ComputeRowBreaks(pane, ROLE_FLOATING);
+    RefitToolbar(pane, ROLE_BOTH);
+    return 1;
+}
+
+// The refit of one window, with the measure that a plain refit or a drop uses.
+static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
+    if (role == ROLE_BOTH) {
+        if (!Refit(window, ROLE_FLOATING, dropped, forDrop)) return 0;
+        role = ROLE_DOCKED;
+    }
+    if (!SettleRole(window, role)) return 0;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return 0;
+    RECT area;
+    GetItemArea(target, role, &area);
+    HWND pane = ResolveRoleWindow(target, ROLE_DOCKED);
+    UINT measured = forDrop ? MeasureAfterDrop(pane, role, dropped, &area) : MeasureToFit(pane, role, &area);
+    if (!measured) return 0;
+    SizeToolbarToContent(target, role, &area);
+    ComputeRowBreaks(target, role);
+    RepaintToolbarWindow(target, role, nullptr);
+    // By the toolbar's state, not the role: a refit of the hidden frame of a
+    // docked toolbar lays the dock out too.
+    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDock(DockOfToolbar(target));
+    return 1;
+}
+
+UINT RefitToolbar(HWND window, int role) { return Refit(window, role, nullptr, false); }
+
+UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item) { return Refit(window, role, item, true); }
+
+UINT ShowToolbarWindow(HWND window, UINT show) {
+    HWND target = ResolveRoleWindow(window, ROLE_ACTIVE);
+    if (!target) return 0;
+    if ((IsWindowVisible(target) ? 1u : 0u) == (show ? 1u : 0u)) return 1;
+    ShowWindow(target, show ? SW_SHOWNA : SW_HIDE);
+    return RelayoutDock(DockOfToolbar(target));
+}
+
+static UINT Switch(HWND window, bool toFloating) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    HWND frame = ResolveRoleWindow(window, ROLE_FLOATING);
+    HWND shown = toFloating ? frame : pane;
+    HWND hidden = toFloating ? pane : frame;
+    if (!pane || !frame) return 0;
+    if (IsWindowVisible(shown) || (QBR_GetToolbarFlags(pane) & TBF_HIDDEN)) return 1;
+    ShowWindow(hidden, SW_HIDE);
+    ShowWindow(shown, SW_SHOWNA);
+    return RelayoutDock(DockOfToolbar(pane));
+}
+
+UINT SwitchToFloating(HWND window) { return Switch(window, true); }
+UINT SwitchToDocked(HWND window) { return Switch(window, false); }
+
+// ---- New button size ---------------------------------------------------------------
+
+UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight) {
+    if (!manager) return 0;
+    for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
+        HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
+        for (int role : {ROLE_FLOATING, ROLE_DOCKED}) {
+            RECT area;
+            GetItemArea(pane, role, &area);
+            RewrapForMetrics(pane, role, newWidth, newHeight, &area);
+            SizeToolbarToContent(pane, role, &area);
+        }
+    }
+    return 1;
+}
+
+UINT RelayoutManagerToolbars(ToolbarManager *manager) {
+    if (!manager) return 0;
+    for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
+        HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
+        RefitToolbar(pane, ROLE_BOTH);
+        ComputeRowBreaks(pane, ROLE_FLOATING);
+        ComputeRowBreaks(pane, ROLE_DOCKED);
+        if (ResolveRoleWindow(pane, ROLE_ACTIVE) == pane) RelayoutDock(DockOfToolbar(pane));
+    }
+    return 1;
+}
+
+// Both walk every manager of the client in list order.
+static UINT ForEachManager(UINT (*action)(ToolbarManager *, int, int), int w, int h) {
+    ToolbarClient *client = CurrentClient();
+    if (!client) return 0;
+    for (UINT i = 0; i < PointerListCount(client->managers); ++i)
+        action(ListAt<ToolbarManager>(client->managers, i), w, h);
+    return 1;
+}
+
+UINT RewrapAllManagers(int newWidth, int newHeight) {
+    return ForEachManager(RewrapManagerToolbars, newWidth, newHeight);
+}
+
+UINT RelayoutAllManagers() {
+    return ForEachManager([](ToolbarManager *m, int, int) { return RelayoutManagerToolbars(m); }, 0, 0);
+}
