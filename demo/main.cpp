@@ -1,43 +1,415 @@
-// The demonstration host: a main window that starts the library, makes a
-// manager for itself and ends everything in order when it closes.
-#include "quaybar.h"
+// The demonstration host: the program's entry, the main window and the view
+// windows. It does no document work; its commands drive the toolbars, the
+// status line and the settings, to show how a host uses the library.
+#include <cstdio>
+#include <initializer_list>
 
-static ToolbarManager *mainManager = nullptr;
+#include "demo.h"
+#include "statusbar.h"
 
-static LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+void OpenViewWindow();
+
+namespace {
+
+ToolbarManager *mainManager = nullptr;
+HWND mainStatusBar = nullptr;
+HWND mainEdit = nullptr;
+HFONT mainEditFont = nullptr;
+HMENU mainToolbarsMenu = nullptr;
+
+constexpr char kMainLayout[] = "Main Layout";
+constexpr char kViewLayout[] = "View Layout";
+constexpr char kGlobals[] = "Toolbar Globals";
+
+// The popup "&View" is the third of the menu bar; its Toolbars submenu is
+// made at run time and rebuilt each time it opens.
+HMENU AddToolbarsMenu(HWND frame) {
+    HMENU menu = CreatePopupMenu();
+    HMENU view = GetSubMenu(GetMenu(frame), 2);
+    if (menu && view) AppendMenuA(view, MF_POPUP, reinterpret_cast<UINT_PTR>(menu), "&Toolbars");
+    return menu;
+}
+
+void CheckGlobals(HWND frame) {
+    HMENU menu = GetMenu(frame);
+    CheckMenuItem(menu, kQuickHelpCommand, QBR_GetQuickHelp() ? MF_CHECKED : MF_UNCHECKED);
+    CheckMenuItem(menu, kButtonTextCommand, QBR_GetButtonText() ? MF_CHECKED : MF_UNCHECKED);
+}
+
+// The status line follows WM_MENUSELECT from menus and, as the library sends
+// it for the start and end of a press, from toolbar buttons too.
+void OnMenuSelect(HWND statusBar, WPARAM wParam) { SetStatusText(statusBar, HIWORD(wParam) == 0xFFFF ? 0 : LOWORD(wParam)); }
+
+void OpenAbout(HWND frame, ToolbarManager *manager) {
+    DialogBoxParamA(moduleInstance, "About", frame, AboutDialogProc, 0);
+    // The latched button 151 stays down while the box is open.
+    QBR_SetButtonPressed(manager, kAboutCommand, 0);
+}
+
+// ---- The main window -------------------------------------------------------------
+
+void MainCommand(HWND window, UINT id) {
+    HMENU menu = GetMenu(window);
+    if (id >= 201 && id <= 212) {
+        QBR_SetRadioRange(mainManager, 201, 212, id);
+        CheckMenuRadio(menu, 201, 212, id);
+    } else if (id >= 304 && id <= 307) {
+        QBR_SetRadioRange(mainManager, 304, 307, id);
+        CheckMenuRadio(menu, 304, 307, id);
+    } else if (id >= kToolbarsMenuBase && id < kToolbarsMenuBase + QBR_GetToolbarCount(mainManager)) {
+        ToggleToolbar(mainManager, id);
+    } else if (id == kQuickHelpCommand || id == kButtonTextCommand) {
+        ToggleGlobal(window, id);
+    } else if (id == kOpenViewCommand) {
+        OpenViewWindow();
+    } else if (id == kAboutCommand) {
+        OpenAbout(window, mainManager);
+    } else if (id == kExitCommand) {
+        SendMessageA(window, WM_CLOSE, 0, 0);
+    } else if (id == kHelpContentsCommand) {
+        WinHelpA(window, "QBR.HLP", HELP_CONTENTS, 0);
+    }
+}
+
+LRESULT OnMainCreate(HWND window) {
+    mainEdit = CreateEditControl(window, &mainEditFont);
+    if (!QBR_Initialize(moduleInstance, DemoHelpText)) return -1;
+    QBR_SetNotifyMessages(WM_MENUSELECT, WM_MENUSELECT);
+    QBR_SetQuickHelp(GetPrivateProfileIntA(kGlobals, "Quick Help", 1, SettingsPath()));
+    // No manager exists yet, so this only stores the setting.
+    QBR_SetButtonText(GetPrivateProfileIntA(kGlobals, "Button Text", 0, SettingsPath()));
+    mainManager = BuildMainToolbars(window, kMainLayout);
+    mainStatusBar = CreateStatusBar(window);
+    ShowWindow(window, SW_SHOWNORMAL);
+    UpdateWindow(window);
+    HMENU menu = GetMenu(window);
+    CheckMenuRadio(menu, 201, 212, 204);
+    QBR_SetRadioRange(mainManager, 201, 212, 204);
+    CheckMenuRadio(menu, 304, 307, 304);
+    QBR_SetRadioRange(mainManager, 304, 307, 304);
+    CheckGlobals(window);
+    mainToolbarsMenu = AddToolbarsMenu(window);
+    char program[260], drive[_MAX_DRIVE], directory[_MAX_DIR], text[MAX_PATH + 16];
+    GetModuleFileNameA(nullptr, program, sizeof(program));
+    _splitpath(program, drive, directory, nullptr, nullptr);
+    std::snprintf(text, sizeof(text), "%s%sQBRDEMO.TXT", drive, directory);
+    LoadTextFile(mainEdit, text);
+    SetFocus(mainEdit);
+    return 0;
+}
+
+void OnMainClose(HWND window) {
+    SaveLayout(mainManager, kMainLayout);
+    QBR_DestroyManager(mainManager);
+    mainManager = nullptr;
+    if (mainEditFont) DeleteObject(mainEditFont);
+    mainEditFont = nullptr;
+    DestroyWindow(window);
+}
+
+void DestroyMainContents() {
+    char number[16];
+    std::snprintf(number, sizeof(number), "%i", static_cast<int>(QBR_GetQuickHelp()));
+    WritePrivateProfileStringA(kGlobals, "Quick Help", number, SettingsPath());
+    std::snprintf(number, sizeof(number), "%i", static_cast<int>(QBR_GetButtonText()));
+    WritePrivateProfileStringA(kGlobals, "Button Text", number, SettingsPath());
+    QBR_Terminate();
+    DeleteStatusBarFont();
+    PostQuitMessage(0);
+}
+
+LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
     case WM_CREATE:
-        if (!QBR_Initialize(moduleInstance, nullptr)) return -1;
-        mainManager = QBR_CreateManager(window);
+        return OnMainCreate(window);
+    case WM_DESTROY:
+        DestroyMainContents();
+        return 0;
+    case WM_SIZE:
+        // Also sent by the library, with both parameters 0, when a dock changes.
+        SizeFrameContents(window, mainManager, mainStatusBar, mainEdit);
+        return 0;
+    case WM_ACTIVATE:
+        if (wParam) SetFocus(mainEdit);
         return 0;
     case WM_CLOSE:
-        QBR_DestroyManager(mainManager);
-        mainManager = nullptr;
-        DestroyWindow(window);
+        OnMainClose(window);
         return 0;
-    case WM_DESTROY:
-        QBR_Terminate();
-        PostQuitMessage(0);
+    case WM_COMMAND:
+        MainCommand(window, LOWORD(wParam));
+        return 0;
+    case WM_INITMENUPOPUP:
+        if (reinterpret_cast<HMENU>(wParam) == mainToolbarsMenu) {
+            FillToolbarsMenu(mainManager, mainToolbarsMenu);
+            DrawMenuBar(window);
+        }
+        return 0;
+    case WM_MENUSELECT:
+        OnMenuSelect(mainStatusBar, wParam);
         return 0;
     }
     return DefWindowProcA(window, message, wParam, lParam);
 }
 
+UINT RegisterMainWindow() {
+    if (!RegisterStatusBarClass()) return 0;
+    WNDCLASSA wc;
+    if (!GetClassInfoA(moduleInstance, "TestQBRApp", &wc)) {
+        wc = WNDCLASSA{};
+        wc.style = CS_BYTEALIGNWINDOW;
+        wc.lpfnWndProc = MainWindowProc;
+        wc.hInstance = moduleInstance;
+        wc.hIcon = LoadIconA(moduleInstance, "AppIcon");
+        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
+        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
+        wc.lpszMenuName = "Main";
+        wc.lpszClassName = "TestQBRApp";
+        if (!RegisterClassA(&wc)) return 0;
+    }
+    return CreateWindowExA(0, "TestQBRApp", "Quaybar Demo", WS_OVERLAPPEDWINDOW, 10, 10, CW_USEDEFAULT, CW_USEDEFAULT,
+                           nullptr, nullptr, moduleInstance, nullptr)
+               ? 1
+               : 0;
+}
+
+// ---- View windows ----------------------------------------------------------------
+//
+// The class's one window word holds the manager. Everything else a view owns
+// (edit control, its font, status bar, Toolbars submenu) lives in a record
+// kept in the window's user data, freed when the window goes.
+
+struct ViewState {
+    HWND edit;
+    HFONT editFont;
+    HWND statusBar;
+    HMENU toolbarsMenu;
+};
+
+ToolbarManager *ViewManager(HWND window) {
+    return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(window, 0));
+}
+ViewState *ViewStateOf(HWND window) { return reinterpret_cast<ViewState *>(GetWindowLongPtrA(window, GWLP_USERDATA)); }
+
+LRESULT OnViewCreate(HWND window) {
+    auto *state = new ViewState{};
+    SetWindowLongPtrA(window, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(state));
+    state->edit = CreateEditControl(window, &state->editFont);
+    if (!state->edit) return 0; // a view without its edit control stays an empty frame
+    state->statusBar = CreateStatusBar(window);
+    ShowWindow(window, SW_SHOWNORMAL);
+    UpdateWindow(window);
+    ToolbarManager *manager = BuildViewToolbars(window, kViewLayout);
+    SetWindowLongPtrA(window, 0, reinterpret_cast<LONG_PTR>(manager));
+    if (!manager) return 0; // no toolbars: the commands below have nothing to act on
+    CheckMenuRadio(GetMenu(window), 304, 307, 304);
+    QBR_SetRadioRange(manager, 304, 307, 304);
+    CheckGlobals(window);
+    state->toolbarsMenu = AddToolbarsMenu(window);
+    SizeFrameContents(window, manager, state->statusBar, state->edit);
+    return 0;
+}
+
+void OnViewClose(HWND window) {
+    ToolbarManager *manager = ViewManager(window);
+    SaveLayout(manager, kViewLayout);
+    QBR_DestroyManager(manager);
+    SetWindowLongPtrA(window, 0, 0);
+    DestroyWindow(window);
+}
+
+void OnViewDestroy(HWND window) {
+    ViewState *state = ViewStateOf(window);
+    if (!state) return;
+    if (state->editFont) DeleteObject(state->editFont);
+    SetWindowLongPtrA(window, GWLP_USERDATA, 0);
+    delete state;
+}
+
+void ViewCommand(HWND window, UINT id) {
+    ToolbarManager *manager = ViewManager(window);
+    if (id >= 304 && id <= 307) {
+        QBR_SetRadioRange(manager, 304, 307, id);
+        CheckMenuRadio(GetMenu(window), 304, 307, id);
+    } else if (id >= kToolbarsMenuBase && id < kToolbarsMenuBase + QBR_GetToolbarCount(manager)) {
+        ToggleToolbar(manager, id);
+    } else if (id == kQuickHelpCommand || id == kButtonTextCommand) {
+        ToggleGlobal(window, id);
+    } else if (id == kAboutCommand) {
+        OpenAbout(window, manager);
+    } else if (id == kExitCommand) {
+        SendMessageA(window, WM_CLOSE, 0, 0);
+        return; // the window is gone
+    }
+    if (ViewState *state = ViewStateOf(window)) SetStatusText(state->statusBar, 0);
+}
+
+LRESULT CALLBACK ViewWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    ViewState *state = ViewStateOf(window);
+    switch (message) {
+    case WM_CREATE:
+        return OnViewCreate(window);
+    case WM_SIZE:
+        if (state) SizeFrameContents(window, ViewManager(window), state->statusBar, state->edit);
+        return 0;
+    case WM_ACTIVATE:
+        if (wParam && state) SetFocus(state->edit);
+        return 0;
+    case WM_CLOSE:
+        OnViewClose(window);
+        return 0;
+    case WM_DESTROY:
+        OnViewDestroy(window);
+        return 0;
+    case WM_COMMAND:
+        ViewCommand(window, LOWORD(wParam));
+        return 0;
+    case WM_INITMENUPOPUP:
+        if (state && reinterpret_cast<HMENU>(wParam) == state->toolbarsMenu) {
+            FillToolbarsMenu(ViewManager(window), state->toolbarsMenu);
+            DrawMenuBar(window);
+        }
+        return 0;
+    case WM_MENUSELECT:
+        if (state) OnMenuSelect(state->statusBar, wParam);
+        return 0;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+} // namespace
+
+void OpenViewWindow() {
+    WNDCLASSA wc;
+    if (!GetClassInfoA(moduleInstance, "TestQBRView", &wc)) {
+        wc = WNDCLASSA{};
+        wc.style = CS_BYTEALIGNWINDOW;
+        wc.lpfnWndProc = ViewWindowProc;
+        wc.cbWndExtra = sizeof(LONG_PTR); // the manager
+        wc.hInstance = moduleInstance;
+        wc.hIcon = LoadIconA(moduleInstance, "AppIcon");
+        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
+        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
+        wc.lpszMenuName = "View";
+        wc.lpszClassName = "TestQBRView";
+        if (!RegisterClassA(&wc)) return;
+    }
+    CreateWindowExA(0, "TestQBRView", "View Window", WS_OVERLAPPEDWINDOW | WS_VISIBLE, CW_USEDEFAULT, CW_USEDEFAULT,
+                    CW_USEDEFAULT, CW_USEDEFAULT, nullptr, nullptr, moduleInstance, nullptr);
+}
+
+// ---- Shared by both frames -----------------------------------------------------------
+
+void CheckMenuRadio(HMENU menu, UINT first, UINT last, UINT onId) {
+    for (UINT id = first; id <= last && last >= first; ++id)
+        CheckMenuItem(menu, id, MF_BYCOMMAND | (id == onId ? MF_CHECKED : MF_UNCHECKED));
+}
+
+void FillToolbarsMenu(ToolbarManager *manager, HMENU menu) {
+    for (int n = GetMenuItemCount(menu); n > 0; --n) DeleteMenu(menu, 0, MF_BYPOSITION);
+    for (UINT i = 0; i < QBR_GetToolbarCount(manager); ++i) {
+        HWND toolbar = QBR_GetToolbar(manager, i);
+        if (!toolbar) continue;
+        char title[256];
+        QBR_GetToolbarTitle(toolbar, title, 254);
+        AppendMenuA(menu, QBR_IsToolbarVisible(toolbar) ? MF_CHECKED : MF_STRING, kToolbarsMenuBase + i, title);
+    }
+}
+
+void ToggleToolbar(ToolbarManager *manager, UINT id) {
+    HWND toolbar = QBR_GetToolbar(manager, id - kToolbarsMenuBase);
+    QBR_SetToolbarFlags(toolbar, QBR_IsToolbarVisible(toolbar) ? TBF_HIDDEN : TBF_VISIBLE);
+}
+
+// Quick help and button text are the client's, shared by all frames; only
+// the menu of the frame that gave the command gets its check mark changed.
+void ToggleGlobal(HWND frame, UINT command) {
+    bool quickHelp = command == kQuickHelpCommand;
+    UINT on = (quickHelp ? QBR_GetQuickHelp() : QBR_GetButtonText()) ? 0 : 1;
+    CheckMenuItem(GetMenu(frame), command, on ? MF_CHECKED : MF_UNCHECKED);
+    if (quickHelp)
+        QBR_SetQuickHelp(on);
+    else
+        QBR_SetButtonText(on);
+}
+
+HWND CreateEditControl(HWND frame, HFONT *font) {
+    HWND edit = CreateWindowExA(0, "Edit", "",
+                                WS_CHILD | WS_VISIBLE | WS_VSCROLL | WS_BORDER | ES_MULTILINE | ES_AUTOVSCROLL, 0, 0,
+                                0, 0, frame, reinterpret_cast<HMENU>(static_cast<INT_PTR>(kEditId)), moduleInstance,
+                                nullptr);
+    LOGFONTA lf = {};
+    HDC screen = GetDC(nullptr);
+    lf.lfHeight = -MulDiv(11, GetDeviceCaps(screen, LOGPIXELSY), 72);
+    ReleaseDC(nullptr, screen);
+    lf.lfWeight = 400;
+    lf.lfPitchAndFamily = VARIABLE_PITCH | FF_ROMAN;
+    lstrcpyA(lf.lfFaceName, "Times New Roman");
+    *font = CreateFontIndirectA(&lf);
+    if (edit) SendMessageA(edit, WM_SETFONT, reinterpret_cast<WPARAM>(*font), 0);
+    return edit;
+}
+
+// The client control goes below the top dock and above the status bar; the
+// side docks lie over it. The manager may still be 0 while the docks are
+// being built, as the dock tells the frame of each change at once.
+void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND edit) {
+    RECT client;
+    GetClientRect(frame, &client);
+    int topSpace = 0, statusHeight = 0;
+    HWND top = QBR_GetDock(manager, DOCK_TOP);
+    if (top && IsWindowVisible(top)) {
+        RECT r;
+        GetWindowRect(top, &r);
+        topSpace = r.bottom - r.top - 1;
+    }
+    if (statusBar && IsWindowVisible(statusBar)) {
+        RECT r;
+        GetWindowRect(statusBar, &r);
+        statusHeight = r.bottom - r.top;
+        SetWindowPos(statusBar, nullptr, client.left, client.bottom - statusHeight, client.right, statusHeight,
+                     SWP_NOZORDER | SWP_NOACTIVATE);
+    }
+    if (edit)
+        SetWindowPos(edit, nullptr, client.left - 1, topSpace - 1, client.right + 1,
+                     client.bottom - topSpace - statusHeight + 1, SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM) {
+    static HFONT aboutFont = nullptr;
+    switch (message) {
+    case WM_INITDIALOG: {
+        LOGFONTA lf = {};
+        HDC screen = GetDC(nullptr);
+        lf.lfHeight = -MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72);
+        ReleaseDC(nullptr, screen);
+        lf.lfWeight = 400;
+        lf.lfPitchAndFamily = VARIABLE_PITCH | FF_SWISS;
+        lstrcpyA(lf.lfFaceName, "MS Sans Serif");
+        aboutFont = CreateFontIndirectA(&lf);
+        for (int id : {8001, 8002, 8003}) SendDlgItemMessageA(dialog, id, WM_SETFONT, reinterpret_cast<WPARAM>(aboutFont), 0);
+        RECT r;
+        GetWindowRect(dialog, &r);
+        SetWindowPos(dialog, nullptr, (GetSystemMetrics(SM_CXSCREEN) - (r.right - r.left)) / 2,
+                     (GetSystemMetrics(SM_CYSCREEN) - (r.bottom - r.top)) / 3, 0, 0, SWP_NOSIZE);
+        return TRUE;
+    }
+    case WM_COMMAND:
+        if (LOWORD(wParam) == IDOK || LOWORD(wParam) == IDCANCEL) {
+            if (aboutFont) DeleteObject(aboutFont);
+            aboutFont = nullptr;
+            EndDialog(dialog, 1);
+        } else if (LOWORD(wParam) == 8004) {
+            WinHelpA(dialog, "QBR.HLP", HELP_CONTENTS, 0);
+        }
+        return TRUE;
+    }
+    return FALSE;
+}
+
 int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     moduleInstance = instance;
-    WNDCLASSA wc = {};
-    wc.lpfnWndProc = MainWindowProc;
-    wc.hInstance = instance;
-    wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
-    wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
-    wc.lpszClassName = "TestQBRApp";
-    if (!RegisterClassA(&wc)) return 0;
-    HWND frame = CreateWindowExA(0, "TestQBRApp", "Quaybar Demo", WS_OVERLAPPEDWINDOW, 10, 10, CW_USEDEFAULT,
-                                 CW_USEDEFAULT, nullptr, nullptr, instance, nullptr);
-    if (!frame) return 0;
-    ShowWindow(frame, SW_SHOWNORMAL);
-    UpdateWindow(frame);
-    MSG msg;
+    if (!RegisterMainWindow()) return 0;
+    MSG msg = {};
     while (GetMessageA(&msg, nullptr, 0, 0) > 0) {
         TranslateMessage(&msg);
         DispatchMessageA(&msg);

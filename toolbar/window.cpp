@@ -272,11 +272,24 @@ UINT RefitToolbar(HWND window, int role) { return Refit(window, role, nullptr, f
 
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item) { return Refit(window, role, item, true); }
 
+// Shows a toolbar window without activating it. A floating frame also goes
+// to the top: showing alone keeps its old place in the z-order, which may be
+// below its owner if it was last placed while the owner was hidden.
+static void ShowWithoutActivating(HWND window) {
+    if (IsFloatingFrame(window))
+        SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE | SWP_SHOWWINDOW);
+    else
+        ShowWindow(window, SW_SHOWNA);
+}
+
 UINT ShowToolbarWindow(HWND window, UINT show) {
     HWND target = ResolveRoleWindow(window, ROLE_ACTIVE);
     if (!target) return 0;
     if ((IsWindowVisible(target) ? 1u : 0u) == (show ? 1u : 0u)) return 1;
-    ShowWindow(target, show ? SW_SHOWNA : SW_HIDE);
+    if (show)
+        ShowWithoutActivating(target);
+    else
+        ShowWindow(target, SW_HIDE);
     return RelayoutDock(DockOfToolbar(target));
 }
 
@@ -288,7 +301,7 @@ static UINT Switch(HWND window, bool toFloating) {
     if (!pane || !frame) return 0;
     if (IsWindowVisible(shown) || (QBR_GetToolbarFlags(pane) & TBF_HIDDEN)) return 1;
     ShowWindow(hidden, SW_HIDE);
-    ShowWindow(shown, SW_SHOWNA);
+    ShowWithoutActivating(shown);
     return RelayoutDock(DockOfToolbar(pane));
 }
 

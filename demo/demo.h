@@ -1,0 +1,34 @@
+// The demonstration host: what its pieces share.
+#pragma once
+
+#include "quaybar.h"
+
+// Menu and control ids of the host's own.
+constexpr UINT kEditId = 8000;
+constexpr UINT kToolbarsMenuBase = 8500;
+constexpr UINT kQuickHelpCommand = 120;
+constexpr UINT kButtonTextCommand = 121;
+constexpr UINT kOpenViewCommand = 122;
+constexpr UINT kAboutCommand = 151;
+constexpr UINT kExitCommand = 152;
+constexpr UINT kHelpContentsCommand = 153;
+
+// Catalogs and default toolbars (tables.cpp).
+ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section);
+ToolbarManager *BuildViewToolbars(HWND frame, LPCSTR section);
+int CALLBACK DemoHelpText(UINT id, UINT kind, LPSTR buffer, int size);
+
+// The settings file and the layout carried to and from it (settings.cpp).
+LPCSTR SettingsPath();
+void SaveLayout(ToolbarManager *manager, LPCSTR section);
+UINT RestoreLayout(ToolbarManager *manager, HWND frame, LPCSTR section);
+UINT LoadTextFile(HWND edit, LPCSTR path);
+
+// Shared by both kinds of frame (main.cpp).
+void CheckMenuRadio(HMENU menu, UINT first, UINT last, UINT onId);
+void FillToolbarsMenu(ToolbarManager *manager, HMENU menu);
+HWND CreateEditControl(HWND frame, HFONT *font);
+void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND edit);
+void ToggleToolbar(ToolbarManager *manager, UINT id);
+void ToggleGlobal(HWND frame, UINT command);
+INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam);

@@ -1,0 +1,365 @@
+// Dock areas: the strips along the top, left and right edges of a frame's
+// client area. A dock packs the panes of its toolbars into rows, sizes itself
+// to them, hides when it has nothing to show and tells the frame through
+// WM_SIZE (both parameters 0) whenever its place, size or visibility changed.
+#include "dock/dock.h"
+
+#include "core/core.h"
+#include "core/gdi.h"
+#include "input/input.h"
+#include "toolbar/toolbar.h"
+
+const char kDockClassName[] = "QBR_DockWindow";
+
+// The dock window keeps one word: its ToolbarManager pointer.
+constexpr int kDockManagerWord = 0;
+
+static ToolbarManager *DockManager(HWND window) {
+    if (!window) return nullptr;
+    // Only a dock window's word 0 is a manager pointer; another class's word
+    // 0 may hold anything.
+    char name[32];
+    if (!GetClassNameA(window, name, sizeof name) || !StringsEqual(name, kDockClassName)) return nullptr;
+    return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(window, kDockManagerWord));
+}
+
+static UINT RegisterDockClass(HINSTANCE instance) {
+    WNDCLASSA existing;
+    if (GetClassInfoA(instance, kDockClassName, &existing)) return 1;
+    WNDCLASSA wc = {};
+    wc.style = CS_DBLCLKS;
+    wc.lpfnWndProc = DockWindowProc;
+    wc.cbClsExtra = 0;
+    wc.cbWndExtra = sizeof(LONG_PTR);
+    wc.hInstance = instance;
+    wc.hCursor = LoadCursorA(nullptr, reinterpret_cast<LPCSTR>(IDC_ARROW));
+    wc.hbrBackground = reinterpret_cast<HBRUSH>(static_cast<INT_PTR>(COLOR_BTNFACE + 1));
+    wc.lpszClassName = kDockClassName;
+    return RegisterClassA(&wc) ? 1 : 0;
+}
+
+// ---- Public functions -----------------------------------------------------------
+
+extern "C" HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side) {
+    if (!manager || !frame) return nullptr;
+    HINSTANCE instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
+    if (!RegisterDockClass(instance)) return nullptr;
+    // Not WS_VISIBLE: PlaceDock alone decides whether a dock shows.
+    HWND window = CreateWindowExA(0, kDockClassName, "", WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN, 0, 0,
+                                  0, 0, frame, nullptr, instance, nullptr);
+    if (!window) return nullptr;
+    SetWindowLongPtrA(window, kDockManagerWord, reinterpret_cast<LONG_PTR>(manager));
+    if (!AddDockRecord(manager, window, side)) {
+        DestroyWindow(window);
+        return nullptr;
+    }
+    // Empty: this hides it, gives it the placeholder rectangle and tells the
+    // frame.
+    RelayoutDock(window);
+    return window;
+}
+
+extern "C" HWND QBR_GetDock(ToolbarManager *manager, UINT side) { return DockWindowForSide(manager, side); }
+
+extern "C" void QBR_DestroyDock(HWND window) {
+    if (!window) return;
+    DockArea *dock = FindDockRecord(window);
+    // The panes of the dock's toolbars are children of the dock window and
+    // would die with it while their records stay in the manager. A dock that
+    // still holds toolbars (floating or hidden ones included) is therefore
+    // left as it is; the caller moves or destroys its toolbars first.
+    if (dock && PointerListCount(dock->toolbars)) return;
+    FreeDockRecord(dock);
+    DestroyWindow(window);
+}
+
+// ---- Records ----------------------------------------------------------------------
+
+UINT AddDockRecord(ToolbarManager *manager, HWND window, UINT side) {
+    if (!manager) return 0;
+    DockArea *dock = nullptr;
+    if (!MemoryBlockAllocRecord(&dock) || !dock) return 0;
+    dock->window = window;
+    dock->side = side;
+    dock->toolbars = PointerListCreate(1, 1, 0);
+    if (!dock->toolbars || !PointerListAppend(manager->docks, ListValue(dock))) {
+        PointerListDestroy(dock->toolbars);
+        MemoryBlockFree(dock);
+        return 0;
+    }
+    return 1;
+}
+
+// The manager whose docks hold this record. The window word answers while
+// the window lives; a record whose window is already gone is looked for in
+// every manager of the client, so that it always leaves its list.
+static ToolbarManager *OwnerOfDock(const DockArea *dock) {
+    ToolbarManager *manager = DockManager(dock->window);
+    UINT index;
+    if (manager && PointerListFind(manager->docks, ListValue(dock), &index)) return manager;
+    ToolbarClient *client = CurrentClient();
+    if (!client) return nullptr;
+    for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
+        if (PointerListFind(m->docks, ListValue(dock), &index)) return m;
+    return nullptr;
+}
+
+void FreeDockRecord(DockArea *dock) {
+    if (!dock) return;
+    PointerListDestroy(dock->toolbars);
+    dock->toolbars = nullptr;
+    if (ToolbarManager *manager = OwnerOfDock(dock)) PointerListRemove(manager->docks, ListValue(dock));
+    MemoryBlockFree(dock);
+}
+
+DockArea *FindDockRecord(HWND window) {
+    ToolbarManager *manager = DockManager(window);
+    if (!manager) return nullptr;
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i)
+        if (dock->window == window) return dock;
+    return nullptr;
+}
+
+HWND DockWindowFromPoint(ToolbarManager *manager, int x, int y) {
+    if (!manager) return nullptr;
+    // Visibility is not asked: a hidden empty dock keeps a placeholder
+    // rectangle so that toolbars can still be dropped on it.
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i) {
+        RECT r;
+        if (GetWindowRect(dock->window, &r) && PointInRectInclusive(&r, x, y)) return dock->window;
+    }
+    return nullptr;
+}
+
+HWND DockWindowForSide(ToolbarManager *manager, UINT side) {
+    if (!manager) return nullptr;
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i)
+        if (dock->side == side) return dock->window;
+    return nullptr;
+}
+
+UINT GetDockSide(HWND window, UINT *side) {
+    DockArea *dock = FindDockRecord(window);
+    if (!dock) return 0;
+    if (side) *side = dock->side;
+    return 1;
+}
+
+// A toolbar that takes part in packing: docked, visible and with a pane.
+static bool IsPacked(const ToolbarRecord *toolbar) {
+    return !(toolbar->flags & TBF_FLOATING) && (toolbar->flags & TBF_VISIBLE) && toolbar->paneWindow;
+}
+
+UINT DockInsertionIndex(DockArea *dock, int x, int y, UINT *index) {
+    if (!dock) return 0;
+    UINT count = PointerListCount(dock->toolbars);
+    UINT result = count;
+    for (UINT i = 0; i < count; ++i) {
+        ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i);
+        if (!toolbar) return 0;
+        if (!IsPacked(toolbar)) continue;
+        RECT pane;
+        GetToolbarWindowRect(toolbar->paneWindow, ROLE_DOCKED, &pane);
+        // Rows run left to right in every dock; in the top dock a row lies
+        // below the one before it, in the side docks a column beside it.
+        bool before = dock->side == DOCK_TOP ? y < pane.top : x < pane.left;
+        if (PointInRectInclusive(&pane, x, y) || before) {
+            result = i;
+            break;
+        }
+    }
+    if (index) *index = result;
+    return 1;
+}
+
+UINT ToolbarIndexInDock(DockArea *dock, ToolbarRecord *toolbar, UINT *index) {
+    if (!dock || !toolbar) return 0;
+    return PointerListFind(dock->toolbars, ListValue(toolbar), index);
+}
+
+UINT InsertToolbarAt(DockArea *dock, UINT index, ToolbarRecord *toolbar) {
+    if (!dock || !toolbar) return 0;
+    if (!PointerListInsertAt(dock->toolbars, index, ListValue(toolbar))) return 0;
+    return RelayoutDock(dock->window);
+}
+
+UINT InsertToolbarBefore(DockArea *dock, ToolbarRecord *anchor, ToolbarRecord *toolbar) {
+    if (!dock || !toolbar) return 0;
+    if (!PointerListInsertBefore(dock->toolbars, ListValue(anchor), ListValue(toolbar))) return 0;
+    return RelayoutDock(dock->window);
+}
+
+UINT RemoveToolbarFromDock(DockArea *dock, ToolbarRecord *toolbar) {
+    if (!dock || !toolbar) return 0;
+    if (!PointerListRemove(dock->toolbars, ListValue(toolbar))) return 0;
+    return RelayoutDock(dock->window);
+}
+
+// ---- Packing and placing -------------------------------------------------------------
+
+UINT RelayoutDock(HWND window) {
+    if (!window) return 1;
+    DockArea *dock = FindDockRecord(window);
+    if (!dock) return 0;
+    return PackDock(dock);
+}
+
+// Panes flow left to right in rows, in list order, in the dock's client
+// coordinates. Neighbours share their one-pixel border:
+//
+//   (-1,-1)
+//      +---------T1---------+--------T2--------+     row 1
+//      |                    |                  |
+//      +---------T3------+--+------------------+     row 2 starts on the
+//      |                 |                           last line of row 1
+//      +-----------------+
+//
+// The first pane sits one pixel above and left of the dock so that its own
+// top and left border lines fall outside the dock window.
+UINT PackDock(DockArea *dock) {
+    if (!dock) return 0;
+    RECT overall = {0, 0, 0, 0};
+    RECT row = {-1, -1, 0, 0};
+    // The full-screen width, not the frame's: a dock does not wrap because the
+    // frame is narrower, and all three sides pack alike.
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    for (UINT i = 0; ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i); ++i) {
+        if (!IsPacked(toolbar)) continue;
+        RECT pane;
+        GetToolbarWindowRect(toolbar->paneWindow, ROLE_DOCKED, &pane);
+        // The test adds row.right, not row.right - 1: the shared column is not
+        // counted, so one pixel of the limit may stay free.
+        if (pane.right - pane.left + row.right <= limit) {
+            OffsetRect(&pane, row.right - 1 - pane.left, row.top - pane.top);
+        } else {
+            OffsetRect(&pane, row.left - pane.left, row.bottom - pane.top);
+            SetRectEmpty(&row);
+        }
+        MoveToolbarWindow(toolbar->paneWindow, ROLE_DOCKED, &pane);
+        // UnionRect with an empty rectangle gives the other one, which starts
+        // both the overall rectangle and a new row.
+        UnionRect(&overall, &overall, &pane);
+        UnionRect(&row, &row, &pane);
+        // Once per placed pane: the next row starts on this row's last line.
+        // Equal heights restore the bottom at each union; a shorter pane after
+        // a taller one pulls the row's bottom up one more pixel.
+        row.bottom -= 1;
+    }
+    overall.left = 0;
+    overall.top = 0;
+    PlaceDock(dock->window, &overall);
+    return 1;
+}
+
+void PlaceDock(HWND window, RECT *rect) {
+    if (!window || !rect) return;
+    int show = SW_SHOWNA;
+    if (IsRectEmpty(rect)) {
+        // Hidden, but with one button's size, so that it stays a drop target
+        // and its height still pushes the side docks down.
+        show = SW_HIDE;
+        int width = 0, height = 0;
+        GetButtonSizes(&width, &height, nullptr, nullptr);
+        rect->right = width;
+        rect->bottom = height;
+    }
+    ApplyDockSideRule(window, rect);
+
+    RECT present;
+    GetWindowRect(window, &present);
+    HWND parent = GetParent(window);
+    POINT topLeft = {present.left, present.top}, bottomRight = {present.right, present.bottom};
+    ScreenToClient(parent, &topLeft);
+    ScreenToClient(parent, &bottomRight);
+
+    const int width = rect->right - rect->left, height = rect->bottom - rect->top;
+    const bool moved = rect->left != topLeft.x || rect->top != topLeft.y;
+    const bool resized = width != bottomRight.x - topLeft.x || height != bottomRight.y - topLeft.y;
+    if (moved && resized)
+        SetWindowPos(window, nullptr, rect->left, rect->top, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
+    else if (moved)
+        SetWindowPos(window, nullptr, rect->left, rect->top, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+    else if (resized)
+        SetWindowPos(window, nullptr, 0, 0, width, height, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+
+    // A hidden dock comes through here on every relayout, changed or not, and
+    // so tells the frame each time; a visible dock only when it changed.
+    if (moved || resized || !IsWindowVisible(window)) {
+        ShowWindow(window, show);
+        ToolbarManager *manager = DockManager(window);
+        HWND frame = manager ? manager->frame : parent;
+        // Both parameters 0: the host reads the sizes itself.
+        SendMessageA(frame, WM_SIZE, 0, 0);
+    }
+    UpdateWindow(window);
+}
+
+void ApplyDockSideRule(HWND window, RECT *rect) {
+    DockArea *dock = FindDockRecord(window);
+    if (!dock || !rect) return;
+    ToolbarManager *manager = DockManager(window);
+    if (dock->side == DOCK_TOP) {
+        // Full-screen wide; the frame clips it.
+        rect->right = GetSystemMetrics(SM_CXFULLSCREEN);
+        return;
+    }
+    // The side docks start below the top dock, whether that shows or not, and
+    // run to the full-screen height.
+    int top = 0;
+    if (HWND topDock = DockWindowForSide(manager, DOCK_TOP)) {
+        RECT client;
+        GetClientRect(topDock, &client);
+        top = client.bottom;
+    }
+    rect->top = top;
+    rect->bottom = GetSystemMetrics(SM_CYFULLSCREEN);
+    if (dock->side == DOCK_RIGHT) {
+        RECT frameClient;
+        GetClientRect(manager->frame, &frameClient);
+        const int width = rect->right - rect->left;
+        rect->right = frameClient.right;
+        rect->left = frameClient.right - width;
+    }
+}
+
+// ---- The window ---------------------------------------------------------------------
+
+// The class background gives the surface; a line of the window-frame colour
+// closes the dock at its last pixel row, visible where no pane lies over it.
+static void PaintDock(HWND window) {
+    PaintScope dc(window);
+    RECT client;
+    GetClientRect(window, &client);
+    SolidBrush brush(GetSysColor(COLOR_WINDOWFRAME));
+    if (!brush) return;
+    SelectScope select(dc, brush);
+    // The last pixel row, from x = 0 over the full width. Written with a
+    // positive height: the same row given as (bottom, -1) is left unpainted by
+    // some GDI implementations.
+    PatBlt(dc, 0, client.bottom - 1, client.right, 1, PATCOPY);
+}
+
+// A right press on the dock's own surface opens the toolbar menu, owned by the
+// manager's first toolbar, with no toolbar under the click.
+static void OnDockRightDown(HWND window, LPARAM lParam) {
+    ToolbarManager *manager = DockManager(window);
+    if (!manager) return;
+    ToolbarRecord *first = ListAt<ToolbarRecord>(manager->toolbars, 0);
+    if (!first || !first->paneWindow) return; // no toolbar: no menu to own
+    POINT at = {LOWORD(lParam), HIWORD(lParam)};
+    ClientToScreen(window, &at);
+    ShowToolbarMenu(first->paneWindow, at.x, at.y, nullptr);
+}
+
+LRESULT CALLBACK DockWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    switch (message) {
+    case WM_PAINT:
+        PaintDock(window);
+        return 0;
+    case WM_RBUTTONDOWN:
+        OnDockRightDown(window, lParam);
+        return 0;
+    default:
+        return DefWindowProcA(window, message, wParam, lParam);
+    }
+}

@@ -1,0 +1,3 @@
+// Placeholder: the toolbar menu replaces this stand-in.
+#include "input/input.h"
+void ShowToolbarMenu(HWND, int, int, HWND) {}

@@ -1,0 +1,351 @@
+// The demonstration program's resources, read from qbrdemo.exe beside this
+// test, and its status bar window.
+#include <windows.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "harness.h"
+#include "quaybar.h"
+
+// The status bar is a part of the program, not of the library; the test
+// builds it in directly.
+#include "demo/statusbar.cpp"
+
+namespace {
+
+// ---- Resources of qbrdemo.exe ---------------------------------------------
+
+class DemoResources : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        char path[MAX_PATH];
+        GetModuleFileNameA(nullptr, path, MAX_PATH);
+        char *slash = std::strrchr(path, '\\');
+        ASSERT_NE(slash, nullptr);
+        std::strcpy(slash + 1, "qbrdemo.exe");
+        program = LoadLibraryExA(path, nullptr, LOAD_LIBRARY_AS_DATAFILE);
+        ASSERT_NE(program, nullptr) << "cannot open " << path;
+    }
+    void TearDown() override {
+        if (program) FreeLibrary(program);
+    }
+    const BYTE *Resource(const char *name, LPCSTR type, DWORD *size = nullptr) {
+        HRSRC found = FindResourceA(program, name, type);
+        if (!found) return nullptr;
+        if (size) *size = SizeofResource(program, found);
+        return static_cast<const BYTE *>(LockResource(LoadResource(program, found)));
+    }
+    std::string String(UINT id) {
+        char text[256] = "";
+        int length = LoadStringA(program, id, text, sizeof text);
+        return std::string(text, length > 0 ? length : 0);
+    }
+    HMODULE program = nullptr;
+};
+
+struct TextRow {
+    UINT id;
+    const char *description;
+    const char *quickHelp;   // nullptr: no such string
+    const char *buttonText;  // nullptr: no such string
+};
+
+const TextRow kTexts[] = {
+    {101, "Create a new document", "New", "New"},
+    {102, "Open an existing document", "Open", "Open"},
+    {103, "Close the active document", nullptr, nullptr},
+    {104, "Save the active document", "Save", "Save"},
+    {105, "Save the active document with a new name", nullptr, nullptr},
+    {106, "Print the active document", "Print", "Print"},
+    {107, "Cut the selection and put it on the clipboard", "Cut", "Cut"},
+    {108, "Copy the selection and put it on the clipboard", "Copy", "Copy"},
+    {109, "Insert the clipboard contents", "Paste", "Paste"},
+    {110, "Erase the selection", nullptr, nullptr},
+    {151, "Display program information, version number and copyright", "About", "About"},
+    {152, "Exit the application", nullptr, nullptr},
+    {201, "Select the eraser tool", "Eraser", "Erase"},
+    {202, "Select the pen tool", "Pen", "Pen"},
+    {203, "Select the selection tool", "Selection", "Select"},
+    {204, "Select the brush tool", "Brush", "Brush"},
+    {205, "Select the spray tool", "Spray", "Spray"},
+    {206, "Select the paint bucket tool", "Paint", "Paint"},
+    {207, "Select the line tool", "Line", "Line"},
+    {208, "Select the eyedrop tool", "EyeDrop", "EyeDrop"},
+    {209, "Select the magnify tool", "Magnify", "Magnify"},
+    {210, "Select the rectangle tool", "Rect", "Rect"},
+    {211, "Select the round rectangle tool", "Round", "Round"},
+    {212, "Select the oval tool", "Oval", "Oval"},
+    {301, "Makes the selection bold", "Bold", "Bold"},
+    {302, "Makes the selection italic", "Italic", "Italic"},
+    {303, "Makes the selection underlined", "Underline", "Underline"},
+    {304, "Aligns the paragraph at the left indent", "Left", "Left"},
+    {305, "Centers the paragraph between the indents", "Centered", "Center"},
+    {306, "Aligns the paragraph at the right indent", "Right", "Right"},
+    {307, "Aligns the paragraph at both the left and right indent", "Justified", "Justify"},
+    {401, "Align object towards the top", "Align top", "Top"},
+    {402, "Align object towards the right", "Align right", "Right"},
+    {403, "Align object towards the bottom", "Align bottom", "Bottom"},
+    {404, "Align object towards the left", "Align left", "Left"},
+};
+
+TEST_F(DemoResources, EveryCommandHasItsThreeTextsAndCategoriesTheirNames) {
+    for (const TextRow &row : kTexts) {
+        SCOPED_TRACE(row.id);
+        EXPECT_EQ(String(row.id), row.description);
+        EXPECT_EQ(String(row.id + 1000), row.quickHelp ? row.quickHelp : "");
+        EXPECT_EQ(String(row.id + 2000), row.buttonText ? row.buttonText : "");
+    }
+    const char *categories[] = {"File", "Edit", "Palette", "Style", "Align", "Misc"};
+    for (UINT i = 0; i < 6; ++i) EXPECT_EQ(String(3001 + i), categories[i]);
+    // The library's own strings live in the same table of the program.
+    EXPECT_EQ(String(5101), "Insert Item...");
+}
+
+// One menu flattened to "popup|id text|---|..." so a difference reads at once.
+std::string DescribeMenu(HMENU menu) {
+    std::string out;
+    for (int i = 0; i < GetMenuItemCount(menu); ++i) {
+        char text[128] = "";
+        GetMenuStringA(menu, i, text, sizeof text, MF_BYPOSITION);
+        if (HMENU popup = GetSubMenu(menu, i)) {
+            out += std::string("[") + text + ": " + DescribeMenu(popup) + "]";
+            continue;
+        }
+        UINT id = GetMenuItemID(menu, i);
+        if (GetMenuState(menu, i, MF_BYPOSITION) & MF_SEPARATOR)
+            out += "---;";
+        else
+            out += std::to_string(id) + " " + text + ";";
+    }
+    return out;
+}
+
+const char kFileMenu[] =
+    "[&File: 101 &New\tCtrl+N;102 &Open...\tCtrl+O;103 &Close;104 &Save\tCtrl+S;105 Save &As...;---;"
+    "106 &Print...\tCtrl+P;---;152 E&xit\tAlt+F4;]";
+const char kEditMenu[] = "[&Edit: 107 Cu&t\tCtrl+X;108 &Copy\tCtrl+C;109 &Paste\tCtrl+V;110 Delete\tDel;]";
+const char kStyleMenu[] = "[&Style: 304 &Left;305 &Centered;306 &Right;307 &Justified;]";
+const char kHelpMenu[] = "[&Help: 153 Contents;---;151 &About QBR...;]";
+
+TEST_F(DemoResources, MenusListTheirCommandsInOrder) {
+    struct {
+        const char *name;
+        std::string expected;
+    } const menus[] = {
+        {"Main", std::string(kFileMenu) + kEditMenu +
+                     "[&View: 122 &Open Another Window;---;120 &Quick Help;121 &Button Text;]" + kStyleMenu +
+                     "[&Palette: 201 &Eraser;202 &Pen;203 &Selection;204 &Brush;205 Spra&y;206 P&aint;207 &Line;"
+                     "208 E&yedrop;209 &Magnify;210 &Rectangle;211 Ro&und Rectangle;212 &Oval;]" +
+                     kHelpMenu},
+        {"View", std::string(kFileMenu) + kEditMenu + "[&View: 120 &Quick Help;121 &Button Text;]" + kStyleMenu +
+                     kHelpMenu},
+    };
+    for (const auto &m : menus) {
+        SCOPED_TRACE(m.name);
+        HMENU menu = LoadMenuA(program, m.name);
+        ASSERT_NE(menu, nullptr);
+        EXPECT_EQ(DescribeMenu(menu), m.expected);
+        DestroyMenu(menu);
+    }
+}
+
+// The strip's pixel at (x, y) as a palette index; rows are stored bottom-up.
+int PixelIndex(const BITMAPINFOHEADER *info, int x, int y) {
+    const BYTE *bits = reinterpret_cast<const BYTE *>(info) + info->biSize + 16 * sizeof(RGBQUAD);
+    const int stride = ((info->biWidth * 4 + 31) / 32) * 4;
+    const BYTE byte = bits[(info->biHeight - 1 - y) * stride + x / 2];
+    return x % 2 ? byte & 15 : byte >> 4;
+}
+
+COLORREF PixelColour(const BITMAPINFOHEADER *info, int x, int y) {
+    const RGBQUAD *palette = reinterpret_cast<const RGBQUAD *>(reinterpret_cast<const BYTE *>(info) + info->biSize);
+    const RGBQUAD &q = palette[PixelIndex(info, x, y)];
+    return RGB(q.rgbRed, q.rgbGreen, q.rgbBlue);
+}
+
+TEST_F(DemoResources, StripsHaveTheirShapeAndTheViewStripReusesTheMainImages) {
+    struct {
+        const char *name;
+        LONG width, height;
+    } const strips[] = {{"Main", 368, 30}, {"View", 240, 15}};
+    for (const auto &s : strips) {
+        SCOPED_TRACE(s.name);
+        auto info = reinterpret_cast<const BITMAPINFOHEADER *>(Resource(s.name, RT_BITMAP));
+        ASSERT_NE(info, nullptr);
+        EXPECT_EQ(info->biWidth, s.width);
+        EXPECT_EQ(info->biHeight, s.height);
+        EXPECT_EQ(info->biBitCount, 4);
+        EXPECT_EQ(info->biCompression, static_cast<DWORD>(BI_RGB));
+        // The top-left pixel of every image is background, and it must be the
+        // exact face colour that loading maps to the system's.
+        EXPECT_EQ(PixelColour(info, 0, 0), RGB(0xC0, 0xC0, 0xC0));
+    }
+    auto main = reinterpret_cast<const BITMAPINFOHEADER *>(Resource("Main", RT_BITMAP));
+    auto view = reinterpret_cast<const BITMAPINFOHEADER *>(Resource("View", RT_BITMAP));
+    ASSERT_TRUE(main && view);
+    // View index -> Main index: 101..151 are the first eight of both
+    // catalogs, 301..307 stand at 20..26 in Main and 8..14 in View.
+    for (int v = 0; v < 15; ++v) {
+        const int m = v < 8 ? v : v + 12;
+        const int mx = (m % 23) * 16, my = (m / 23) * 15;
+        int differing = 0, inked = 0;
+        for (int y = 0; y < 15; ++y)
+            for (int x = 0; x < 16; ++x) {
+                differing += PixelColour(view, v * 16 + x, y) != PixelColour(main, mx + x, my + y);
+                inked += PixelColour(main, mx + x, my + y) != RGB(0xC0, 0xC0, 0xC0);
+            }
+        EXPECT_EQ(differing, 0) << "view image " << v;
+        EXPECT_GT(inked, 10) << "main image " << m << " is empty";
+    }
+    // The four cells behind the last image stay plain face.
+    for (int m = 31; m < 46; ++m)
+        for (int y = 0; y < 15; ++y)
+            for (int x = 0; x < 16; ++x)
+                ASSERT_EQ(PixelColour(main, (m % 23) * 16 + x, (m / 23) * 15 + y), RGB(0xC0, 0xC0, 0xC0)) << m;
+}
+
+TEST_F(DemoResources, IconAndAboutBoxArePresent) {
+    EXPECT_NE(Resource("AppIcon", RT_GROUP_ICON), nullptr);
+
+    auto dialog = reinterpret_cast<const DLGTEMPLATE *>(Resource("About", RT_DIALOG));
+    ASSERT_NE(dialog, nullptr);
+    EXPECT_EQ(dialog->style,
+              static_cast<DWORD>(WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT));
+    EXPECT_EQ(dialog->cdit, 11);
+    EXPECT_EQ(dialog->cx, 209);
+    EXPECT_EQ(dialog->cy, 120);
+
+    // Build it on this program's instance, hidden: the icon control finds no
+    // "APPICON" here, which does not keep the other controls from being made.
+    DLGTEMPLATE *copy = nullptr;
+    DWORD size = 0;
+    const BYTE *bytes = Resource("About", RT_DIALOG, &size);
+    std::vector<BYTE> hidden(bytes, bytes + size);
+    copy = reinterpret_cast<DLGTEMPLATE *>(hidden.data());
+    copy->style &= ~WS_VISIBLE;
+    HWND box = CreateDialogIndirectParamA(GetModuleHandleA(nullptr), copy, nullptr,
+                                          [](HWND, UINT, WPARAM, LPARAM) -> INT_PTR { return FALSE; }, 0);
+    ASSERT_NE(box, nullptr);
+    char text[128] = "";
+    GetWindowTextA(box, text, sizeof text);
+    EXPECT_STREQ(text, "About QBR");
+    struct {
+        int id;
+        const char *contains;
+    } const controls[] = {{IDOK, "OK"}, {8001, "QBR.HLP"}, {8002, ""}, {8003, ""}, {8004, "&Help"}};
+    for (const auto &c : controls) {
+        SCOPED_TRACE(c.id);
+        HWND control = GetDlgItem(box, c.id);
+        ASSERT_NE(control, nullptr);
+        GetWindowTextA(control, text, sizeof text);
+        EXPECT_NE(std::string(text).find(c.contains), std::string::npos) << text;
+        EXPECT_GT(std::strlen(text), 0u);
+    }
+    DestroyWindow(box);
+}
+
+// ---- Status bar --------------------------------------------------------------
+
+class StatusBarTest : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        if (!moduleInstance) moduleInstance = GetModuleHandleA(nullptr);
+        ASSERT_EQ(RegisterStatusBarClass(), 1u);
+        frame = CreateRecordingFrame();
+        ShowWindow(frame, SW_SHOWNORMAL);
+        bar = CreateStatusBar(frame);
+        ASSERT_NE(bar, nullptr);
+        Pump();
+    }
+    void TearDown() override {
+        DestroyWindow(frame);
+        DeleteStatusBarFont();
+        Pump();
+    }
+    std::string Text() const {
+        const char *buffer = reinterpret_cast<const char *>(GetWindowLongPtrA(bar, 0));
+        return buffer ? buffer : "<no buffer>";
+    }
+    HWND frame = nullptr;
+    HWND bar = nullptr;
+};
+
+TEST_F(StatusBarTest, TextFollowsTheCommandIdAndZeroGivesTheWelcome) {
+    EXPECT_EQ(Text(), "Welcome to the Quaybar Demo!");
+    struct {
+        UINT id;
+        const char *expected;
+    } const cases[] = {
+        {204, "Display help text for identifier #204."},
+        {0, "Welcome to the Quaybar Demo!"},
+        {65535, "Display help text for identifier #65535."},
+        {0, "Welcome to the Quaybar Demo!"},
+    };
+    for (const auto &c : cases) {
+        SetStatusText(bar, c.id);
+        EXPECT_EQ(Text(), c.expected) << c.id;
+    }
+}
+
+TEST_F(StatusBarTest, HeightFollowsTheFontAndStaysWhenTheFrameResizes) {
+    HDC screen = GetDC(nullptr);
+    LOGFONTA font = {};
+    font.lfHeight = -MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72);
+    font.lfWeight = FW_NORMAL;
+    font.lfPitchAndFamily = VARIABLE_PITCH | FF_SWISS;
+    std::strcpy(font.lfFaceName, "MS Sans Serif");
+    HFONT made = CreateFontIndirectA(&font);
+    HGDIOBJ old = SelectObject(screen, made);
+    TEXTMETRICA metrics = {};
+    GetTextMetricsA(screen, &metrics);
+    SelectObject(screen, old);
+    DeleteObject(made);
+    ReleaseDC(nullptr, screen);
+
+    const int expected = metrics.tmHeight - metrics.tmInternalLeading + 12;
+    RECT r = WindowRectInParent(bar);
+    EXPECT_EQ(r.bottom - r.top, expected);
+    EXPECT_EQ(GetParent(bar), frame);
+    SetWindowPos(frame, nullptr, 0, 0, 300, 200, SWP_NOMOVE | SWP_NOZORDER);
+    Pump();
+    r = WindowRectInParent(bar);
+    EXPECT_EQ(r.bottom - r.top, expected);
+}
+
+TEST_F(StatusBarTest, PaintsASunkenPanelInFixedColoursWithTheTextInside) {
+    const int w = 200;
+    SetWindowPos(bar, nullptr, 0, 0, w, 25, SWP_NOZORDER);
+    Pump();
+    const int h = 25;
+    Pixels welcome = ReadWindowPixels(bar);
+    ASSERT_EQ(welcome.width, w);
+    ASSERT_EQ(welcome.height, h);
+    const COLORREF grey = RGB(0xC0, 0xC0, 0xC0), dark = RGB(0x80, 0x80, 0x80), white = RGB(0xFF, 0xFF, 0xFF);
+    struct {
+        int x, y;
+        COLORREF colour;
+        const char *what;
+    } const points[] = {
+        {2, 2, grey, "background"},       {w - 2, h - 3, grey, "background right of the panel"},
+        {50, 0, white, "top line"},       {50, h - 1, dark, "bottom line"},
+        {6, 10, dark, "panel left edge"}, {50, 3, dark, "panel top edge"},
+        {w - 5, 10, white, "panel right"}, {50, h - 3, white, "panel bottom edge"},
+        {w - 6, 10, grey, "panel inside"},
+    };
+    for (const auto &p : points)
+        EXPECT_EQ(welcome.At(p.x, p.y), p.colour) << p.what << " at " << p.x << "," << p.y;
+
+    // The text is drawn inside the panel: some pixels there are neither grey
+    // nor edge colours, and they change with the text.
+    int inked = 0;
+    for (int y = 5; y < h - 3; ++y)
+        for (int x = 10; x < w - 6; ++x) inked += welcome.At(x, y) != grey;
+    EXPECT_GT(inked, 20);
+    SetStatusText(bar, 204);
+    Pixels help = ReadWindowPixels(bar);
+    EXPECT_NE(help.colors, welcome.colors);
+}
+
+}  // namespace

@@ -1,0 +1,415 @@
+// Dock areas: placing empty docks, the side rules, hit testing of dock windows,
+// the WM_SIZE notices to the frame, packing of real panes and drop indexes.
+#include <vector>
+
+#include "core/core.h"
+#include "dock/dock.h"
+#include "harness.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+struct ButtonSize {
+    int width = 0, height = 0;
+};
+ButtonSize CurrentButton() {
+    ButtonSize b;
+    GetButtonSizes(&b.width, &b.height, nullptr, nullptr);
+    return b;
+}
+
+const std::vector<Heard> kOneSize = {{WM_SIZE, 0, 0}};
+
+class DockTest : public FrameTest {};
+
+// ---- Empty docks -----------------------------------------------------------------
+
+TEST_F(DockTest, NewTopDockIsHiddenPlaceholderAndTellsTheFrameOnce) {
+    HWND dock = MakeDock(DOCK_TOP);
+    ASSERT_NE(nullptr, dock);
+    Pump();
+    const ButtonSize b = CurrentButton();
+    EXPECT_FALSE(IsWindowVisible(dock));
+    EXPECT_EQ(frame, GetParent(dock));
+    EXPECT_EQ(Rect(0, 0, GetSystemMetrics(SM_CXFULLSCREEN), b.height), WindowRectInParent(dock));
+    EXPECT_EQ(kOneSize, FrameLog()) << Describe(FrameLog());
+    // The window word leads back to the record.
+    DockArea *record = FindDockRecord(dock);
+    ASSERT_NE(nullptr, record);
+    EXPECT_EQ(dock, record->window);
+    UINT side = 99;
+    EXPECT_EQ(1u, GetDockSide(dock, &side));
+    EXPECT_EQ(static_cast<UINT>(DOCK_TOP), side);
+    EXPECT_EQ(0u, GetDockSide(frame, &side));
+    EXPECT_EQ(nullptr, FindDockRecord(frame));
+}
+
+TEST_F(DockTest, GetDockFindsTheOldestDockOfASide) {
+    EXPECT_EQ(nullptr, QBR_GetDock(nullptr, DOCK_TOP));
+    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
+    HWND left = MakeDock(DOCK_LEFT);
+    HWND top = MakeDock(DOCK_TOP);
+    HWND secondLeft = MakeDock(DOCK_LEFT);
+    ASSERT_NE(nullptr, secondLeft);
+    struct Case {
+        ToolbarManager *manager;
+        UINT side;
+        HWND expected;
+    } const cases[] = {
+        {nullptr, DOCK_LEFT, nullptr}, {manager, DOCK_TOP, top},   {manager, DOCK_LEFT, left},
+        {manager, DOCK_RIGHT, nullptr}, {manager, 7, nullptr},
+    };
+    for (const Case &c : cases) EXPECT_EQ(c.expected, QBR_GetDock(c.manager, c.side)) << "side " << c.side;
+    EXPECT_EQ(nullptr, QBR_CreateDock(nullptr, frame, DOCK_TOP));
+}
+
+TEST_F(DockTest, SideDocksStartBelowTheTopDockAndRunToFullScreenHeight) {
+    const ButtonSize b = CurrentButton();
+    const int cyFull = GetSystemMetrics(SM_CYFULLSCREEN);
+    const int clientRight = ClientRectOf(frame).right;
+    // Without a top dock the side docks start at the top.
+    HWND lonelyLeft = MakeDock(DOCK_LEFT);
+    EXPECT_EQ(Rect(0, 0, b.width, cyFull), WindowRectInParent(lonelyLeft));
+    QBR_DestroyDock(lonelyLeft);
+    // An empty, hidden top dock still pushes them down by its placeholder.
+    MakeDock(DOCK_TOP);
+    HWND left = MakeDock(DOCK_LEFT);
+    HWND right = MakeDock(DOCK_RIGHT);
+    Pump();
+    EXPECT_EQ(Rect(0, b.height, b.width, cyFull), WindowRectInParent(left));
+    EXPECT_EQ(Rect(clientRight - b.width, b.height, clientRight, cyFull), WindowRectInParent(right));
+    EXPECT_FALSE(IsWindowVisible(left));
+    EXPECT_FALSE(IsWindowVisible(right));
+    // The frame's width reaches the right dock at its next relayout only.
+    RECT fr;
+    GetWindowRect(frame, &fr);
+    SetWindowPos(frame, nullptr, 0, 0, fr.right - fr.left - 100, fr.bottom - fr.top, SWP_NOMOVE | SWP_NOZORDER);
+    Pump();
+    EXPECT_EQ(clientRight - b.width, WindowRectInParent(right).left);
+    EXPECT_EQ(1u, RelayoutDock(right));
+    EXPECT_EQ(clientRight - 100 - b.width, WindowRectInParent(right).left);
+}
+
+TEST_F(DockTest, DockWindowFromPointCountsRightAndBottomEdgesAndHiddenDocks) {
+    HWND top = MakeDock(DOCK_TOP);
+    HWND left = MakeDock(DOCK_LEFT);
+    Pump();
+    RECT t, l;
+    GetWindowRect(top, &t);
+    GetWindowRect(left, &l);
+    ASSERT_FALSE(IsWindowVisible(top));
+    struct Case {
+        int x, y;
+        HWND expected;
+    } const cases[] = {
+        {t.left, t.top, top},          {t.right, t.top, top},       {t.left + 5, t.bottom, top},
+        {t.left + 5, t.top - 1, nullptr}, {l.left + 1, l.top, top}, // the shared line goes to the first dock
+        {l.left + 1, l.top + 1, left}, {l.right, l.top + 10, left}, {l.right + 1, l.top + 10, nullptr},
+    };
+    for (const Case &c : cases)
+        EXPECT_EQ(c.expected, DockWindowFromPoint(manager, c.x, c.y)) << c.x << "," << c.y;
+    EXPECT_EQ(nullptr, DockWindowFromPoint(nullptr, t.left, t.top));
+}
+
+TEST_F(DockTest, RelayoutOfAHiddenUnchangedDockTellsTheFrameEveryTime) {
+    HWND dock = MakeDock(DOCK_TOP);
+    Pump();
+    const RECT before = WindowRectInParent(dock);
+    ClearFrameLog();
+    for (int i = 0; i < 3; ++i) EXPECT_EQ(1u, RelayoutDock(dock));
+    Pump();
+    EXPECT_EQ(3, CountHeard(WM_SIZE)) << Describe(FrameLog());
+    EXPECT_EQ(before, WindowRectInParent(dock));
+    // A null window is fine; a window without a record is not.
+    ClearFrameLog();
+    EXPECT_EQ(1u, RelayoutDock(nullptr));
+    EXPECT_EQ(0u, RelayoutDock(frame));
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE));
+}
+
+TEST_F(DockTest, DocksLeaveNoMemoryBehind) {
+    const LONG before = LiveMemoryBlocks();
+    HWND top = MakeDock(DOCK_TOP);
+    HWND left = MakeDock(DOCK_LEFT);
+    ASSERT_NE(nullptr, left);
+    EXPECT_LT(before, LiveMemoryBlocks());
+    QBR_DestroyDock(top);
+    QBR_DestroyDock(left);
+    QBR_DestroyDock(nullptr);
+    EXPECT_FALSE(IsWindow(top));
+    EXPECT_EQ(0u, PointerListCount(manager->docks));
+    EXPECT_EQ(before, LiveMemoryBlocks());
+    // Records the manager frees itself at its end go as well.
+    ASSERT_EQ(1u, AddDockRecord(manager, frame, DOCK_RIGHT));
+    FreeDockRecord(ListAt<DockArea>(manager->docks, 0));
+    FreeDockRecord(nullptr);
+    EXPECT_EQ(0u, PointerListCount(manager->docks));
+    EXPECT_EQ(before, LiveMemoryBlocks());
+}
+
+// ---- Docks with real toolbars -------------------------------------------------------
+
+class DockPackTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(1, 60);
+        dock = MakeDock(DOCK_TOP);
+        record = FindDockRecord(dock);
+        ASSERT_NE(nullptr, record);
+    }
+    // A docked visible toolbar of `count` buttons starting at `first`.
+    HWND Toolbar(UINT first, UINT count, UINT flags = TBF_VISIBLE | TBF_DOCKED) {
+        std::vector<UINT> ids;
+        for (UINT i = 0; i < count; ++i) ids.push_back(first + i);
+        HWND pane = QBR_CreateToolbar("T", flags, 100, 100, 0, 0, dock, ids.data(), count);
+        EXPECT_NE(nullptr, pane);
+        Pump();
+        return pane;
+    }
+    static int W(const RECT &r) { return r.right - r.left; }
+    static int H(const RECT &r) { return r.bottom - r.top; }
+    HWND dock = nullptr;
+    DockArea *record = nullptr;
+};
+
+// The three toolbars of a row-and-wrap case: two that fit one row side by
+// side and a third that does not fit after them. Their sizes come from their
+// buttons, so the expectations follow the measured panes.
+TEST_F(DockPackTest, PacksRowsWithSharedBordersAndWraps) {
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    HWND t1 = Toolbar(1, 30);
+    HWND t2 = Toolbar(31, 12);
+    HWND t3 = Toolbar(43, 8);
+    const RECT r1 = WindowRectInParent(t1), r2 = WindowRectInParent(t2), r3 = WindowRectInParent(t3);
+    const int w1 = W(r1), w2 = W(r2), w3 = W(r3), h = H(r1);
+    ASSERT_EQ(h, H(r2));
+    ASSERT_EQ(h, H(r3));
+    // Whether T3 wraps follows from the row test; this set of panes must take
+    // both branches once to be of use.
+    const int rowRight = w1 - 1 + w2 - 1;
+    ASSERT_LE(w1 + w2, limit) << "T2 should join T1";
+    if (w3 + rowRight <= limit) GTEST_SKIP() << "panes too narrow to wrap: " << w1 << " " << w2 << " " << w3;
+
+    EXPECT_EQ(Rect(-1, -1, w1 - 1, h - 1), r1);
+    EXPECT_EQ(Rect(w1 - 2, -1, w1 - 2 + w2, h - 1), r2);
+    // The next row starts on the last line of the first.
+    EXPECT_EQ(Rect(-1, h - 2, w3 - 1, 2 * h - 2), r3);
+    EXPECT_TRUE(IsWindowVisible(dock));
+    EXPECT_EQ(Rect(0, 0, limit, 2 * h - 2), WindowRectInParent(dock));
+
+    // The frame hears of a change of the dock once, and of a repeat not at all.
+    ToolbarRecord *third = ListAt<ToolbarRecord>(record->toolbars, 2);
+    ClearFrameLog();
+    third->flags = (third->flags & ~TBF_DOCKED) | TBF_FLOATING;
+    EXPECT_EQ(1u, RelayoutDock(dock));
+    EXPECT_EQ(1u, RelayoutDock(dock));
+    Pump();
+    EXPECT_EQ(kOneSize, FrameLog()) << Describe(FrameLog());
+    EXPECT_EQ(Rect(0, 0, limit, h - 1), WindowRectInParent(dock));
+    ClearFrameLog();
+    third->flags = (third->flags & ~TBF_FLOATING) | TBF_DOCKED;
+    EXPECT_EQ(1u, RelayoutDock(dock));
+    Pump();
+    EXPECT_EQ(kOneSize, FrameLog()) << Describe(FrameLog());
+    EXPECT_EQ(r3, WindowRectInParent(t3));
+}
+
+TEST_F(DockPackTest, APaneWiderThanTheLimitStartsANewRowOneLineLower) {
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    HWND wide = Toolbar(1, 60);
+    const RECT r = WindowRectInParent(wide);
+    if (W(r) <= limit) GTEST_SKIP() << "pane not wider than the limit: " << W(r);
+    EXPECT_EQ(-1, r.left);
+    EXPECT_EQ(0, r.top);
+    EXPECT_EQ(H(r), H(WindowRectInParent(dock)));
+}
+
+// The worked example with panes forced to 300x28, 200x28 and 150x28, packed
+// directly (sizing a toolbar window by program runs no refit). Then the third
+// pane's width is set so that width + row.right is just at and just over the
+// limit: at the limit it still joins the row, one pixel of the limit free.
+TEST_F(DockPackTest, WorkedExampleAndTheLimitBoundary) {
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    HWND t[3] = {Toolbar(1, 3), Toolbar(4, 3), Toolbar(7, 3)};
+    auto force = [&](int i, int width) {
+        SetWindowPos(t[i], nullptr, 0, 0, width, 28, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    };
+    struct Case {
+        int w3;
+        RECT p1, p2, p3, dock;
+    } const cases[] = {
+        {limit - 498 + 1, {-1, -1, 299, 27}, {298, -1, 498, 27}, {-1, 26, limit - 498, 54}, {0, 0, limit, 54}},
+        {limit - 498, {-1, -1, 299, 27}, {298, -1, 498, 27}, {497, -1, limit - 1, 27}, {0, 0, limit, 27}},
+        {150, {-1, -1, 299, 27}, {298, -1, 498, 27}, {497, -1, 647, 27}, {0, 0, limit, 27}},
+    };
+    for (const Case &c : cases) {
+        force(0, 300);
+        force(1, 200);
+        force(2, c.w3);
+        ASSERT_EQ(1u, PackDock(record));
+        Pump();
+        EXPECT_EQ(c.p1, WindowRectInParent(t[0])) << "w3 " << c.w3;
+        EXPECT_EQ(c.p2, WindowRectInParent(t[1])) << "w3 " << c.w3;
+        EXPECT_EQ(c.p3, WindowRectInParent(t[2])) << "w3 " << c.w3;
+        EXPECT_EQ(c.dock, WindowRectInParent(dock)) << "w3 " << c.w3;
+    }
+    // A shorter pane after a taller one pulls the next row up one more line.
+    SetWindowPos(t[0], nullptr, 0, 0, 300, 40, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    force(1, 200);
+    force(2, limit);
+    ASSERT_EQ(1u, PackDock(record));
+    EXPECT_EQ(Rect(-1, 37, limit - 1, 65), WindowRectInParent(t[2]));
+}
+
+TEST_F(DockPackTest, FloatingAndHiddenToolbarsAreSkippedAndAllFloatingHidesTheDock) {
+    HWND t1 = Toolbar(1, 6);
+    HWND t2 = Toolbar(7, 6);
+    HWND t3 = Toolbar(13, 6);
+    const int w1 = W(WindowRectInParent(t1));
+    // T2 floats: T3 moves up against T1.
+    ToolbarRecord *r2 = ListAt<ToolbarRecord>(record->toolbars, 1);
+    ASSERT_EQ(t2, r2->paneWindow);
+    r2->flags = (r2->flags & ~TBF_DOCKED) | TBF_FLOATING;
+    ASSERT_EQ(1u, RelayoutDock(dock));
+    EXPECT_EQ(w1 - 2, WindowRectInParent(t3).left);
+    // T1 hidden as well: T3 is first.
+    ToolbarRecord *r1 = ListAt<ToolbarRecord>(record->toolbars, 0);
+    r1->flags &= ~TBF_VISIBLE;
+    ASSERT_EQ(1u, RelayoutDock(dock));
+    EXPECT_EQ(-1, WindowRectInParent(t3).left);
+    EXPECT_TRUE(IsWindowVisible(dock));
+    // All of them out: hidden, with the placeholder, and the order kept.
+    ToolbarRecord *r3 = ListAt<ToolbarRecord>(record->toolbars, 2);
+    r3->flags = (r3->flags & ~TBF_DOCKED) | TBF_FLOATING;
+    ClearFrameLog();
+    ASSERT_EQ(1u, RelayoutDock(dock));
+    Pump();
+    EXPECT_FALSE(IsWindowVisible(dock));
+    EXPECT_EQ(Rect(0, 0, GetSystemMetrics(SM_CXFULLSCREEN), CurrentButton().height), WindowRectInParent(dock));
+    EXPECT_EQ(kOneSize, FrameLog()) << Describe(FrameLog());
+    ASSERT_EQ(3u, PointerListCount(record->toolbars));
+    EXPECT_EQ(r1, ListAt<ToolbarRecord>(record->toolbars, 0));
+    EXPECT_EQ(r2, ListAt<ToolbarRecord>(record->toolbars, 1));
+    EXPECT_EQ(r3, ListAt<ToolbarRecord>(record->toolbars, 2));
+}
+
+TEST_F(DockPackTest, WmSizeOnlyWhenAVisibleDockChanged) {
+    HWND t1 = Toolbar(1, 6);
+    ASSERT_TRUE(IsWindowVisible(dock));
+    ClearFrameLog();
+    EXPECT_EQ(1u, RelayoutDock(dock));
+    EXPECT_EQ(1u, PackDock(record));
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE)) << Describe(FrameLog());
+    // A second toolbar beside the first keeps the height but still counts as
+    // no change of the dock's rectangle: the top dock is full-screen wide.
+    HWND t2 = Toolbar(7, 6);
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE)) << Describe(FrameLog());
+    // Removing the first toolbar moves nothing of the dock either.
+    ToolbarRecord *r1 = ListAt<ToolbarRecord>(record->toolbars, 0);
+    ASSERT_EQ(1u, RemoveToolbarFromDock(record, r1));
+    EXPECT_EQ(-1, WindowRectInParent(t2).left);
+    EXPECT_EQ(0, CountHeard(WM_SIZE));
+    // Put back in front: again nothing for the frame; the order is restored.
+    ASSERT_EQ(1u, InsertToolbarAt(record, 0, r1));
+    EXPECT_EQ(-1, WindowRectInParent(t1).left);
+    EXPECT_EQ(0u, RemoveToolbarFromDock(record, nullptr));
+    UINT index = 9;
+    EXPECT_EQ(1u, ToolbarIndexInDock(record, r1, &index));
+    EXPECT_EQ(0u, index);
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE)) << Describe(FrameLog());
+}
+
+TEST_F(DockPackTest, DockInsertionIndexForPointsAroundThePanes) {
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    HWND t1 = Toolbar(1, 30);
+    HWND t2 = Toolbar(31, 12);
+    HWND t3 = Toolbar(43, 8);
+    const RECT r1 = WindowRectInParent(t1), r2 = WindowRectInParent(t2), r3 = WindowRectInParent(t3);
+    const bool wrapped = r3.top > r1.top;
+    struct Case {
+        const char *what;
+        int x, y;
+        UINT expected;
+    } const cases[] = {
+        {"inside T1", r1.left + 5, r1.top + 5, 0},
+        {"on T2's left border (shared with T1)", r2.left, r2.top + 5, 0},
+        {"inside T2", r2.left + 5, r2.top + 5, 1},
+        {"inside T3", r3.left + 5, r3.top + 5, 2},
+        {"right of the last pane of the first row", limit - 2, r1.top + 5, wrapped ? 2u : 3u},
+        {"below everything", 5, r3.bottom + 20, 3},
+        {"above all panes", 5, -5, 0},
+    };
+    for (const Case &c : cases) {
+        UINT index = 99;
+        EXPECT_EQ(1u, DockInsertionIndex(record, c.x, c.y, &index)) << c.what;
+        EXPECT_EQ(c.expected, index) << c.what;
+    }
+    // A floating toolbar keeps its place in the count.
+    ListAt<ToolbarRecord>(record->toolbars, 2)->flags |= TBF_FLOATING;
+    UINT index = 99;
+    EXPECT_EQ(1u, DockInsertionIndex(record, 5, r3.bottom + 20, &index));
+    EXPECT_EQ(3u, index);
+    ListAt<ToolbarRecord>(record->toolbars, 2)->flags &= ~TBF_FLOATING;
+}
+
+TEST_F(DockPackTest, SideDockInsertionGoesByColumns) {
+    HWND side = MakeDock(DOCK_LEFT);
+    DockArea *sideRecord = FindDockRecord(side);
+    ASSERT_NE(nullptr, sideRecord);
+    UINT index = 99;
+    EXPECT_EQ(1u, DockInsertionIndex(sideRecord, 3, 3, &index));
+    EXPECT_EQ(0u, index);
+    std::vector<UINT> ids = {1, 2, 3};
+    HWND a = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 100, 100, 0, 0, side, ids.data(), 3);
+    HWND b = QBR_CreateToolbar("B", TBF_VISIBLE | TBF_DOCKED, 100, 100, 0, 0, side, ids.data(), 3);
+    ASSERT_NE(nullptr, b);
+    Pump();
+    const RECT ra = WindowRectInParent(a), rb = WindowRectInParent(b);
+    ASSERT_GT(rb.left, ra.left);
+    EXPECT_TRUE(IsWindowVisible(side));
+    // Below the empty top dock's placeholder, as wide as the columns.
+    EXPECT_EQ(Rect(0, CurrentButton().height, rb.right, GetSystemMetrics(SM_CYFULLSCREEN)), WindowRectInParent(side));
+    // In the side docks only x orders: below the first column is left of the
+    // second, so in front of it; right of all columns is the end.
+    EXPECT_EQ(1u, DockInsertionIndex(sideRecord, ra.left + 3, ra.bottom + 50, &index));
+    EXPECT_EQ(1u, index);
+    EXPECT_EQ(1u, DockInsertionIndex(sideRecord, rb.right + 5, rb.top + 3, &index));
+    EXPECT_EQ(2u, index);
+}
+
+TEST_F(DockPackTest, SurfaceIsButtonFaceClosedByAWindowFrameLine) {
+    HWND t1 = Toolbar(1, 5);
+    Pump();
+    const RECT pane = WindowRectInParent(t1);
+    const RECT client = ClientRectOf(dock);
+    const int x = pane.right + 10;
+    ASSERT_LT(x, ClientRectOf(frame).right);
+    const LONG gdiBefore = LiveGdiObjects();
+    const Pixels px = ReadWindowPixels(dock);
+    EXPECT_EQ(gdiBefore, LiveGdiObjects());
+    ASSERT_GT(px.height, 2);
+    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(x, client.bottom - 1));
+    EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(x, client.bottom - 2));
+    EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(x, 1));
+}
+
+TEST_F(DockPackTest, ADockThatHoldsToolbarsIsNotDestroyed) {
+    HWND t1 = Toolbar(1, 5);
+    QBR_DestroyDock(dock);
+    EXPECT_TRUE(IsWindow(dock));
+    EXPECT_TRUE(IsWindow(t1));
+    EXPECT_EQ(record, FindDockRecord(dock));
+    QBR_DestroyToolbar(t1);
+    Pump();
+    QBR_DestroyDock(dock);
+    EXPECT_FALSE(IsWindow(dock));
+    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
+}
+
+} // namespace
