@@ -70,13 +70,12 @@ void UnregisterClient(ToolbarClient *client) {
 }
 
 UINT AdoptModuleInstance(HWND frame) {
-    if (!moduleInstance)
-        moduleInstance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
+    if (!moduleInstance) moduleInstance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
     return 1;
 }
 
-UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int *imageHeight,
-                      int *textButtonWidth, int *textButtonHeight) {
+UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int *imageHeight, int *textButtonWidth,
+                      int *textButtonHeight) {
     ToolbarClient *client = CurrentClient();
     if (!client) return 0;
     if (buttonWidth) *buttonWidth = client->buttonWidth;
@@ -137,9 +136,10 @@ extern "C" void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imag
     ToolbarClient *client = CurrentClient();
     if (!client) return;
     const int given[6] = {buttonWidth, buttonHeight, imageWidth, imageHeight, textButtonWidth, textButtonHeight};
-    int *fields[6] = {&client->buttonWidth,  &client->buttonHeight,    &client->imageWidth,
-                      &client->imageHeight,  &client->textButtonWidth, &client->textButtonHeight};
-    for (int i = 0; i < 6; ++i) *fields[i] = given[i] ? given[i] : kDefaultMetrics[i];
+    int *fields[6] = {&client->buttonWidth, &client->buttonHeight,    &client->imageWidth,
+                      &client->imageHeight, &client->textButtonWidth, &client->textButtonHeight};
+    for (int i = 0; i < 6; ++i)
+        *fields[i] = given[i] ? given[i] : kDefaultMetrics[i];
 }
 
 extern "C" void QBR_SetQuickHelp(UINT on) {

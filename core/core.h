@@ -42,9 +42,7 @@ void PointerListCompact(PointerList *list);
 template <typename T> inline T *ListAt(const PointerList *list, UINT index) {
     return reinterpret_cast<T *>(PointerListGet(list, index));
 }
-template <typename T> inline ULONG_PTR ListValue(T *record) {
-    return reinterpret_cast<ULONG_PTR>(record);
-}
+template <typename T> inline ULONG_PTR ListValue(T *record) { return reinterpret_cast<ULONG_PTR>(record); }
 
 // ---- Strings and comma tokens --------------------------------------------
 UINT StringCopy(LPSTR dest, LPCSTR src);
@@ -65,8 +63,8 @@ ToolbarClient *CurrentClient();
 ToolbarClient *RegisterClient(HINSTANCE instance, HelpTextProc helpTextProc);
 void UnregisterClient(ToolbarClient *client);
 UINT AdoptModuleInstance(HWND frame);
-UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int *imageHeight,
-                      int *textButtonWidth, int *textButtonHeight);
+UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int *imageHeight, int *textButtonWidth,
+                      int *textButtonHeight);
 UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight);
 
 // ---- Manager and catalog --------------------------------------------------

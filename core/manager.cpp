@@ -44,13 +44,16 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     // toolbar lookup cache, not the quick-help tip.
     ForgetManager(manager);
     QuickHelpForgetManager(manager);
-    while (ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, 0)) DestroyToolbarRecord(record);
+    while (ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, 0))
+        DestroyToolbarRecord(record);
     PointerListDestroy(manager->toolbars);
     manager->toolbars = nullptr;
-    while (DockArea *dock = ListAt<DockArea>(manager->docks, 0)) FreeDockRecord(dock);
+    while (DockArea *dock = ListAt<DockArea>(manager->docks, 0))
+        FreeDockRecord(dock);
     PointerListDestroy(manager->docks);
     manager->docks = nullptr;
-    while (ToolbarItem *item = ListAt<ToolbarItem>(manager->items, 0)) ItemRemove(manager, item);
+    while (ToolbarItem *item = ListAt<ToolbarItem>(manager->items, 0))
+        ItemRemove(manager, item);
     PointerListDestroy(manager->items);
     manager->items = nullptr;
     if (manager->imageStrip) GdiDelete(manager->imageStrip);
@@ -81,7 +84,8 @@ extern "C" UINT QBR_AddButtons(ToolbarManager *manager, const UINT *ids, UINT co
 
 extern "C" UINT QBR_AssignCategory(ToolbarManager *manager, UINT category, const UINT *ids, UINT count) {
     if (!manager) return 0;
-    for (UINT i = 0; i < count; ++i) ItemSetCategory(ItemFindById(manager->items, ids[i]), category);
+    for (UINT i = 0; i < count; ++i)
+        ItemSetCategory(ItemFindById(manager->items, ids[i]), category);
     return 1;
 }
 
@@ -330,9 +334,7 @@ static UINT ReadButton(ToolbarManager *manager, UINT id, ButtonReader read) {
 extern "C" UINT QBR_GetButtonBehaviour(ToolbarManager *manager, UINT id) {
     return ReadButton(manager, id, ButtonGetBehaviour);
 }
-extern "C" UINT QBR_GetButtonState(ToolbarManager *manager, UINT id) {
-    return ReadButton(manager, id, ButtonGetState);
-}
+extern "C" UINT QBR_GetButtonState(ToolbarManager *manager, UINT id) { return ReadButton(manager, id, ButtonGetState); }
 extern "C" UINT QBR_IsButtonEnabled(ToolbarManager *manager, UINT id) {
     return ReadButton(manager, id, ButtonIsEnabled);
 }

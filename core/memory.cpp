@@ -44,9 +44,11 @@ UINT BlockMove(void *dest, const void *src, UINT size) {
     auto *d = static_cast<BYTE *>(dest);
     auto *s = static_cast<const BYTE *>(src);
     if (d < s) {
-        for (UINT i = 0; i < size; ++i) d[i] = s[i];
+        for (UINT i = 0; i < size; ++i)
+            d[i] = s[i];
     } else if (d > s) {
-        for (UINT i = size; i > 0; --i) d[i - 1] = s[i - 1];
+        for (UINT i = size; i > 0; --i)
+            d[i - 1] = s[i - 1];
     }
     return dest ? 1 : 0;
 }
@@ -60,13 +62,15 @@ UINT BlockCopy(void *dest, const void *src, UINT size) {
         CopyMemory(&w, s + i * 4, 4);
         CopyMemory(d + i * 4, &w, 4);
     }
-    for (UINT i = words * 4; i < size; ++i) d[i] = s[i];
+    for (UINT i = words * 4; i < size; ++i)
+        d[i] = s[i];
     return dest ? 1 : 0;
 }
 
 UINT BlockFill(void *dest, BYTE value, UINT size) {
     auto *d = static_cast<BYTE *>(dest);
-    for (UINT i = 0; i < size; ++i) d[i] = value;
+    for (UINT i = 0; i < size; ++i)
+        d[i] = value;
     return dest ? 1 : 0;
 }
 
@@ -216,18 +220,21 @@ UINT StringAppend(LPSTR *inout, LPCSTR tail) {
 UINT StringsEqual(LPCSTR a, LPCSTR b) { return lstrcmpA(a, b) == 0 ? 1 : 0; }
 
 LPSTR FindCharOrEnd(LPSTR text, char ch) {
-    while (*text && *text != ch) ++text;
+    while (*text && *text != ch)
+        ++text;
     return text;
 }
 
 // Leading white space, one optional sign, then decimal digits up to the
 // first other character; no digits give 0.
 static int ParseTokenNumber(LPCSTR p) {
-    while (*p == ' ' || *p == '\t' || *p == '\n' || *p == '\v' || *p == '\f' || *p == '\r') ++p;
+    while (*p == ' ' || *p == '\t' || *p == '\n' || *p == '\v' || *p == '\f' || *p == '\r')
+        ++p;
     bool negative = false;
     if (*p == '+' || *p == '-') negative = *p++ == '-';
     UINT value = 0; // 32 bits, wrapping, with no overflow test
-    while (*p >= '0' && *p <= '9') value = value * 10u + static_cast<UINT>(*p++ - '0');
+    while (*p >= '0' && *p <= '9')
+        value = value * 10u + static_cast<UINT>(*p++ - '0');
     return static_cast<int>(negative ? 0u - value : value);
 }
 

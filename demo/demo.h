@@ -24,6 +24,18 @@ void SaveLayout(ToolbarManager *manager, LPCSTR section);
 UINT RestoreLayout(ToolbarManager *manager, HWND frame, LPCSTR section);
 UINT LoadTextFile(HWND edit, LPCSTR path);
 
+// A regular-weight font of `points` at the screen's resolution.
+inline HFONT MakeDemoFont(int points, BYTE pitchAndFamily, LPCSTR faceName) {
+    LOGFONTA lf = {};
+    HDC screen = GetDC(nullptr);
+    lf.lfHeight = -MulDiv(points, GetDeviceCaps(screen, LOGPIXELSY), 72);
+    ReleaseDC(nullptr, screen);
+    lf.lfWeight = FW_NORMAL;
+    lf.lfPitchAndFamily = pitchAndFamily;
+    lstrcpynA(lf.lfFaceName, faceName, LF_FACESIZE);
+    return CreateFontIndirectA(&lf);
+}
+
 // Shared by both kinds of frame (main.cpp).
 void CheckMenuRadio(HMENU menu, UINT first, UINT last, UINT onId);
 void FillToolbarsMenu(ToolbarManager *manager, HMENU menu);

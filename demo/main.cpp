@@ -38,7 +38,9 @@ void CheckGlobals(HWND frame) {
 
 // The status line follows WM_MENUSELECT from menus and, as the library sends
 // it for the start and end of a press, from toolbar buttons too.
-void OnMenuSelect(HWND statusBar, WPARAM wParam) { SetStatusText(statusBar, HIWORD(wParam) == 0xFFFF ? 0 : LOWORD(wParam)); }
+void OnMenuSelect(HWND statusBar, WPARAM wParam) {
+    SetStatusText(statusBar, HIWORD(wParam) == 0xFFFF ? 0 : LOWORD(wParam));
+}
 
 void OpenAbout(HWND frame, ToolbarManager *manager) {
     DialogBoxParamA(moduleInstance, "About", frame, AboutDialogProc, 0);
@@ -185,9 +187,7 @@ struct ViewState {
     HMENU toolbarsMenu;
 };
 
-ToolbarManager *ViewManager(HWND window) {
-    return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(window, 0));
-}
+ToolbarManager *ViewManager(HWND window) { return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(window, 0)); }
 ViewState *ViewStateOf(HWND window) { return reinterpret_cast<ViewState *>(GetWindowLongPtrA(window, GWLP_USERDATA)); }
 
 LRESULT OnViewCreate(HWND window) {
@@ -305,7 +305,8 @@ void CheckMenuRadio(HMENU menu, UINT first, UINT last, UINT onId) {
 }
 
 void FillToolbarsMenu(ToolbarManager *manager, HMENU menu) {
-    for (int n = GetMenuItemCount(menu); n > 0; --n) DeleteMenu(menu, 0, MF_BYPOSITION);
+    for (int n = GetMenuItemCount(menu); n > 0; --n)
+        DeleteMenu(menu, 0, MF_BYPOSITION);
     for (UINT i = 0; i < QBR_GetToolbarCount(manager); ++i) {
         HWND toolbar = QBR_GetToolbar(manager, i);
         if (!toolbar) continue;
@@ -333,18 +334,10 @@ void ToggleGlobal(HWND frame, UINT command) {
 }
 
 HWND CreateEditControl(HWND frame, HFONT *font) {
-    HWND edit = CreateWindowExA(0, "Edit", "",
-                                WS_CHILD | WS_VISIBLE | WS_VSCROLL | WS_BORDER | ES_MULTILINE | ES_AUTOVSCROLL, 0, 0,
-                                0, 0, frame, reinterpret_cast<HMENU>(static_cast<INT_PTR>(kEditId)), moduleInstance,
-                                nullptr);
-    LOGFONTA lf = {};
-    HDC screen = GetDC(nullptr);
-    lf.lfHeight = -MulDiv(11, GetDeviceCaps(screen, LOGPIXELSY), 72);
-    ReleaseDC(nullptr, screen);
-    lf.lfWeight = 400;
-    lf.lfPitchAndFamily = VARIABLE_PITCH | FF_ROMAN;
-    lstrcpyA(lf.lfFaceName, "Times New Roman");
-    *font = CreateFontIndirectA(&lf);
+    HWND edit = CreateWindowExA(
+        0, "Edit", "", WS_CHILD | WS_VISIBLE | WS_VSCROLL | WS_BORDER | ES_MULTILINE | ES_AUTOVSCROLL, 0, 0, 0, 0,
+        frame, reinterpret_cast<HMENU>(static_cast<INT_PTR>(kEditId)), moduleInstance, nullptr);
+    *font = MakeDemoFont(11, VARIABLE_PITCH | FF_ROMAN, "Times New Roman");
     if (edit) SendMessageA(edit, WM_SETFONT, reinterpret_cast<WPARAM>(*font), 0);
     return edit;
 }
@@ -378,15 +371,9 @@ INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARA
     static HFONT aboutFont = nullptr;
     switch (message) {
     case WM_INITDIALOG: {
-        LOGFONTA lf = {};
-        HDC screen = GetDC(nullptr);
-        lf.lfHeight = -MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72);
-        ReleaseDC(nullptr, screen);
-        lf.lfWeight = 400;
-        lf.lfPitchAndFamily = VARIABLE_PITCH | FF_SWISS;
-        lstrcpyA(lf.lfFaceName, "MS Sans Serif");
-        aboutFont = CreateFontIndirectA(&lf);
-        for (int id : {8001, 8002, 8003}) SendDlgItemMessageA(dialog, id, WM_SETFONT, reinterpret_cast<WPARAM>(aboutFont), 0);
+        aboutFont = MakeDemoFont(8, VARIABLE_PITCH | FF_SWISS, "MS Sans Serif");
+        for (int id : {8001, 8002, 8003})
+            SendDlgItemMessageA(dialog, id, WM_SETFONT, reinterpret_cast<WPARAM>(aboutFont), 0);
         RECT r;
         GetWindowRect(dialog, &r);
         SetWindowPos(dialog, nullptr, (GetSystemMetrics(SM_CXSCREEN) - (r.right - r.left)) / 2,

@@ -2,6 +2,8 @@
 // colours, so that it looks the same whatever the system's colour scheme.
 #include "statusbar.h"
 
+#include "demo.h"
+
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -82,7 +84,7 @@ LRESULT OnPaint(HWND window) {
     return 0;
 }
 
-}  // namespace
+} // namespace
 
 UINT RegisterStatusBarClass() {
     WNDCLASSA wc;
@@ -98,15 +100,7 @@ UINT RegisterStatusBarClass() {
     }
     // A second call keeps the font it has rather than leak one.
     if (statusBarFont) return 1;
-    // 8 points in the screen's resolution, regular weight.
-    HDC screen = GetDC(nullptr);
-    LOGFONTA font = {};
-    font.lfHeight = -MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72);
-    ReleaseDC(nullptr, screen);
-    font.lfWeight = FW_NORMAL;
-    font.lfPitchAndFamily = VARIABLE_PITCH | FF_SWISS;
-    std::strcpy(font.lfFaceName, "MS Sans Serif");
-    statusBarFont = CreateFontIndirectA(&font);
+    statusBarFont = MakeDemoFont(8, VARIABLE_PITCH | FF_SWISS, "MS Sans Serif");
     return 1;
 }
 
@@ -125,8 +119,8 @@ HWND CreateStatusBar(HWND parent) {
     SelectObject(screen, oldFont);
     ReleaseDC(nullptr, screen);
     const int height = metrics.tmHeight - metrics.tmInternalLeading + kExtraHeight;
-    return CreateWindowExA(0, kClassName, "", WS_CHILD | WS_VISIBLE, 0, 0, 0, height, parent, nullptr,
-                           moduleInstance, nullptr);
+    return CreateWindowExA(0, kClassName, "", WS_CHILD | WS_VISIBLE, 0, 0, 0, height, parent, nullptr, moduleInstance,
+                           nullptr);
 }
 
 void SetStatusText(HWND statusBar, UINT id) {

@@ -25,9 +25,9 @@ struct CategoryList {
     UINT count;
 };
 constexpr CategoryList kCategoryLists[] = {
-    {3001, kFileIds, CountOf(kFileIds)},   {3002, kEditIds, CountOf(kEditIds)},
+    {3001, kFileIds, CountOf(kFileIds)},       {3002, kEditIds, CountOf(kEditIds)},
     {3003, kPaletteIds, CountOf(kPaletteIds)}, {3004, kStyleIds, CountOf(kStyleIds)},
-    {3005, kAlignIds, CountOf(kAlignIds)}, {3006, kMiscIds, CountOf(kMiscIds)},
+    {3005, kAlignIds, CountOf(kAlignIds)},     {3006, kMiscIds, CountOf(kMiscIds)},
 };
 
 // 0 is the shared separator.
@@ -57,7 +57,8 @@ constexpr DefaultToolbar kViewToolbars[] = {
 };
 
 void SetBehaviours(ToolbarManager *manager, UINT first, UINT last, UINT behaviour) {
-    for (UINT id = first; id <= last; ++id) QBR_SetButtonBehaviour(manager, id, behaviour);
+    for (UINT id = first; id <= last; ++id)
+        QBR_SetButtonBehaviour(manager, id, behaviour);
 }
 
 // A stored arrangement, or else a top dock with the default toolbars.
@@ -78,7 +79,8 @@ ToolbarManager *RestoreOrDefault(ToolbarManager *manager, HWND frame, LPCSTR sec
 // building this frame's toolbars.
 ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section) {
     ToolbarManager *manager = QBR_CreateManager(frame);
-    if (!manager || !QBR_SetImageStrip(manager, "Main") || !QBR_AddButtons(manager, kMainCatalog, CountOf(kMainCatalog)) ||
+    if (!manager || !QBR_SetImageStrip(manager, "Main") ||
+        !QBR_AddButtons(manager, kMainCatalog, CountOf(kMainCatalog)) ||
         !QBR_SetCategories(manager, kCategories, CountOf(kCategories)))
         return nullptr;
     for (const CategoryList &c : kCategoryLists)
@@ -93,7 +95,8 @@ ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section) {
 
 ToolbarManager *BuildViewToolbars(HWND frame, LPCSTR section) {
     ToolbarManager *manager = QBR_CreateManager(frame);
-    if (!manager || !QBR_SetImageStrip(manager, "View") || !QBR_AddButtons(manager, kViewCatalog, CountOf(kViewCatalog)))
+    if (!manager || !QBR_SetImageStrip(manager, "View") ||
+        !QBR_AddButtons(manager, kViewCatalog, CountOf(kViewCatalog)))
         return nullptr;
     SetBehaviours(manager, 301, 307, BTN_CHECK);
     QBR_SetButtonBehaviour(manager, 151, BTN_LATCH);

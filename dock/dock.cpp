@@ -45,8 +45,8 @@ extern "C" HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side) {
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
     if (!RegisterDockClass(instance)) return nullptr;
     // Not WS_VISIBLE: PlaceDock alone decides whether a dock shows.
-    HWND window = CreateWindowExA(0, kDockClassName, "", WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN, 0, 0,
-                                  0, 0, frame, nullptr, instance, nullptr);
+    HWND window = CreateWindowExA(0, kDockClassName, "", WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN, 0, 0, 0, 0,
+                                  frame, nullptr, instance, nullptr);
     if (!window) return nullptr;
     SetWindowLongPtrA(window, kDockManagerWord, reinterpret_cast<LONG_PTR>(manager));
     if (!AddDockRecord(manager, window, side)) {

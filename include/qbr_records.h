@@ -74,8 +74,8 @@ typedef struct SeparatorData {
 
 /* One toolbar: a pane in a dock and a floating frame showing the same items. */
 typedef struct ToolbarRecord {
-    HWND paneWindow; /* the key of the record */
-    HWND dockWindow; /* the pane's parent now */
+    HWND paneWindow;             /* the key of the record */
+    HWND dockWindow;             /* the pane's parent now */
     PointerList *items;          /* ToolbarItem, not owned */
     PointerList *floatingBreaks; /* first item of every row but the top, frame */
     PointerList *dockedBreaks;   /* the same for the pane */
@@ -85,8 +85,8 @@ typedef struct ToolbarRecord {
 /* A strip along one edge of the frame that packs docked panes. */
 typedef struct DockArea {
     HWND window;
-    UINT side;              /* DOCK_ */
-    PointerList *toolbars;  /* ToolbarRecord, not owned, in packing order */
+    UINT side;             /* DOCK_ */
+    PointerList *toolbars; /* ToolbarRecord, not owned, in packing order */
 } DockArea;
 
 #ifdef __cplusplus

@@ -71,8 +71,8 @@ extern HINSTANCE moduleInstance;
 UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc);
 void QBR_Terminate(void);
 void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage);
-void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight,
-                          int textButtonWidth, int textButtonHeight);
+void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight, int textButtonWidth,
+                          int textButtonHeight);
 void QBR_SetQuickHelp(UINT on);
 UINT QBR_GetQuickHelp(void);
 void QBR_SetCustomize(UINT on);
@@ -102,8 +102,8 @@ UINT QBR_GetToolbarCount(ToolbarManager *manager);
 HWND QBR_GetToolbar(ToolbarManager *manager, UINT index);
 
 /* Toolbars. A toolbar is named by the handle of its docked pane. */
-HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock,
-                       const UINT *ids, UINT idCount);
+HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock, const UINT *ids,
+                       UINT idCount);
 void QBR_DestroyToolbar(HWND pane);
 UINT QBR_GetToolbarFlags(HWND pane);
 void QBR_SetToolbarFlags(HWND pane, UINT flags);

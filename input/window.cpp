@@ -15,9 +15,9 @@ constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
 // frame passes through here too, and does nothing.
 static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
     if (!(create->style & WS_CHILD)) return 0;
-    HWND frame = CreateWindowExA(0, create->lpszClass, create->lpszName, kFrameStyle, CW_USEDEFAULT, CW_USEDEFAULT,
-                                 create->cx, create->cy, GetParent(create->hwndParent), nullptr, create->hInstance,
-                                 create->lpCreateParams);
+    HWND frame =
+        CreateWindowExA(0, create->lpszClass, create->lpszName, kFrameStyle, CW_USEDEFAULT, CW_USEDEFAULT, create->cx,
+                        create->cy, GetParent(create->hwndParent), nullptr, create->hInstance, create->lpCreateParams);
     if (!frame) return -1;
     SetTwinWindow(frame, window);
     SetTwinWindow(window, frame);

@@ -124,14 +124,15 @@ UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count
     BlockFill(*keys, 0, PointerBytes(n));
     BlockFill(*values, 0, PointerBytes(n));
     // Entry 0: the dock's key, and its toolbars' titles joined by commas.
-    if (!StringDuplicate(&(*keys)[0], LoadLibraryText(kDockKeyBase + dock->side)) || !StringDuplicate(&(*values)[0], "")) {
+    if (!StringDuplicate(&(*keys)[0], LoadLibraryText(kDockKeyBase + dock->side)) ||
+        !StringDuplicate(&(*values)[0], "")) {
         FreeEntries(*keys, *values, n);
         return 0;
     }
     for (UINT i = 1; i < n; ++i) {
         ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i - 1);
-        if (!FormatToolbarLayout(toolbar, &(*keys)[i], &(*values)[i]) ||
-            (i > 1 && !StringAppend(&(*values)[0], ",")) || !StringAppend(&(*values)[0], (*keys)[i])) {
+        if (!FormatToolbarLayout(toolbar, &(*keys)[i], &(*values)[i]) || (i > 1 && !StringAppend(&(*values)[0], ",")) ||
+            !StringAppend(&(*values)[0], (*keys)[i])) {
             FreeEntries(*keys, *values, n);
             return 0;
         }
@@ -195,7 +196,8 @@ HWND RestoreToolbar(HWND dockWindow, LPCSTR title, LPSTR value) {
     void *block = nullptr;
     if (!MemoryBlockAlloc(&block, count * static_cast<UINT>(sizeof(UINT)), 0)) return nullptr;
     ids = static_cast<UINT *>(block);
-    for (UINT i = 0; i < count; ++i) ids[i] = ReadTokenId(value);
+    for (UINT i = 0; i < count; ++i)
+        ids[i] = ReadTokenId(value);
     record->flags = ReadTokenFlags(value);
     UINT ok = SetToolbarItems(record, ids, count);
     MemoryBlockFree(ids);

@@ -120,7 +120,8 @@ HBITMAP MakeDitherBitmap() {
     image.colors[1] = TableEntryOf(colorHighlight);
     // Rows run bottom-up, so the top row is 0x55: a pixel is colorFace where
     // x + y is even and colorHighlight where it is odd.
-    for (int row = 0; row < 8; ++row) image.rows[row] = (row % 2 == 0) ? 0x5555AAAA : 0xAAAA5555;
+    for (int row = 0; row < 8; ++row)
+        image.rows[row] = (row % 2 == 0) ? 0x5555AAAA : 0xAAAA5555;
 
     ScreenDC screen;
     return GdiTrack(CreateDIBitmap(screen, &image.header, CBM_INIT, image.rows,

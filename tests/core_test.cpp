@@ -14,7 +14,8 @@ extern "C" int CApiRoundTrip(void);
 // Values of a list, for comparing with a table.
 static std::vector<ULONG_PTR> Values(const PointerList *list) {
     std::vector<ULONG_PTR> out;
-    for (UINT i = 0; i < PointerListCount(list); ++i) out.push_back(PointerListGet(list, i));
+    for (UINT i = 0; i < PointerListCount(list); ++i)
+        out.push_back(PointerListGet(list, i));
     return out;
 }
 
@@ -82,11 +83,13 @@ TEST(PointerListTest, NeighbourInsertsAndRemoves) {
 
 TEST(PointerListTest, GrowsByStepAndNeverShrinksOnRemoval) {
     PointerList *list = PointerListCreate(5, 5, 0);
-    for (ULONG_PTR v = 1; v <= 5; ++v) PointerListAppend(list, v);
+    for (ULONG_PTR v = 1; v <= 5; ++v)
+        PointerListAppend(list, v);
     EXPECT_EQ(5u, list->capacity);
     PointerListAppend(list, 6);
     EXPECT_EQ(10u, list->capacity);
-    while (PointerListCount(list)) PointerListRemoveAt(list, 0);
+    while (PointerListCount(list))
+        PointerListRemoveAt(list, 0);
     EXPECT_EQ(10u, list->capacity);
     EXPECT_NE(nullptr, list->items);
     PointerListAppend(list, 7);
@@ -156,9 +159,8 @@ TEST(TokenTest, ReadersConsumeOneTokenEach) {
         const char *rest;
     };
     const Case cases[] = {
-        {"12,34", 12, "34"},       {"34", 34, ""},          {"", 0, ""},
-        {"-7x,9", -7, "9"},        {" \t+5,1", 5, "1"},     {"abc,2", 0, "2"},
-        {"4294967297,0", 1, "0"}, // accumulated in 32 bits, wrapping
+        {"12,34", 12, "34"}, {"34", 34, ""},           {"", 0, ""}, {"-7x,9", -7, "9"}, {" \t+5,1", 5, "1"},
+        {"abc,2", 0, "2"},   {"4294967297,0", 1, "0"}, // accumulated in 32 bits, wrapping
         {",,3", 0, ",3"},
     };
     for (const Case &k : cases) {
@@ -168,7 +170,8 @@ TEST(TokenTest, ReadersConsumeOneTokenEach) {
         EXPECT_STREQ(k.rest, buffer) << k.input;
     }
     char empty[4] = "";
-    for (int i = 0; i < 3; ++i) EXPECT_EQ(0, ReadTokenInt(empty));
+    for (int i = 0; i < 3; ++i)
+        EXPECT_EQ(0, ReadTokenInt(empty));
     char three[] = "Standard,Style,Align";
     char out[32];
     ReadTokenText(three, out);
@@ -282,7 +285,8 @@ TEST_F(ManagerTest, NewManagerHoldsTheSharedSeparator) {
 
 TEST_F(ManagerTest, CatalogImageIndicesCategoriesAndSizes) {
     std::vector<UINT> ids;
-    for (UINT i = 0; i < 31; ++i) ids.push_back(100 + i);
+    for (UINT i = 0; i < 31; ++i)
+        ids.push_back(100 + i);
     ASSERT_EQ(1u, QBR_AddButtons(manager, ids.data(), 31));
     EXPECT_EQ(32u, PointerListCount(manager->items));
     EXPECT_EQ(32u, manager->items->capacity);
@@ -349,8 +353,8 @@ TEST_F(ManagerTest, ButtonSettersCompareFirst) {
     EXPECT_EQ(static_cast<UINT>(BS_ON), ItemFindById(manager->items, 2)->data
                                             ? static_cast<ButtonData *>(ItemFindById(manager->items, 2)->data)->state
                                             : 0);
-    for (auto set : {QBR_SetButtonState, QBR_SetButtonEnabled, QBR_SetButtonPressed, QBR_SetButtonBehaviour,
-                     QBR_SetButtonImage}) {
+    for (auto set :
+         {QBR_SetButtonState, QBR_SetButtonEnabled, QBR_SetButtonPressed, QBR_SetButtonBehaviour, QBR_SetButtonImage}) {
         EXPECT_EQ(0u, set(manager, 0, 1)) << "the separator is no button";
         EXPECT_EQ(0u, set(manager, 77, 1)) << "an id outside the catalog";
     }

@@ -48,8 +48,8 @@ class DemoResources : public ::testing::Test {
 struct TextRow {
     UINT id;
     const char *description;
-    const char *quickHelp;   // nullptr: no such string
-    const char *buttonText;  // nullptr: no such string
+    const char *quickHelp;  // nullptr: no such string
+    const char *buttonText; // nullptr: no such string
 };
 
 const TextRow kTexts[] = {
@@ -98,7 +98,8 @@ TEST_F(DemoResources, EveryCommandHasItsThreeTextsAndCategoriesTheirNames) {
         EXPECT_EQ(String(row.id + 2000), row.buttonText ? row.buttonText : "");
     }
     const char *categories[] = {"File", "Edit", "Palette", "Style", "Align", "Misc"};
-    for (UINT i = 0; i < 6; ++i) EXPECT_EQ(String(3001 + i), categories[i]);
+    for (UINT i = 0; i < 6; ++i)
+        EXPECT_EQ(String(3001 + i), categories[i]);
     // The library's own strings live in the same table of the program.
     EXPECT_EQ(String(5101), "Insert Item...");
 }
@@ -139,8 +140,8 @@ TEST_F(DemoResources, MenusListTheirCommandsInOrder) {
                      "[&Palette: 201 &Eraser;202 &Pen;203 &Selection;204 &Brush;205 Spra&y;206 P&aint;207 &Line;"
                      "208 E&yedrop;209 &Magnify;210 &Rectangle;211 Ro&und Rectangle;212 &Oval;]" +
                      kHelpMenu},
-        {"View", std::string(kFileMenu) + kEditMenu + "[&View: 120 &Quick Help;121 &Button Text;]" + kStyleMenu +
-                     kHelpMenu},
+        {"View",
+         std::string(kFileMenu) + kEditMenu + "[&View: 120 &Quick Help;121 &Button Text;]" + kStyleMenu + kHelpMenu},
     };
     for (const auto &m : menus) {
         SCOPED_TRACE(m.name);
@@ -225,8 +226,8 @@ TEST_F(DemoResources, IconAndAboutBoxArePresent) {
     std::vector<BYTE> hidden(bytes, bytes + size);
     copy = reinterpret_cast<DLGTEMPLATE *>(hidden.data());
     copy->style &= ~WS_VISIBLE;
-    HWND box = CreateDialogIndirectParamA(GetModuleHandleA(nullptr), copy, nullptr,
-                                          [](HWND, UINT, WPARAM, LPARAM) -> INT_PTR { return FALSE; }, 0);
+    HWND box = CreateDialogIndirectParamA(
+        GetModuleHandleA(nullptr), copy, nullptr, [](HWND, UINT, WPARAM, LPARAM) -> INT_PTR { return FALSE; }, 0);
     ASSERT_NE(box, nullptr);
     char text[128] = "";
     GetWindowTextA(box, text, sizeof text);
@@ -328,9 +329,9 @@ TEST_F(StatusBarTest, PaintsASunkenPanelInFixedColoursWithTheTextInside) {
         COLORREF colour;
         const char *what;
     } const points[] = {
-        {2, 2, grey, "background"},       {w - 2, h - 3, grey, "background right of the panel"},
-        {50, 0, white, "top line"},       {50, h - 1, dark, "bottom line"},
-        {6, 10, dark, "panel left edge"}, {50, 3, dark, "panel top edge"},
+        {2, 2, grey, "background"},        {w - 2, h - 3, grey, "background right of the panel"},
+        {50, 0, white, "top line"},        {50, h - 1, dark, "bottom line"},
+        {6, 10, dark, "panel left edge"},  {50, 3, dark, "panel top edge"},
         {w - 5, 10, white, "panel right"}, {50, h - 3, white, "panel bottom edge"},
         {w - 6, 10, grey, "panel inside"},
     };
@@ -341,11 +342,12 @@ TEST_F(StatusBarTest, PaintsASunkenPanelInFixedColoursWithTheTextInside) {
     // nor edge colours, and they change with the text.
     int inked = 0;
     for (int y = 5; y < h - 3; ++y)
-        for (int x = 10; x < w - 6; ++x) inked += welcome.At(x, y) != grey;
+        for (int x = 10; x < w - 6; ++x)
+            inked += welcome.At(x, y) != grey;
     EXPECT_GT(inked, 20);
     SetStatusText(bar, 204);
     Pixels help = ReadWindowPixels(bar);
     EXPECT_NE(help.colors, welcome.colors);
 }
 
-}  // namespace
+} // namespace

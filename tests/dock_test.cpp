@@ -57,10 +57,11 @@ TEST_F(DockTest, GetDockFindsTheOldestDockOfASide) {
         UINT side;
         HWND expected;
     } const cases[] = {
-        {nullptr, DOCK_LEFT, nullptr}, {manager, DOCK_TOP, top},   {manager, DOCK_LEFT, left},
+        {nullptr, DOCK_LEFT, nullptr},  {manager, DOCK_TOP, top}, {manager, DOCK_LEFT, left},
         {manager, DOCK_RIGHT, nullptr}, {manager, 7, nullptr},
     };
-    for (const Case &c : cases) EXPECT_EQ(c.expected, QBR_GetDock(c.manager, c.side)) << "side " << c.side;
+    for (const Case &c : cases)
+        EXPECT_EQ(c.expected, QBR_GetDock(c.manager, c.side)) << "side " << c.side;
     EXPECT_EQ(nullptr, QBR_CreateDock(nullptr, frame, DOCK_TOP));
 }
 
@@ -103,9 +104,14 @@ TEST_F(DockTest, DockWindowFromPointCountsRightAndBottomEdgesAndHiddenDocks) {
         int x, y;
         HWND expected;
     } const cases[] = {
-        {t.left, t.top, top},          {t.right, t.top, top},       {t.left + 5, t.bottom, top},
-        {t.left + 5, t.top - 1, nullptr}, {l.left + 1, l.top, top}, // the shared line goes to the first dock
-        {l.left + 1, l.top + 1, left}, {l.right, l.top + 10, left}, {l.right + 1, l.top + 10, nullptr},
+        {t.left, t.top, top},
+        {t.right, t.top, top},
+        {t.left + 5, t.bottom, top},
+        {t.left + 5, t.top - 1, nullptr},
+        {l.left + 1, l.top, top}, // the shared line goes to the first dock
+        {l.left + 1, l.top + 1, left},
+        {l.right, l.top + 10, left},
+        {l.right + 1, l.top + 10, nullptr},
     };
     for (const Case &c : cases)
         EXPECT_EQ(c.expected, DockWindowFromPoint(manager, c.x, c.y)) << c.x << "," << c.y;
@@ -117,7 +123,8 @@ TEST_F(DockTest, RelayoutOfAHiddenUnchangedDockTellsTheFrameEveryTime) {
     Pump();
     const RECT before = WindowRectInParent(dock);
     ClearFrameLog();
-    for (int i = 0; i < 3; ++i) EXPECT_EQ(1u, RelayoutDock(dock));
+    for (int i = 0; i < 3; ++i)
+        EXPECT_EQ(1u, RelayoutDock(dock));
     Pump();
     EXPECT_EQ(3, CountHeard(WM_SIZE)) << Describe(FrameLog());
     EXPECT_EQ(before, WindowRectInParent(dock));
@@ -163,7 +170,8 @@ class DockPackTest : public FrameTest {
     // A docked visible toolbar of `count` buttons starting at `first`.
     HWND Toolbar(UINT first, UINT count, UINT flags = TBF_VISIBLE | TBF_DOCKED) {
         std::vector<UINT> ids;
-        for (UINT i = 0; i < count; ++i) ids.push_back(first + i);
+        for (UINT i = 0; i < count; ++i)
+            ids.push_back(first + i);
         HWND pane = QBR_CreateToolbar("T", flags, 100, 100, 0, 0, dock, ids.data(), count);
         EXPECT_NE(nullptr, pane);
         Pump();

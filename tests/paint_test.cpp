@@ -62,7 +62,8 @@ class Canvas {
 
     void Clear() {
         GdiFlush();
-        for (int i = 0; i < width_ * height_; ++i) bits_[i] = kUntouchedPixel;
+        for (int i = 0; i < width_ * height_; ++i)
+            bits_[i] = kUntouchedPixel;
     }
     HDC Dc() const { return dc_; }
     COLORREF At(int x, int y) const {
@@ -73,7 +74,8 @@ class Canvas {
     std::vector<COLORREF> Block(const RECT &r) const {
         std::vector<COLORREF> out;
         for (int y = r.top; y < r.bottom; ++y)
-            for (int x = r.left; x < r.right; ++x) out.push_back(At(x, y));
+            for (int x = r.left; x < r.right; ++x)
+                out.push_back(At(x, y));
         return out;
     }
 
@@ -104,7 +106,8 @@ std::vector<COLORREF> BitmapPixels(HBITMAP bitmap, int *width, int *height) {
     GetDIBits(screen, bitmap, 0, info.bmHeight, raw.data(), &header, DIB_RGB_COLORS);
     ReleaseDC(nullptr, screen);
     std::vector<COLORREF> out;
-    for (DWORD v : raw) out.push_back(RGB((v >> 16) & 0xFF, (v >> 8) & 0xFF, v & 0xFF));
+    for (DWORD v : raw)
+        out.push_back(RGB((v >> 16) & 0xFF, (v >> 8) & 0xFF, v & 0xFF));
     return out;
 }
 
@@ -178,7 +181,7 @@ TEST_F(PaintTest, StripKeyColoursBecomeTheButtonColours) {
     };
     const Probe probes[] = {
         {"light grey -> face", 0, 0, colors.face},       {"light grey -> face", 14, 14, colors.face},
-        {"black -> button text", 5, 5, colors.text},      {"grey -> shadow", 5, 11, colors.shadow},
+        {"black -> button text", 5, 5, colors.text},     {"grey -> shadow", 5, 11, colors.shadow},
         {"white -> highlight", 5, 10, colors.highlight}, {"red stays red", 1, 1, kRed},
     };
     for (int cell = 0; cell < 8; ++cell) {
@@ -228,7 +231,8 @@ TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
     const int elements[4] = {COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT};
     const COLORREF unusual[4] = {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)};
     COLORREF saved[4];
-    for (int i = 0; i < 4; ++i) saved[i] = GetSysColor(elements[i]);
+    for (int i = 0; i < 4; ++i)
+        saved[i] = GetSysColor(elements[i]);
     struct Restore {
         const int *elements;
         const COLORREF *saved;
@@ -260,9 +264,9 @@ TEST_F(PaintTest, ImageIndexGivesItsCell) {
         UINT index, column, row;
     };
     const Row rows[] = {
-        {0, 16, 0, 0, 0},  {0, 16, 3, 3, 0},   {0, 16, 4, 0, 1},   {0, 16, 7, 3, 1},  {0, 16, 9, 1, 2},
-        {0, 10, 6, 6, 0},  {0, 10, 7, 0, 1},   {0, 10, 15, 1, 2},  {368, 16, 0, 0, 0}, {368, 16, 22, 22, 0},
-        {368, 16, 23, 0, 1}, {368, 16, 30, 7, 1},
+        {0, 16, 0, 0, 0},   {0, 16, 3, 3, 0},     {0, 16, 4, 0, 1},    {0, 16, 7, 3, 1},
+        {0, 16, 9, 1, 2},   {0, 10, 6, 6, 0},     {0, 10, 7, 0, 1},    {0, 10, 15, 1, 2},
+        {368, 16, 0, 0, 0}, {368, 16, 22, 22, 0}, {368, 16, 23, 0, 1}, {368, 16, 30, 7, 1},
     };
     Canvas canvas(8, 8);
     ToolbarManager *wide = QBR_CreateManager(nullptr);
@@ -338,13 +342,20 @@ TEST_F(PaintTest, EachStateHasItsLook) {
     Canvas canvas(50, 40);
     auto expected = [&](Look look, int x, int y) -> COLORREF {
         switch (look) {
-        case F: return colors.face;
-        case H: return colors.highlight;
-        case S: return colors.shadow;
-        case K: return colors.text;
-        case R: return kRed;
-        case B: return kBlue;
-        case D: return ((x + y) % 2 == 0) ? colors.face : colors.highlight;
+        case F:
+            return colors.face;
+        case H:
+            return colors.highlight;
+        case S:
+            return colors.shadow;
+        case K:
+            return colors.text;
+        case R:
+            return kRed;
+        case B:
+            return kBlue;
+        case D:
+            return ((x + y) % 2 == 0) ? colors.face : colors.highlight;
         }
         return kUntouched;
     };
@@ -360,12 +371,18 @@ TEST_F(PaintTest, EachStateHasItsLook) {
             int x, y;
         };
         const Probe probes[] = {
-            {"left edge", s.left, left + 1, top + 5},         {"top edge", s.top, left + 5, top + 1},
-            {"right edge", s.right, left + 22, top + 5},      {"bottom edge", s.bottom, left + 5, top + 20},
-            {"face", s.face1, left + 2, top + 10},            {"face", s.face2, left + 2, top + 11},
-            {"ink", s.ink, ix + 5, iy + 5},                   {"red", s.red, ix + 1, iy + 1},
-            {"white", s.white1, ix + 5, iy + 10},             {"white", s.white2, ix + 6, iy + 10},
-            {"beside the ink", s.beside1, ix + 12, iy + 5},   {"beside the ink", s.beside2, ix + 12, iy + 6},
+            {"left edge", s.left, left + 1, top + 5},
+            {"top edge", s.top, left + 5, top + 1},
+            {"right edge", s.right, left + 22, top + 5},
+            {"bottom edge", s.bottom, left + 5, top + 20},
+            {"face", s.face1, left + 2, top + 10},
+            {"face", s.face2, left + 2, top + 11},
+            {"ink", s.ink, ix + 5, iy + 5},
+            {"red", s.red, ix + 1, iy + 1},
+            {"white", s.white1, ix + 5, iy + 10},
+            {"white", s.white2, ix + 6, iy + 10},
+            {"beside the ink", s.beside1, ix + 12, iy + 5},
+            {"beside the ink", s.beside2, ix + 12, iy + 6},
             {"marker", s.marker, ix + marker, iy + 13},
         };
         for (const Probe &p : probes)
@@ -374,9 +391,11 @@ TEST_F(PaintTest, EachStateHasItsLook) {
 
         // The frame ring never moves, and its four corners are never painted.
         const POINT frame[] = {{left + 5, top}, {left + 5, top + 21}, {left, top + 5}, {left + 23, top + 5}};
-        for (POINT f : frame) EXPECT_EQ(Hex(colors.frame), Hex(canvas.At(f.x, f.y))) << s.name << ": frame";
+        for (POINT f : frame)
+            EXPECT_EQ(Hex(colors.frame), Hex(canvas.At(f.x, f.y))) << s.name << ": frame";
         const POINT corners[] = {{left, top}, {left + 23, top}, {left, top + 21}, {left + 23, top + 21}};
-        for (POINT c : corners) EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(c.x, c.y))) << s.name << ": corner";
+        for (POINT c : corners)
+            EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(c.x, c.y))) << s.name << ": corner";
         // Nothing outside the cell.
         EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(left + 24, top + 5))) << s.name;
         EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(left + 5, top + 22))) << s.name;
@@ -428,7 +447,8 @@ TEST_F(PaintTest, ClippedButtonIsSkippedAndTheNextDrawn) {
     PaintButton(ItemFindById(manager->items, 2), &second, 0);
     EndButtonPaint();
     for (int y = 0; y < 22; ++y)
-        for (int x = 0; x < 23; ++x) ASSERT_EQ(Hex(kUntouched), Hex(canvas.At(x, y))) << x << "," << y;
+        for (int x = 0; x < 23; ++x)
+            ASSERT_EQ(Hex(kUntouched), Hex(canvas.At(x, y))) << x << "," << y;
     // The shared frame column stays clipped too; the rest of the second
     // button is drawn.
     EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(23, 5)));
@@ -484,7 +504,8 @@ TEST_F(PaintTest, TextModeLabelsTheButton) {
         ASSERT_LT(boxes[pressed].left, boxes[pressed].right) << "no label drawn";
         bool hasInk = false;
         for (int yy = boxes[pressed].top; yy < boxes[pressed].bottom; ++yy)
-            for (int xx = boxes[pressed].left; xx < boxes[pressed].right; ++xx) hasInk |= canvas.At(xx, yy) == ink;
+            for (int xx = boxes[pressed].left; xx < boxes[pressed].right; ++xx)
+                hasInk |= canvas.At(xx, yy) == ink;
         EXPECT_TRUE(hasInk) << "the label takes the target's text colour";
     }
     const int labelX = x + ((w - extent.cx - 1) >> 1);
@@ -506,7 +527,8 @@ TEST_F(PaintTest, TextModeLabelsTheButton) {
     SetTextColor(canvas.Dc(), ink);
     PaintOne(canvas, 7, 0, 0);
     for (int yy = 0; yy < 22; ++yy)
-        for (int xx = 0; xx < 24; ++xx) ASSERT_NE(ink, canvas.At(xx, yy));
+        for (int xx = 0; xx < 24; ++xx)
+            ASSERT_NE(ink, canvas.At(xx, yy));
 }
 
 // A pass needs a strip: without one nothing opens and nothing is left made.
@@ -643,7 +665,8 @@ TEST_F(SurfaceTest, FloatingFrameHasCaptionBandAndCloseBox) {
         {"dash outline above", 3, t - 1, RGB(0, 0, 0)},
         {"dash shadow", ch - 2, t + 2, RGB(128, 128, 128)},
     };
-    for (const Probe &p : box) EXPECT_EQ(Hex(p.expected), Hex(px.At(p.x, p.y))) << p.what;
+    for (const Probe &p : box)
+        EXPECT_EQ(Hex(p.expected), Hex(px.At(p.x, p.y))) << p.what;
 
     // The title: something other than the band colour, centred.
     RECT title = {px.width, ch, -1, -1};
@@ -682,7 +705,8 @@ TEST_F(SurfaceTest, CaptionCases) {
     PaintFloatingCaption(frame, canvas.Dc());
     EXPECT_EQ(blocks, LiveMemoryBlocks());
     for (int x = 0; x < client.right; ++x) {
-        for (int y = 0; y < ch - 1; ++y) ASSERT_EQ(Hex(band), Hex(canvas.At(x, y))) << x << "," << y;
+        for (int y = 0; y < ch - 1; ++y)
+            ASSERT_EQ(Hex(band), Hex(canvas.At(x, y))) << x << "," << y;
         ASSERT_EQ(Hex(line), Hex(canvas.At(x, ch - 1))) << x;
     }
     // The line is a frame grown past the client area: its right side falls
@@ -693,8 +717,7 @@ TEST_F(SurfaceTest, CaptionCases) {
 
     // Visible, with a title far wider than the frame: the close box is drawn
     // last, over the title's left end.
-    HWND floating = Make(TBF_VISIBLE | TBF_FLOATING,
-                         "A title much wider than this small floating frame can ever show");
+    HWND floating = Make(TBF_VISIBLE | TBF_FLOATING, "A title much wider than this small floating frame can ever show");
     HWND shown = ResolveRoleWindow(floating, ROLE_FLOATING);
     ASSERT_TRUE(IsWindowVisible(shown));
     GetClientRect(shown, &client);
@@ -704,7 +727,8 @@ TEST_F(SurfaceTest, CaptionCases) {
     EXPECT_EQ(Hex(RGB(255, 255, 255)), Hex(wide.At(3, (ch - 1) >> 1)));
     int titlePixels = 0;
     for (int x = ch + 1; x < client.right; ++x)
-        for (int y = 0; y < ch - 1; ++y) titlePixels += wide.At(x, y) != band;
+        for (int y = 0; y < ch - 1; ++y)
+            titlePixels += wide.At(x, y) != band;
     EXPECT_GT(titlePixels, 0) << "the title runs across the whole band";
 }
 
@@ -730,7 +754,8 @@ TEST(PaintLifetime, StartsAndEndsLeaveNothingBehind) {
             PaintButton(ItemFindById(m->items, 2), &rect, 0);
             EndButtonPaint();
         }
-        for (ToolbarManager *m : managers) QBR_DestroyManager(m);
+        for (ToolbarManager *m : managers)
+            QBR_DestroyManager(m);
         QBR_Terminate();
         EXPECT_EQ(gdi, LiveGdiObjects()) << "round " << round;
         EXPECT_EQ(blocks, LiveMemoryBlocks()) << "round " << round;

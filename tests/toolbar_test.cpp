@@ -22,10 +22,10 @@ class ToolbarTest : public FrameTest {
         top = MakeDock(DOCK_TOP);
         ASSERT_NE(nullptr, top);
     }
-    HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr, int x = 0,
-              int y = 0, int width = 0) {
-        HWND pane = QBR_CreateToolbar("T", flags, x, y, width, 0, dock ? dock : top, ids.data(),
-                                      static_cast<UINT>(ids.size()));
+    HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr, int x = 0, int y = 0,
+              int width = 0) {
+        HWND pane =
+            QBR_CreateToolbar("T", flags, x, y, width, 0, dock ? dock : top, ids.data(), static_cast<UINT>(ids.size()));
         Pump();
         return pane;
     }
@@ -33,7 +33,8 @@ class ToolbarTest : public FrameTest {
     std::vector<UINT> Ids(HWND pane) {
         std::vector<UINT> out;
         ToolbarRecord *record = RecordOfWindow(pane);
-        for (UINT i = 0; i < PointerListCount(record->items); ++i) out.push_back(ItemAt(record, i)->id);
+        for (UINT i = 0; i < PointerListCount(record->items); ++i)
+            out.push_back(ItemAt(record, i)->id);
         return out;
     }
     // Gives the window of `role` a client area whose item area has this right
@@ -73,13 +74,16 @@ TEST_F(ToolbarTest, WorkedExampleRowsDockedAndFloating) {
         std::vector<RECT> expected;
     };
     const Case cases[] = {
-        {TBF_VISIBLE | TBF_DOCKED, 80,
+        {TBF_VISIBLE | TBF_DOCKED,
+         80,
          {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(6, 25, 16, 47), Rect(15, 25, 39, 47)}},
-        {TBF_VISIBLE | TBF_FLOATING, 80,
+        {TBF_VISIBLE | TBF_FLOATING,
+         80,
          {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), Rect(52, ft, 76, ft + 22), None,
           Rect(6, ft + 22, 30, ft + 44)}},
         // GetItemRect gives a separator its row's height.
-        {TBF_VISIBLE | TBF_DOCKED, 90,
+        {TBF_VISIBLE | TBF_DOCKED,
+         90,
          {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(75, 3, 85, 25), Rect(6, 25, 30, 47)}},
     };
     for (const Case &k : cases) {
@@ -109,9 +113,9 @@ TEST_F(ToolbarTest, HitTestOwnsSharedColumnsAndSeparatorsAreDead) {
         int x, y;
         UINT id; // 0: nothing
     } const cases[] = {
-        {6, 3, 1},   {30, 10, 1}, {31, 10, 2}, {53, 25, 2}, // right and bottom edges count as inside
-        {80, 5, 0},  {80, 20, 0},                           // the separator and the gap under it
-        {6, 26, 4},  {5, 10, 0},  {40, 60, 0},
+        {6, 3, 1},  {30, 10, 1}, {31, 10, 2}, {53, 25, 2}, // right and bottom edges count as inside
+        {80, 5, 0}, {80, 20, 0},                           // the separator and the gap under it
+        {6, 26, 4}, {5, 10, 0},  {40, 60, 0},
     };
     for (const auto &k : cases) {
         UINT id = 999;
@@ -218,11 +222,11 @@ TEST_F(ToolbarTest, InsertionIndexAtPoints) {
         int x, y;
         UINT index;
     } const cases[] = {
-        {20, 10, 0}, {29, 10, 0}, // the right half of a button is still its own index
-        {40, 10, 1}, {80, 5, 4},  // on a separator: behind it
-        {88, 10, 4},              // right of a row: the first item of the next row
-        {50, 1, 0},               // above the first row
-        {60, 30, 5},              // right of the last item of the last row: the count
+        {20, 10, 0},  {29, 10, 0}, // the right half of a button is still its own index
+        {40, 10, 1},  {80, 5, 4},  // on a separator: behind it
+        {88, 10, 4},               // right of a row: the first item of the next row
+        {50, 1, 0},                // above the first row
+        {60, 30, 5},               // right of the last item of the last row: the count
         {10, 200, 5},
     };
     for (const auto &k : cases) {
@@ -277,8 +281,8 @@ TEST_F(ToolbarTest, CreationPlacesTheFrameAndShowsTheRightWindow) {
 
     // "Palette" of the demonstration: 100 wide at (300, 200) wraps into rows
     // and the refit narrows the frame to what the rows need.
-    HWND palette = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING, nullptr, 300,
-                        200, 100);
+    HWND palette =
+        Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING, nullptr, 300, 200, 100);
     HWND paletteFrame = ResolveRoleWindow(palette, ROLE_FLOATING);
     EXPECT_TRUE(IsWindowVisible(paletteFrame));
     EXPECT_FALSE(IsWindowVisible(palette));
@@ -311,7 +315,8 @@ int CountWindows() {
         GetCurrentThreadId(),
         [](HWND w, LPARAM p) -> BOOL {
             ++*reinterpret_cast<int *>(p);
-            EnumChildWindows(w, [](HWND, LPARAM q) -> BOOL { return ++*reinterpret_cast<int *>(q), TRUE; }, p);
+            EnumChildWindows(
+                w, [](HWND, LPARAM q) -> BOOL { return ++*reinterpret_cast<int *>(q), TRUE; }, p);
             return TRUE;
         },
         reinterpret_cast<LPARAM>(&n));
@@ -387,8 +392,8 @@ LRESULT CALLBACK CountingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
 TEST_F(ToolbarTest, ButtonSettersRepaintOnlyOnARealChangeOnEveryToolbar) {
     HWND one = Make({1, 2, 3});
     HWND two = Make({3, 1});
-    originalProc = reinterpret_cast<WNDPROC>(
-        SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc)));
+    originalProc =
+        reinterpret_cast<WNDPROC>(SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc)));
     SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc));
     Pump();
     struct Step {
@@ -397,12 +402,18 @@ TEST_F(ToolbarTest, ButtonSettersRepaintOnlyOnARealChangeOnEveryToolbar) {
         UINT value;
         int paintsEach;
     } const steps[] = {
-        {"on", QBR_SetButtonState, 1, 1},           {"on again", QBR_SetButtonState, 1, 0},
-        {"3 turns it off", QBR_SetButtonState, 3, 1}, {"3 on an off button", QBR_SetButtonState, 3, 0},
-        {"disable", QBR_SetButtonEnabled, 0, 1},    {"enable with 2", QBR_SetButtonEnabled, 2, 1},
-        {"enable again", QBR_SetButtonEnabled, 1, 0}, {"press", QBR_SetButtonPressed, 1, 1},
-        {"press again", QBR_SetButtonPressed, 1, 0}, {"image", QBR_SetButtonImage, 5, 1},
-        {"image again", QBR_SetButtonImage, 5, 1},  {"behaviour", QBR_SetButtonBehaviour, BTN_CHECK, 0},
+        {"on", QBR_SetButtonState, 1, 1},
+        {"on again", QBR_SetButtonState, 1, 0},
+        {"3 turns it off", QBR_SetButtonState, 3, 1},
+        {"3 on an off button", QBR_SetButtonState, 3, 0},
+        {"disable", QBR_SetButtonEnabled, 0, 1},
+        {"enable with 2", QBR_SetButtonEnabled, 2, 1},
+        {"enable again", QBR_SetButtonEnabled, 1, 0},
+        {"press", QBR_SetButtonPressed, 1, 1},
+        {"press again", QBR_SetButtonPressed, 1, 0},
+        {"image", QBR_SetButtonImage, 5, 1},
+        {"image again", QBR_SetButtonImage, 5, 1},
+        {"behaviour", QBR_SetButtonBehaviour, BTN_CHECK, 0},
     };
     for (const Step &s : steps) {
         paints.clear();
@@ -424,13 +435,15 @@ std::vector<int> RowCounts(HWND pane) {
         if (GetItemRect(record, i, &r)) ++rows[r.top];
     }
     std::vector<int> out;
-    for (auto &row : rows) out.push_back(row.second);
+    for (auto &row : rows)
+        out.push_back(row.second);
     return out;
 }
 
 TEST_F(ToolbarTest, ButtonTextKeepsEveryToolbarsRows) {
     std::vector<UINT> fifteen;
-    for (UINT id = 1; id <= 15; ++id) fifteen.push_back(id);
+    for (UINT id = 1; id <= 15; ++id)
+        fifteen.push_back(id);
     // Five buttons a row: an item area of 5 x 23 + 1 pixels.
     int frameWidth = 116 + 12 + 2 * GetSystemMetrics(SM_CXFRAME);
     HWND floating = Make(fifteen, TBF_VISIBLE | TBF_FLOATING, nullptr, 200, 150, frameWidth);

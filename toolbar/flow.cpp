@@ -29,7 +29,9 @@ struct FlowVisitor {
     virtual ~FlowVisitor() = default;
     virtual bool Size(ToolbarItem *item, int *w, int *h) { return ItemGetSize(item, w, h) != 0; }
     virtual void AfterRowHeight(ToolbarItem *, bool /*separator*/, int & /*h*/, int /*rowHeight*/) {}
-    virtual Wrap WrapTest(ToolbarItem *, int x, int w, RECT &area) { return x + w > area.right ? Wrap::NewRow : Wrap::None; }
+    virtual Wrap WrapTest(ToolbarItem *, int x, int w, RECT &area) {
+        return x + w > area.right ? Wrap::NewRow : Wrap::None;
+    }
     virtual void OnNewRow() {}
     virtual bool Place(UINT index, ToolbarItem *item, bool separator, const RECT &rect, int nextX) = 0;
 };
@@ -87,7 +89,8 @@ struct ExtentVisitor : FlowVisitor {
     int nextButtonWidth = 0; // 0: the next entry's own width
     LONG maxRight = 0, maxBottom = 0;
 
-    ExtentVisitor(const PointerList *list, const RECT *edge, bool rule) : items(list), bound(edge), trailingRule(rule) {}
+    ExtentVisitor(const PointerList *list, const RECT *edge, bool rule)
+        : items(list), bound(edge), trailingRule(rule) {}
 
     bool Counts(UINT index, bool separator, int nextX) {
         if (!trailingRule || index + 1 >= PointerListCount(items)) return true;
@@ -351,7 +354,8 @@ HWND FindToolbarAtPoint(ToolbarManager *manager, int x, int y) {
         GetToolbarWindowRect(record->paneWindow, ROLE_ACTIVE, &rect);
         if (record->flags & TBF_DOCKED) ClientRectToScreen(record->dockWindow, &rect);
         if (PointInRectInclusive(&rect, x, y))
-            best = TopmostOfTwo(ResolveRoleWindow(best, ROLE_ACTIVE), ResolveRoleWindow(record->paneWindow, ROLE_ACTIVE));
+            best =
+                TopmostOfTwo(ResolveRoleWindow(best, ROLE_ACTIVE), ResolveRoleWindow(record->paneWindow, ROLE_ACTIVE));
     }
     return best;
 }

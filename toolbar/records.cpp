@@ -158,7 +158,8 @@ extern "C" UINT QBR_IsToolbarVisible(HWND pane) { return RecordIsVisible(RecordO
 
 extern "C" void QBR_GetToolbarTitle(HWND window, LPSTR buffer, int size) {
     if (!buffer || size <= 0) return;
-    HWND frame = (IsToolbarPane(window) || IsFloatingFrame(window)) ? ResolveRoleWindow(window, ROLE_FLOATING) : nullptr;
+    HWND frame =
+        (IsToolbarPane(window) || IsFloatingFrame(window)) ? ResolveRoleWindow(window, ROLE_FLOATING) : nullptr;
     if (!frame || !GetWindowTextA(frame, buffer, size)) buffer[0] = '\0';
 }
 

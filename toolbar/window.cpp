@@ -172,7 +172,8 @@ void GetItemArea(HWND window, int role, RECT *rect) {
     if (role == ROLE_DOCKED)
         *rect = RECT{kAreaLeft, kPaneAreaTop, client.right - kAreaRight, client.bottom - kPaneAreaBottom};
     else
-        *rect = RECT{kAreaLeft, captionHeight + kFrameAreaTop, client.right - kAreaRight, client.bottom - kFrameAreaBottom};
+        *rect =
+            RECT{kAreaLeft, captionHeight + kFrameAreaTop, client.right - kAreaRight, client.bottom - kFrameAreaBottom};
 }
 
 static int Width(const RECT &r) { return r.right - r.left; }
@@ -227,8 +228,8 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
 UINT SizeToolbarWindows(HWND window) {
     HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
     int width, height;
-    UINT ok = IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height)
-                                 : NaturalSizeHorizontal(pane, &width, &height);
+    UINT ok =
+        IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height) : NaturalSizeHorizontal(pane, &width, &height);
     if (!ok) return 0;
     // The margins of the item areas, plus what WS_BORDER takes around the
     // pane and WS_THICKFRAME around the frame: each item area comes out

@@ -29,14 +29,15 @@ std::vector<Heard> &FrameLog() { return frameLog; }
 void ClearFrameLog() { frameLog.clear(); }
 int CountHeard(UINT message) {
     int n = 0;
-    for (const Heard &h : frameLog) n += h.message == message;
+    for (const Heard &h : frameLog)
+        n += h.message == message;
     return n;
 }
 
 std::string Describe(const std::vector<Heard> &messages) {
     std::ostringstream out;
     for (const Heard &h : messages) {
-        const char *name = h.message == WM_COMMAND       ? "WM_COMMAND"
+        const char *name = h.message == WM_COMMAND        ? "WM_COMMAND"
                            : h.message == kPressMessage   ? "press"
                            : h.message == kReleaseMessage ? "release"
                            : h.message == WM_SIZE         ? "WM_SIZE"
@@ -71,8 +72,8 @@ HWND CreateRecordingFrame(int x, int y, int width, int height) {
         wc.lpszClassName = "QbrTestFrame";
         registered = RegisterClassA(&wc) != 0;
     }
-    HWND frame = CreateWindowExA(0, "QbrTestFrame", "Test Frame", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, x, y,
-                                 width, height, nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
+    HWND frame = CreateWindowExA(0, "QbrTestFrame", "Test Frame", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, x, y, width,
+                                 height, nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
     ShowWindow(frame, SW_SHOWNORMAL);
     UpdateWindow(frame);
     Pump();
@@ -110,7 +111,8 @@ void FrameTest::TearDown() {
 
 void FrameTest::AddButtons(UINT first, UINT count) {
     std::vector<UINT> ids;
-    for (UINT i = 0; i < count; ++i) ids.push_back(first + i);
+    for (UINT i = 0; i < count; ++i)
+        ids.push_back(first + i);
     ASSERT_EQ(1u, QBR_AddButtons(manager, ids.data(), count));
 }
 

@@ -19,9 +19,7 @@ struct Heard {
     UINT message;
     WPARAM wParam;
     LPARAM lParam;
-    bool operator==(const Heard &o) const {
-        return message == o.message && wParam == o.wParam && lParam == o.lParam;
-    }
+    bool operator==(const Heard &o) const { return message == o.message && wParam == o.wParam && lParam == o.lParam; }
 };
 std::string Describe(const std::vector<Heard> &messages);
 

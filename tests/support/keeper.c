@@ -1,8 +1,8 @@
 /* Idle keeper: a Wine process that has used user32 and stays alive, so that
    every later program starts without Wine restarting its desktop process.
    Writes the file named by its argument once it is up. */
-#include <windows.h>
 #include <stdio.h>
+#include <windows.h>
 
 int main(int argc, char **argv) {
     GetDesktopWindow();
@@ -13,6 +13,7 @@ int main(int argc, char **argv) {
             fclose(f);
         }
     }
-    for (;;) Sleep(60000);
+    for (;;)
+        Sleep(60000);
     return 0;
 }

@@ -4,10 +4,10 @@
      qbr_ctl close TITLE       post WM_CLOSE to it (as a user's close does)
      qbr_ctl zorder            list visible top-level windows, topmost first
      qbr_ctl rect TITLE        print its outer rectangle (left top right bottom) and 1 if visible */
-#include <windows.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
+#include <windows.h>
 
 int main(int argc, char **argv) {
     HWND window;

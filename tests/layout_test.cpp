@@ -1,0 +1,147 @@
+// The layout table: capture of a frame's arrangement, its text format, and
+// building docks and toolbars back from it, also from damaged values.
+#include <cstdio>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "core/core.h"
+#include "harness.h"
+#include "paint/paint.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+using Entries = std::vector<std::pair<std::string, std::string>>;
+
+Entries Capture(ToolbarManager *manager) {
+    UINT count = 0;
+    Entries out;
+    if (!QBR_CaptureLayout(manager, &count)) return out;
+    // The entry call has no bound: the buffers must hold what the damaged
+    // lines below can make (thousands of ids).
+    std::vector<char> key(1 << 16), value(1 << 20);
+    for (UINT i = 0; i < count; ++i) {
+        QBR_GetLayoutEntry(i, key.data(), value.data());
+        out.emplace_back(key.data(), value.data());
+    }
+    QBR_FreeLayout();
+    return out;
+}
+
+void Apply(ToolbarManager *manager, HWND frame, const Entries &entries) {
+    ASSERT_EQ(1u, QBR_BeginLayout());
+    for (const auto &e : entries)
+        ASSERT_EQ(1u, QBR_AddLayoutEntry(e.first.c_str(), e.second.c_str()));
+    EXPECT_EQ(1u, QBR_ApplyLayout(manager, frame));
+    QBR_FreeLayout();
+    Pump();
+}
+
+class LayoutTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(101, 10);
+    }
+    // A second frame and manager with the same catalog, to restore into.
+    ToolbarManager *SecondManager() {
+        other = CreateRecordingFrame(80, 80);
+        ToolbarManager *m = QBR_CreateManager(other);
+        std::vector<UINT> ids;
+        for (UINT id = 101; id < 111; ++id)
+            ids.push_back(id);
+        QBR_AddButtons(m, ids.data(), 10);
+        return m;
+    }
+    void TearDown() override {
+        if (otherManager) QBR_DestroyManager(otherManager);
+        if (other) DestroyWindow(other);
+        FrameTest::TearDown();
+    }
+    HWND other = nullptr;
+    ToolbarManager *otherManager = nullptr;
+};
+
+TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
+    HWND top = MakeDock(DOCK_TOP);
+    const UINT standard[] = {101, 102, 0, 103};
+    const UINT floating[] = {104, 105};
+    QBR_CreateToolbar("Standard", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, standard, 4);
+    QBR_CreateToolbar("Float", TBF_VISIBLE | TBF_FLOATING | TBF_USER_CREATED, 300, 100, 0, 0, top, floating, 2);
+    HWND left = MakeDock(DOCK_LEFT);
+    const UINT column[] = {106};
+    QBR_CreateToolbar("Column", TBF_HIDDEN | TBF_DOCKED, 0, 0, 0, 0, left, column, 1);
+    Pump();
+    int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME);
+    // Natural widths: buttons advance 23, a separator 9, plus the last column.
+    int standardNatural = 3 * 23 + 9 + 1, floatNatural = 2 * 23 + 1;
+    Entries entries = Capture(manager);
+    char expected[256];
+    ASSERT_EQ(5u, entries.size());
+    EXPECT_EQ((std::pair<std::string, std::string>{"Top Dock", "Standard,Float"}), entries[0]);
+    std::snprintf(expected, sizeof(expected), "4,101,102,0,103,17,0,0,%d,%d", standardNatural + 12 + 2 * fx,
+                  22 + 6 + 2 * fy + captionHeight);
+    EXPECT_EQ("Standard", entries[1].first);
+    EXPECT_EQ(std::string(expected), entries[1].second);
+    std::snprintf(expected, sizeof(expected), "2,104,105,32801,300,100,%d,%d", 300 + floatNatural + 12 + 2 * fx,
+                  100 + 22 + 6 + 2 * fy + captionHeight);
+    EXPECT_EQ((std::pair<std::string, std::string>{"Float", expected}), entries[2]);
+    EXPECT_EQ((std::pair<std::string, std::string>{"Left Dock", "Column"}), entries[3]);
+    EXPECT_EQ("Column", entries[4].first);
+
+    otherManager = SecondManager();
+    Apply(otherManager, other, entries);
+    EXPECT_EQ(3u, QBR_GetToolbarCount(otherManager));
+    EXPECT_EQ(entries, Capture(otherManager)) << "a restore followed by a capture gives the same table";
+    HWND restoredFloat = QBR_GetToolbar(otherManager, 1);
+    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING | TBF_USER_CREATED), QBR_GetToolbarFlags(restoredFloat));
+    EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(restoredFloat, ROLE_FLOATING)));
+    EXPECT_EQ(nullptr, QBR_GetDock(otherManager, DOCK_RIGHT)) << "no key, no dock";
+}
+
+TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
+    otherManager = SecondManager();
+    std::string huge(5000, '9');
+    Entries entries = {
+        {"Top Dock", "Short,Long,Words,Missing,Negative,Huge,,Short"},
+        {"Short", "3,101"},                           // stops early: the rest reads 0
+        {"Long", "1,101,102,103,17,0,0,50,50"},       // count too small: ids read as flags
+        {"Words", "x,abc,17,-5,y"},                   // not numbers
+        {"Negative", "-4,101,33,-300,-200,-100,-50"}, // a negative count
+        {"Huge", "2147483647," + huge},               // an enormous count and number
+        {"Unknown Key", "1,101,17,0,0,0,0"},          // named by no dock
+        {"Right Dock", ""},                           // an empty dock value
+    };
+    Apply(otherManager, other, entries);
+    HWND right = QBR_GetDock(otherManager, DOCK_RIGHT);
+    EXPECT_NE(nullptr, right) << "a dock key with an empty value makes an empty dock";
+    // The program keeps working: a fresh capture succeeds and names every
+    // toolbar the dock value named that had a line.
+    Entries again = Capture(otherManager);
+    ASSERT_FALSE(again.empty());
+    EXPECT_EQ("Top Dock", again[0].first);
+    EXPECT_NE(std::string::npos, again[0].second.find("Negative"));
+    // Toolbars in the order the dock value names them; "Missing" and the
+    // empty title have no line, and the second "Short" finds its value used up.
+    ASSERT_EQ(6u, QBR_GetToolbarCount(otherManager));
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 0))) << "a line that stops early: flags 0";
+    EXPECT_EQ(102u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 1))) << "a count too small: ids read as flags";
+    EXPECT_EQ(101u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 3))) << "a negative count reads no ids";
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 5)));
+    EXPECT_FALSE(IsWindowVisible(QBR_GetToolbar(otherManager, 0)));
+}
+
+TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
+    EXPECT_TRUE(Capture(manager).empty());
+    MakeDock(DOCK_TOP);
+    Entries entries = Capture(manager);
+    ASSERT_EQ(1u, entries.size());
+    EXPECT_EQ((std::pair<std::string, std::string>{"Top Dock", ""}), entries[0]);
+    char key[8] = "x", value[8] = "y";
+    EXPECT_EQ(1u, QBR_GetLayoutEntry(5, key, value)) << "past the table: empty strings";
+    EXPECT_STREQ("", key);
+}
+
+} // namespace
