@@ -505,3 +505,36 @@ TEST(ToolbarLeakTest, ToolbarsAndManagersReleaseEverything) {
     }
     EXPECT_EQ(blocks, LiveMemoryBlocks());
 }
+
+namespace {
+
+// Whether `window` stands above `other` among the top-level windows.
+bool Above(HWND window, HWND other) {
+    for (HWND w = GetTopWindow(nullptr); w; w = GetWindow(w, GW_HWNDNEXT)) {
+        if (w == window) return true;
+        if (w == other) return false;
+    }
+    return false;
+}
+
+TEST_F(ToolbarTest, FloatingFramesStandAboveTheirHostFrame) {
+    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_FLOATING, nullptr, 100, 100);
+    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+    Pump();
+    EXPECT_EQ(frame, GetWindow(floating, GW_OWNER));
+    EXPECT_TRUE(Above(floating, frame)) << "shown while the host frame is on screen";
+    SetActiveWindow(frame);
+    SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
+    Pump();
+    EXPECT_TRUE(Above(floating, frame)) << "after the host frame was raised";
+
+    // A host that builds its toolbars before it shows its frame.
+    ShowWindow(frame, SW_HIDE);
+    HWND early = Make({3, 4}, TBF_VISIBLE | TBF_FLOATING, nullptr, 150, 150);
+    ShowWindow(frame, SW_SHOWNORMAL);
+    UpdateWindow(frame);
+    Pump();
+    EXPECT_TRUE(Above(ResolveRoleWindow(early, ROLE_FLOATING), frame)) << "shown before the host frame was";
+}
+
+} // namespace
