@@ -527,14 +527,6 @@ TEST_F(ToolbarTest, FloatingFramesStandAboveTheirHostFrame) {
     SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
     Pump();
     EXPECT_TRUE(Above(floating, frame)) << "after the host frame was raised";
-
-    // A host that builds its toolbars before it shows its frame.
-    ShowWindow(frame, SW_HIDE);
-    HWND early = Make({3, 4}, TBF_VISIBLE | TBF_FLOATING, nullptr, 150, 150);
-    ShowWindow(frame, SW_SHOWNORMAL);
-    UpdateWindow(frame);
-    Pump();
-    EXPECT_TRUE(Above(ResolveRoleWindow(early, ROLE_FLOATING), frame)) << "shown before the host frame was";
 }
 
 } // namespace
