@@ -350,9 +350,7 @@ TEST_F(ManagerTest, ButtonSettersCompareFirst) {
     // Mixed and on are never set together.
     QBR_SetButtonState(manager, 2, 2);
     QBR_SetButtonState(manager, 2, 1);
-    EXPECT_EQ(static_cast<UINT>(BS_ON), ItemFindById(manager->items, 2)->data
-                                            ? static_cast<ButtonData *>(ItemFindById(manager->items, 2)->data)->state
-                                            : 0);
+    EXPECT_EQ(static_cast<UINT>(BS_ON), static_cast<ButtonData *>(ItemFindById(manager->items, 2)->data)->state);
     for (auto set :
          {QBR_SetButtonState, QBR_SetButtonEnabled, QBR_SetButtonPressed, QBR_SetButtonBehaviour, QBR_SetButtonImage}) {
         EXPECT_EQ(0u, set(manager, 0, 1)) << "the separator is no button";

@@ -168,6 +168,13 @@ class DockPackTest : public FrameTest {
         ASSERT_NE(nullptr, record);
     }
     // A docked visible toolbar of `count` buttons starting at `first`.
+    // Three toolbars of 30, 12 and 8 buttons: the first two share a row at
+    // the full-screen limit, the third may wrap.
+    void ThreeToolbars(HWND t[3]) {
+        t[0] = Toolbar(1, 30);
+        t[1] = Toolbar(31, 12);
+        t[2] = Toolbar(43, 8);
+    }
     HWND Toolbar(UINT first, UINT count, UINT flags = TBF_VISIBLE | TBF_DOCKED) {
         std::vector<UINT> ids;
         for (UINT i = 0; i < count; ++i)
@@ -188,9 +195,9 @@ class DockPackTest : public FrameTest {
 // buttons, so the expectations follow the measured panes.
 TEST_F(DockPackTest, PacksRowsWithSharedBordersAndWraps) {
     const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
-    HWND t1 = Toolbar(1, 30);
-    HWND t2 = Toolbar(31, 12);
-    HWND t3 = Toolbar(43, 8);
+    HWND t[3];
+    ThreeToolbars(t);
+    HWND t1 = t[0], t2 = t[1], t3 = t[2];
     const RECT r1 = WindowRectInParent(t1), r2 = WindowRectInParent(t2), r3 = WindowRectInParent(t3);
     const int w1 = W(r1), w2 = W(r2), w3 = W(r3), h = H(r1);
     ASSERT_EQ(h, H(r2));
@@ -335,9 +342,9 @@ TEST_F(DockPackTest, WmSizeOnlyWhenAVisibleDockChanged) {
 
 TEST_F(DockPackTest, DockInsertionIndexForPointsAroundThePanes) {
     const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
-    HWND t1 = Toolbar(1, 30);
-    HWND t2 = Toolbar(31, 12);
-    HWND t3 = Toolbar(43, 8);
+    HWND t[3];
+    ThreeToolbars(t);
+    HWND t1 = t[0], t2 = t[1], t3 = t[2];
     const RECT r1 = WindowRectInParent(t1), r2 = WindowRectInParent(t2), r3 = WindowRectInParent(t3);
     const bool wrapped = r3.top > r1.top;
     struct Case {

@@ -72,13 +72,18 @@ FlowRules ActiveRules(const ToolbarRecord *record) {
     return {HasFlags(record, TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS), HasFlags(record, TBF_FLOATING)};
 }
 
+// Hit testing, painting and item rectangles describe the window on show.
+void WalkActiveWindow(const ToolbarRecord *record, FlowVisitor &visitor) {
+    RECT area;
+    GetItemArea(record->paneWindow, ROLE_ACTIVE, &area);
+    FlowWalk(record->items, area, ActiveRules(record), visitor);
+}
+
 // The measuring members go by the role they are given.
 FlowRules RoleRules(const ToolbarRecord *record, int role) {
     bool floating = role == ROLE_FLOATING;
     return {floating && HasFlags(record, TBF_NO_FLOAT_SEPARATORS), floating};
 }
-
-ToolbarRecord *PaneRecord(HWND window) { return RecordOfWindow(window); }
 
 // Extents of the placed items, with an optional trailing-separator rule: a
 // separator that ends a row because its neighbour wraps widens nothing.
@@ -123,7 +128,7 @@ void OneButton(RECT *rect, int width, int height) {
 } // namespace
 
 ToolbarItem *HitTestToolbar(HWND pane, int x, int y, UINT *outId, RECT *outRect) {
-    ToolbarRecord *record = PaneRecord(pane);
+    ToolbarRecord *record = RecordOfWindow(pane);
     if (!record || !PointerListCount(record->items)) return nullptr;
     struct Hit : FlowVisitor {
         int x, y;
@@ -140,9 +145,7 @@ ToolbarItem *HitTestToolbar(HWND pane, int x, int y, UINT *outId, RECT *outRect)
     } hit;
     hit.x = x;
     hit.y = y;
-    RECT area;
-    GetItemArea(record->paneWindow, ROLE_ACTIVE, &area);
-    FlowWalk(record->items, area, ActiveRules(record), hit);
+    WalkActiveWindow(record, hit);
     // A separator is a dead spot: the walk stops there all the same.
     if (!hit.item || hit.separator) return nullptr;
     if (outRect) *outRect = hit.rect;
@@ -151,7 +154,7 @@ ToolbarItem *HitTestToolbar(HWND pane, int x, int y, UINT *outId, RECT *outRect)
 }
 
 UINT PaintToolbarItems(HWND pane) {
-    ToolbarRecord *record = pane ? PaneRecord(pane) : nullptr;
+    ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     if (!record) return 0;
     struct Painter : FlowVisitor {
         bool Place(UINT, ToolbarItem *item, bool separator, const RECT &rect, int) override {
@@ -159,9 +162,7 @@ UINT PaintToolbarItems(HWND pane) {
             return false;
         }
     } painter;
-    RECT area;
-    GetItemArea(record->paneWindow, ROLE_ACTIVE, &area);
-    FlowWalk(record->items, area, ActiveRules(record), painter);
+    WalkActiveWindow(record, painter);
     return 1;
 }
 
@@ -185,15 +186,13 @@ UINT GetItemRect(const ToolbarRecord *record, UINT index, RECT *outRect) {
     } finder;
     finder.index = index;
     finder.out = outRect;
-    RECT area;
-    GetItemArea(record->paneWindow, ROLE_ACTIVE, &area);
-    FlowWalk(record->items, area, ActiveRules(record), finder);
+    WalkActiveWindow(record, finder);
     return finder.found ? 1 : 0;
 }
 
 // Natural sizes: the toolbar with nothing wrapped, along or across.
 static UINT NaturalSize(HWND pane, bool vertical, int *outWidth, int *outHeight) {
-    ToolbarRecord *record = PaneRecord(pane);
+    ToolbarRecord *record = RecordOfWindow(pane);
     if (!record) return 0;
     FlowRules rules = ActiveRules(record);
     int along = 0, across = 0;
@@ -221,7 +220,7 @@ UINT NaturalSizeVertical(HWND pane, int *outWidth, int *outHeight) {
 }
 
 UINT MeasureToFit(HWND pane, int role, RECT *rect) {
-    ToolbarRecord *record = pane ? PaneRecord(pane) : nullptr;
+    ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     if (!record) return 0;
     if (!PointerListCount(record->items)) {
         int w = 0, h = 0;
@@ -237,7 +236,7 @@ UINT MeasureToFit(HWND pane, int role, RECT *rect) {
 }
 
 UINT MeasureAfterDrop(HWND pane, int role, ToolbarItem *dropped, RECT *rect) {
-    ToolbarRecord *record = pane ? PaneRecord(pane) : nullptr;
+    ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     if (!record) return 0;
     // In the top dock an inserted item makes its row longer instead of
     // wrapping: the first item at or after it that would wrap pushes the
@@ -269,7 +268,7 @@ UINT MeasureAfterDrop(HWND pane, int role, ToolbarItem *dropped, RECT *rect) {
 }
 
 UINT ComputeRowBreaks(HWND window, int role) {
-    ToolbarRecord *record = window ? PaneRecord(window) : nullptr;
+    ToolbarRecord *record = window ? RecordOfWindow(window) : nullptr;
     if (!record) return 0;
     PointerList *&breaks = role == ROLE_FLOATING ? record->floatingBreaks : record->dockedBreaks;
     PointerListDestroy(breaks);
@@ -296,7 +295,7 @@ UINT ComputeRowBreaks(HWND window, int role) {
 }
 
 UINT RewrapForMetrics(HWND window, int role, int newWidth, int newHeight, RECT *rect) {
-    ToolbarRecord *record = window ? PaneRecord(window) : nullptr;
+    ToolbarRecord *record = window ? RecordOfWindow(window) : nullptr;
     if (!record) return 0;
     if (!PointerListCount(record->items)) {
         OneButton(rect, newWidth, newHeight);
