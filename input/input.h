@@ -32,5 +32,7 @@ void OnToolbarRightUp(HWND window, int x, int y, UINT keys);
 void OnToolbarMouseMove(HWND window, int x, int y, UINT keys);
 
 void DrawDragFrame(const RECT *rect);
+// Erases the frame, moves it by the cursor's travel in screen coordinates and draws it again.
+void FollowDragFrame(HWND window, int x, int y);
 void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar);
 void OnToolbarCommand(HWND window, UINT id);
