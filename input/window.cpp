@@ -140,6 +140,9 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
     case WM_RBUTTONUP:
         WithCursor(window, wParam, OnToolbarRightUp);
         return 0;
+    case WM_TIMER:
+        if (wParam == kWaitForOwnerTimer || wParam == kSettleTimer) OnRestackTimer(window, wParam);
+        return 0;
     }
     return DefWindowProcA(window, message, wParam, lParam);
 }

@@ -529,4 +529,24 @@ TEST_F(ToolbarTest, FloatingFramesStandAboveTheirHostFrame) {
     EXPECT_TRUE(Above(floating, frame)) << "after the host frame was raised";
 }
 
+// A host builds its toolbars in WM_CREATE, before its frame is on screen; the
+// floating frames must still end up above it once it shows and is activated.
+TEST_F(ToolbarTest, FloatingFramesMadeBeforeTheirHostShowsEndAboveIt) {
+    HWND host = CreateWindowExA(0, "QbrTestFrame", "Hidden Host", WS_OVERLAPPEDWINDOW, 60, 60, 500, 400, nullptr,
+                                nullptr, GetModuleHandleA(nullptr), nullptr);
+    ToolbarManager *hostManager = QBR_CreateManager(host);
+    HWND dock = QBR_CreateDock(hostManager, host, DOCK_TOP);
+    const UINT ids[] = {1, 2};
+    HWND pane = QBR_CreateToolbar("Early", TBF_VISIBLE | TBF_FLOATING, 100, 100, 0, 0, dock, ids, 2);
+    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+    ShowWindow(host, SW_SHOWNORMAL);
+    UpdateWindow(host);
+    PumpFor(1000); // the window system raises the host on its own time; then the frame settles
+    EXPECT_TRUE(IsWindowVisible(floating));
+    EXPECT_TRUE(Above(floating, host));
+    QBR_DestroyManager(hostManager);
+    DestroyWindow(host);
+    Pump();
+}
+
 } // namespace

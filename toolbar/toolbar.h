@@ -79,6 +79,13 @@ UINT SizeToolbarWindows(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);
+// Timers of a floating frame shown while its owner was hidden: the first
+// waits for the owner to show, the second lets it settle before the frame
+// goes back above it.
+constexpr UINT_PTR kWaitForOwnerTimer = 0x5101;
+constexpr UINT_PTR kSettleTimer = 0x5102;
+constexpr UINT kRestackPeriod = 250;
+void OnRestackTimer(HWND frame, UINT_PTR timer);
 UINT SwitchToFloating(HWND window);
 UINT SwitchToDocked(HWND window);
 UINT RewrapAllManagers(int newWidth, int newHeight);

@@ -276,11 +276,32 @@ UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item) { return Refi
 // Shows a toolbar window without activating it. A floating frame also goes
 // to the top: showing alone keeps its old place in the z-order, which may be
 // below its owner if it was last placed while the owner was hidden.
+//
+// A host builds its toolbars while its frame is still hidden (in WM_CREATE).
+// When that frame shows, the window system may raise it later, on its own
+// time and without a message to anyone, over the floating frames shown
+// before it. So a frame shown under a hidden owner watches for the owner to
+// appear, lets it settle, and then takes its place above it again.
 static void ShowWithoutActivating(HWND window) {
-    if (IsFloatingFrame(window))
-        SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE | SWP_SHOWWINDOW);
-    else
+    if (!IsFloatingFrame(window)) {
         ShowWindow(window, SW_SHOWNA);
+        return;
+    }
+    SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE | SWP_SHOWWINDOW);
+    HWND owner = GetWindow(window, GW_OWNER);
+    if (owner && !IsWindowVisible(owner)) SetTimer(window, kWaitForOwnerTimer, kRestackPeriod, nullptr);
+}
+
+void OnRestackTimer(HWND frame, UINT_PTR timer) {
+    KillTimer(frame, timer);
+    HWND owner = GetWindow(frame, GW_OWNER);
+    if (!owner || !IsWindow(owner)) return;
+    if (timer == kWaitForOwnerTimer) {
+        SetTimer(frame, IsWindowVisible(owner) ? kSettleTimer : kWaitForOwnerTimer, kRestackPeriod, nullptr);
+        return;
+    }
+    if (IsWindowVisible(frame))
+        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
 }
 
 UINT ShowToolbarWindow(HWND window, UINT show) {

@@ -29,6 +29,13 @@ read -r l t r b v <<<"$(ctl rect Palette)"
 [ $((b - t)) -gt 80 ] || fail "Palette not wrapped into rows: height $((b - t))"
 read -r l t r b v <<<"$(ctl rect Standard)"
 [ "$v" = "0" ] || fail "Standard starts docked, its floating frame hidden"
+# A person must see them: each floating frame above the main window.
+order=$(ctl zorder)
+main_at=$(grep -n '^Quaybar Demo$' <<<"$order" | cut -d: -f1)
+for title in Align Palette; do
+    at=$(grep -n "^$title owned by" <<<"$order" | cut -d: -f1)
+    [ -n "$at" ] && [ "$at" -lt "$main_at" ] || fail "$title is not above the main window: $order"
+done
 /usr/bin/import -display "$DISPLAY" -window root "$out/demo-start.png"
 
 # View > Button Text with real keys, as a person without a mouse would.
