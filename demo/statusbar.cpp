@@ -84,6 +84,16 @@ LRESULT OnPaint(HWND window) {
     return 0;
 }
 
+// The line is also the bar's text, so that screen readers and test tools
+// read what the user sees.
+LRESULT OnGetText(HWND window, WPARAM size, LPARAM lParam) {
+    const char *text = BufferOf(window);
+    char *out = reinterpret_cast<char *>(lParam);
+    if (!text || !out || size == 0) return 0;
+    std::snprintf(out, size, "%s", text);
+    return static_cast<LRESULT>(std::strlen(out));
+}
+
 } // namespace
 
 UINT RegisterStatusBarClass() {
@@ -144,6 +154,10 @@ LRESULT CALLBACK StatusBarProc(HWND window, UINT message, WPARAM wParam, LPARAM 
         return OnDestroy(window);
     case WM_PAINT:
         return OnPaint(window);
+    case WM_GETTEXT:
+        return OnGetText(window, wParam, lParam);
+    case WM_GETTEXTLENGTH:
+        return BufferOf(window) ? static_cast<LRESULT>(std::strlen(BufferOf(window))) : 0;
     }
     return DefWindowProcA(window, message, wParam, lParam);
 }
