@@ -14,18 +14,33 @@ LPCSTR SettingsPath() {
     return path;
 }
 
-// Values and key lists are read into room for far more than one line of 255
-// characters: a frame with many toolbars writes longer lines, and cutting
-// them would lose the user's arrangement.
-constexpr DWORD kProfileRoom = 32768;
+// A profile string read whole, whatever its length: a frame with many
+// toolbars writes lines far longer than one screen line, and cutting one
+// would lose the user's arrangement. Empty when the key or section is missing.
+static std::vector<char> ReadProfile(LPCSTR section, LPCSTR key) {
+    constexpr DWORD kFirstRoom = 4096;
+    constexpr DWORD kMostRoom = 64u << 20; // a damaged file gets no more than this
+    std::vector<char> text;
+    for (DWORD room = kFirstRoom; room <= kMostRoom; room *= 4) {
+        text.assign(room, '\0');
+        DWORD length = GetPrivateProfileStringA(section, key, "", text.data(), room, SettingsPath());
+        // A cut string comes back with room - 1 (a list of keys: room - 2) characters.
+        if (length < room - 2) return text;
+    }
+    return text;
+}
 
 void SaveLayout(ToolbarManager *manager, LPCSTR section) {
     UINT count = 0;
     // A failed capture leaves the stored layout alone.
     if (!manager || !QBR_CaptureLayout(manager, &count)) return;
     WritePrivateProfileStringA(section, nullptr, nullptr, SettingsPath());
-    std::vector<char> key(kProfileRoom), value(kProfileRoom);
+    std::vector<char> key, value;
     for (UINT i = 0; i < count; ++i) {
+        UINT keyLength = 0, valueLength = 0;
+        QBR_GetLayoutEntrySize(i, &keyLength, &valueLength);
+        key.assign(keyLength + 1, '\0');
+        value.assign(valueLength + 1, '\0');
         QBR_GetLayoutEntry(i, key.data(), value.data());
         WritePrivateProfileStringA(section, key.data(), value.data(), SettingsPath());
     }
@@ -33,12 +48,13 @@ void SaveLayout(ToolbarManager *manager, LPCSTR section) {
 }
 
 UINT RestoreLayout(ToolbarManager *manager, HWND frame, LPCSTR section) {
-    std::vector<char> keys(kProfileRoom), value(kProfileRoom);
-    if (!GetPrivateProfileStringA(section, nullptr, "", keys.data(), kProfileRoom - 1, SettingsPath())) return 0;
+    std::vector<char> keys = ReadProfile(section, nullptr);
+    if (!keys[0]) return 0;
     QBR_BeginLayout();
     for (const char *key = keys.data(); *key; key += lstrlenA(key) + 1) {
+        std::vector<char> value = ReadProfile(section, key);
         // An empty value reads like a missing key and is passed over.
-        if (!GetPrivateProfileStringA(section, key, "", value.data(), kProfileRoom - 1, SettingsPath())) continue;
+        if (!value[0]) continue;
         if (!QBR_AddLayoutEntry(key, value.data())) return 0;
     }
     UINT result = QBR_ApplyLayout(manager, frame);

@@ -121,6 +121,9 @@ void QBR_DestroyDock(HWND window);
 /* The layout table: the arrangement of one manager as text keys and values. */
 UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count);
 UINT QBR_GetLayoutEntry(UINT index, LPSTR key, LPSTR value);
+/* The lengths of entry `index`'s key and value, without terminators, so that a
+   host can size its buffers before QBR_GetLayoutEntry. 0 for a bad index. */
+UINT QBR_GetLayoutEntrySize(UINT index, UINT *keyLength, UINT *valueLength);
 void QBR_FreeLayout(void);
 UINT QBR_BeginLayout(void);
 UINT QBR_AddLayoutEntry(LPCSTR key, LPCSTR value);

@@ -72,6 +72,15 @@ extern "C" UINT QBR_GetLayoutEntry(UINT index, LPSTR key, LPSTR value) {
     return 1;
 }
 
+extern "C" UINT QBR_GetLayoutEntrySize(UINT index, UINT *keyLength, UINT *valueLength) {
+    if (keyLength) *keyLength = 0;
+    if (valueLength) *valueLength = 0;
+    if (index >= layoutCount) return 0;
+    if (keyLength) *keyLength = static_cast<UINT>(lstrlenA(layoutKeys[index]));
+    if (valueLength) *valueLength = static_cast<UINT>(lstrlenA(layoutValues[index]));
+    return 1;
+}
+
 // ---- Capture --------------------------------------------------------------------
 
 UINT FormatToolbarLayout(ToolbarRecord *toolbar, LPSTR *key, LPSTR *value) {

@@ -19,12 +19,16 @@ Entries Capture(ToolbarManager *manager) {
     UINT count = 0;
     Entries out;
     if (!QBR_CaptureLayout(manager, &count)) return out;
-    // The entry call has no bound: the buffers must hold what the damaged
-    // lines below can make (thousands of ids).
-    std::vector<char> key(1 << 16), value(1 << 20);
+    // The entry call has no bound: the sizes say how much room each takes,
+    // and a wrong size would show as a cut string or a damaged heap.
     for (UINT i = 0; i < count; ++i) {
+        UINT keyLength = 0, valueLength = 0;
+        EXPECT_EQ(1u, QBR_GetLayoutEntrySize(i, &keyLength, &valueLength));
+        std::vector<char> key(keyLength + 1, '#'), value(valueLength + 1, '#');
         QBR_GetLayoutEntry(i, key.data(), value.data());
         out.emplace_back(key.data(), value.data());
+        EXPECT_EQ(keyLength, out.back().first.size());
+        EXPECT_EQ(valueLength, out.back().second.size());
     }
     QBR_FreeLayout();
     return out;
@@ -142,6 +146,9 @@ TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
     char key[8] = "x", value[8] = "y";
     EXPECT_EQ(1u, QBR_GetLayoutEntry(5, key, value)) << "past the table: empty strings";
     EXPECT_STREQ("", key);
+    UINT keyLength = 7, valueLength = 7;
+    EXPECT_EQ(0u, QBR_GetLayoutEntrySize(5, &keyLength, &valueLength));
+    EXPECT_EQ(0u, keyLength + valueLength);
 }
 
 } // namespace
