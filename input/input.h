@@ -31,6 +31,11 @@ void OnToolbarRightDown(HWND window, int x, int y, UINT keys);
 void OnToolbarRightUp(HWND window, int x, int y, UINT keys);
 void OnToolbarMouseMove(HWND window, int x, int y, UINT keys);
 
+// The toolbar drag: a left press off the buttons starts it, the left release
+// drops the toolbar. Points are in the client coordinates of `window`.
+void BeginToolbarDrag(HWND window, int x, int y);
+void DropToolbar(HWND window, int x, int y);
+
 void DrawDragFrame(const RECT *rect);
 // Erases the frame, moves it by the cursor's travel in screen coordinates and draws it again.
 void FollowDragFrame(HWND window, int x, int y);

@@ -175,3 +175,61 @@ Pixels ReadWindowPixels(HWND window) {
 std::ostream &operator<<(std::ostream &out, const RECT &r) {
     return out << "(" << r.left << "," << r.top << "," << r.right << "," << r.bottom << ")";
 }
+
+static bool CursorAt(POINT p) {
+    POINT now;
+    return GetCursorPos(&now) && now.x == p.x && now.y == p.y;
+}
+
+void PlaceCursor(POINT p) {
+    for (int attempt = 0; attempt < 50; ++attempt) {
+        SetCursorPos(p.x, p.y);
+        PumpFor(5);
+        if (!CursorAt(p)) continue;
+        PumpFor(5);
+        if (CursorAt(p)) return;
+    }
+    ADD_FAILURE() << "the cursor does not stay at " << p.x << "," << p.y;
+}
+
+HWND SendMouse(UINT message, POINT p, WPARAM keys) {
+    PlaceCursor(p);
+    HWND window = GetCapture();
+    if (!window) window = WindowFromPoint(p);
+    POINT c = p;
+    ScreenToClient(window, &c);
+    SendMessageA(window, message, keys, MAKELPARAM(c.x, c.y));
+    Pump();
+    return window;
+}
+
+Pixels ReadScreenPixels(const RECT &rect) {
+    Pixels out;
+    out.width = rect.right - rect.left;
+    out.height = rect.bottom - rect.top;
+    if (out.width <= 0 || out.height <= 0) return out;
+    HDC screen = GetDC(nullptr);
+    HDC memory = CreateCompatibleDC(screen);
+    BITMAPINFO info = {};
+    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
+    info.bmiHeader.biWidth = out.width;
+    info.bmiHeader.biHeight = -out.height; // top-down
+    info.bmiHeader.biPlanes = 1;
+    info.bmiHeader.biBitCount = 32;
+    void *bits = nullptr;
+    HBITMAP dib = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
+    HGDIOBJ old = SelectObject(memory, dib);
+    BitBlt(memory, 0, 0, out.width, out.height, screen, rect.left, rect.top, SRCCOPY);
+    GdiFlush();
+    out.colors.resize(static_cast<size_t>(out.width) * out.height);
+    auto *raw = static_cast<const DWORD *>(bits);
+    for (size_t i = 0; i < out.colors.size(); ++i) {
+        DWORD p = raw[i]; // 0x00RRGGBB
+        out.colors[i] = RGB((p >> 16) & 0xff, (p >> 8) & 0xff, p & 0xff);
+    }
+    SelectObject(memory, old);
+    DeleteObject(dib);
+    DeleteDC(memory);
+    ReleaseDC(nullptr, screen);
+    return out;
+}

@@ -77,3 +77,14 @@ inline bool operator==(const RECT &a, const RECT &b) {
     return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
 }
 std::ostream &operator<<(std::ostream &out, const RECT &r);
+
+// ---- The real cursor and the screen -----------------------------------------
+// Puts the cursor at a screen point and waits until it stays there: Wine's X
+// driver can deliver the motion of an earlier warp late and put it back.
+void PlaceCursor(POINT p);
+// Puts the cursor at `p` and sends a mouse message where the window system
+// would: to the window holding the capture, else to the window under the
+// cursor, with `p` in its client coordinates. Pumps after. Gives the window.
+HWND SendMouse(UINT message, POINT p, WPARAM keys);
+// A rectangle of the screen itself (GetDC(NULL)), colours as COLORREF.
+Pixels ReadScreenPixels(const RECT &rect);

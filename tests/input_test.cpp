@@ -1,0 +1,563 @@
+// The left mouse button on real toolbars: the real cursor is put in place and
+// each mouse message goes where the window system would send it. The tests
+// look at what the host frame heard, button states and looks, where toolbars
+// went, and the drag frame on the screen itself.
+#include <algorithm>
+#include <string>
+#include <vector>
+
+#include "core/core.h"
+#include "dock/dock.h"
+#include "harness.h"
+#include "input/input.h"
+#include "paint/paint.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+POINT ScreenOf(HWND window, int x, int y) {
+    POINT p = {x, y};
+    ClientToScreen(window, &p);
+    return p;
+}
+POINT Offset(POINT p, int dx, int dy) { return POINT{p.x + dx, p.y + dy}; }
+
+void Mouse(UINT message, POINT p) {
+    SendMouse(message, p, message == WM_LBUTTONUP || message == WM_MOUSEMOVE ? 0 : MK_LBUTTON);
+}
+void Down(POINT p) { Mouse(WM_LBUTTONDOWN, p); }
+void Move(POINT p) { Mouse(WM_MOUSEMOVE, p); }
+void Up(POINT p) { Mouse(WM_LBUTTONUP, p); }
+void Click(POINT p) { Down(p), Up(p); }
+
+// The state flags and the capture, as one value.
+enum : UINT { kPress = 1, kDrag = 2, kClose = 4, kCaptured = 8 };
+UINT TrackState() {
+    return (mouseTrack.pressActive ? kPress : 0) | (mouseTrack.dragActive ? kDrag : 0) |
+           (mouseTrack.closePressActive ? kClose : 0) | (GetCapture() ? kCaptured : 0);
+}
+
+Heard Press(UINT id) { return {kPressMessage, id & 0xFFFF, 0}; }
+Heard Release(UINT id) { return {kReleaseMessage, (id & 0xFFFF) | 0xFFFF0000u, 0}; }
+Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
+
+// A host around the recording frame: notes the mouse state at every message
+// the library sends it, and runs buttons 1..4 as a radio group.
+std::vector<UINT> stateHeard;
+WNDPROC recordingProc = nullptr;
+ToolbarManager *hostManager = nullptr;
+bool hostRunsRadio = false;
+
+LRESULT CALLBACK HostProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_COMMAND || message == kPressMessage || message == kReleaseMessage || message == WM_SIZE)
+        stateHeard.push_back(TrackState());
+    if (message == WM_COMMAND && hostRunsRadio && wParam >= 1 && wParam <= 4)
+        QBR_SetRadioRange(hostManager, 1, 4, static_cast<UINT>(wParam));
+    return CallWindowProcA(recordingProc, window, message, wParam, lParam);
+}
+
+class InputTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(1, 8);
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
+        QBR_SetQuickHelp(0); // no tip windows under the cursor
+        top = MakeDock(DOCK_TOP);
+        hostManager = manager;
+        recordingProc =
+            reinterpret_cast<WNDPROC>(SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(HostProc)));
+    }
+    void TearDown() override {
+        EXPECT_EQ(0u, TrackState()) << "a press or drag was left running";
+        ReleaseCapture();
+        mouseTrack = MouseTrack{};
+        hostRunsRadio = false;
+        FrameTest::TearDown();
+    }
+    // A toolbar, with the frame's log cleared after it.
+    HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr) {
+        HWND pane = QBR_CreateToolbar("Tools", flags, 300, 250, 0, 0, dock ? dock : top, ids.data(), UINT(ids.size()));
+        Pump();
+        ClearFrameLog();
+        stateHeard.clear();
+        return pane;
+    }
+    static HWND Active(HWND pane) { return ResolveRoleWindow(pane, ROLE_ACTIVE); }
+    static RECT ItemRect(HWND pane, UINT index) {
+        RECT r = {};
+        GetItemRect(RecordOfWindow(pane), index, &r);
+        return r;
+    }
+    static POINT Button(HWND pane, UINT index) {
+        RECT r = ItemRect(pane, index);
+        return ScreenOf(Active(pane), (r.left + r.right) / 2, (r.top + r.bottom) / 2);
+    }
+    static POINT Empty(HWND pane) { // in the right margin, beside the items
+        RECT c = ClientRectOf(Active(pane));
+        return ScreenOf(Active(pane), c.right - 2, c.bottom - 4);
+    }
+    static POINT Caption(HWND pane) {
+        HWND w = ResolveRoleWindow(pane, ROLE_FLOATING);
+        return ScreenOf(w, ClientRectOf(w).right - 4, captionHeight / 2);
+    }
+    static POINT CloseBox(HWND pane) { return ScreenOf(ResolveRoleWindow(pane, ROLE_FLOATING), 3, 3); }
+    static POINT InDock(HWND dock) { // clear of the line a side dock shares with the top dock
+        RECT r;
+        GetWindowRect(dock, &r);
+        return POINT{(r.left + r.right) / 2, r.top + std::min<LONG>(40, (r.bottom - r.top) / 2)};
+    }
+    POINT Outside() { return ScreenOf(frame, 330, 300); } // the frame's own client area
+    static std::vector<HWND> Order(HWND dock) {
+        std::vector<HWND> out;
+        DockArea *area = FindDockRecord(dock);
+        for (UINT i = 0; i < PointerListCount(area->toolbars); ++i)
+            out.push_back(ListAt<ToolbarRecord>(area->toolbars, i)->paneWindow);
+        return out;
+    }
+    static UINT Place(HWND pane) {
+        return QBR_GetToolbarFlags(pane) & (TBF_VISIBLE | TBF_HIDDEN | TBF_DOCKED | TBF_FLOATING);
+    }
+    bool Pressed(UINT id) { return QBR_IsButtonPressed(manager, id) != 0; }
+    // What a client rectangle of the toolbar's active window shows now.
+    static std::vector<COLORREF> Look(HWND window, const RECT &r) {
+        const Pixels px = ReadWindowPixels(window);
+        std::vector<COLORREF> out;
+        for (int y = r.top; y < r.bottom; ++y)
+            for (int x = r.left; x < r.right; ++x)
+                out.push_back(px.At(x, y));
+        return out;
+    }
+    static std::vector<COLORREF> Look(HWND pane, UINT index) { return Look(Active(pane), ItemRect(pane, index)); }
+    HWND top = nullptr;
+};
+
+// ---- Button presses -----------------------------------------------------------------
+
+TEST_F(InputTest, ACompletedPressActsByBehaviour) {
+    struct Case {
+        const char *name;
+        UINT behaviour, stateBefore, pressedBefore, stateAfter, pressedAfter;
+    } const cases[] = {
+        {"push", BTN_PUSH, 0, 0, 0, 0},
+        {"check off goes on", BTN_CHECK, 0, 0, 1, 0},
+        {"check on goes off", BTN_CHECK, 1, 0, 0, 0},
+        {"check mixed goes on", BTN_CHECK, 2, 0, 1, 0},
+        {"latch stays pressed", BTN_LATCH, 0, 0, 0, 1},
+        {"a latched button acts again", BTN_LATCH, 0, 1, 0, 1},
+        {"push and check act as check", BTN_PUSH | BTN_CHECK, 0, 0, 1, 0},
+        {"neither acts as latch", 0, 0, 0, 0, 1},
+    };
+    HWND pane = Make({1, 2, 3});
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        QBR_SetButtonBehaviour(manager, 2, c.behaviour);
+        QBR_SetButtonState(manager, 2, c.stateBefore);
+        QBR_SetButtonPressed(manager, 2, c.pressedBefore);
+        Pump();
+        ClearFrameLog();
+        stateHeard.clear();
+        Down(Button(pane, 1));
+        EXPECT_TRUE(Pressed(2));
+        EXPECT_EQ(std::vector<Heard>{Press(2)}, FrameLog()) << Describe(FrameLog());
+        Up(Button(pane, 1));
+        EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
+        EXPECT_EQ(c.stateAfter, QBR_GetButtonState(manager, 2));
+        EXPECT_EQ(c.pressedAfter != 0, Pressed(2));
+        // The press is heard with the mouse held; the end only when all is clear.
+        EXPECT_EQ((std::vector<UINT>{kPress | kCaptured, 0, 0}), stateHeard);
+    }
+}
+
+// A sequence is a script of steps: d, m or u (left down, move, left up) and
+// where: 1 and 2 the first and second button, - off the buttons. `looks`
+// says after each step whether the first button is pressed.
+TEST_F(InputTest, ThePressedLookFollowsTheCursorAndOnlyAReleaseOnTheButtonActs) {
+    HWND pane = Make({1, 2, 3});
+    const std::vector<COLORREF> up1 = Look(pane, 0), up2 = Look(pane, 1);
+    QBR_SetButtonPressed(manager, 1, 1);
+    const std::vector<COLORREF> down1 = Look(pane, 0);
+    QBR_SetButtonPressed(manager, 1, 0);
+    ASSERT_NE(up1, down1);
+    struct Sequence {
+        const char *name, *script, *looks;
+        bool acts;
+    } const sequences[] = {
+        {"off, back and released on it", "d1 m- m1 u1", "1010", true},
+        {"released off it", "d1 m- u-", "100", false},
+        {"released on its neighbour", "d1 m2 u2", "100", false},
+        {"released off with the pressed look", "d1 u-", "10", false},
+    };
+    for (const Sequence &s : sequences) {
+        ClearFrameLog();
+        for (int i = 0; s.looks[i]; ++i) {
+            SCOPED_TRACE(std::string(s.name) + ", step " + std::to_string(i));
+            const char *step = s.script + 3 * i;
+            const POINT at = step[1] == '-' ? Empty(pane) : Button(pane, step[1] - '1');
+            Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
+            const bool pressed = s.looks[i] == '1';
+            EXPECT_EQ(pressed, Pressed(1));
+            EXPECT_FALSE(Pressed(2));
+            EXPECT_TRUE(Look(pane, 0) == (pressed ? down1 : up1));
+            EXPECT_TRUE(Look(pane, 1) == up2) << "the neighbour never looks pressed";
+        }
+        std::vector<Heard> heard = {Press(1), Release(1)};
+        if (s.acts) heard.push_back(Command(1));
+        EXPECT_EQ(heard, FrameLog()) << s.name << ": " << Describe(FrameLog());
+    }
+}
+
+TEST_F(InputTest, ADisabledButtonIsTrackedAndReportedButNeverActs) {
+    HWND pane = Make({1, 2, 3});
+    QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
+    QBR_SetButtonEnabled(manager, 2, 0);
+    const std::vector<COLORREF> look = Look(pane, 1);
+    for (bool releaseOn : {true, false}) {
+        SCOPED_TRACE(releaseOn ? "released on it" : "released off it");
+        ClearFrameLog();
+        Down(Button(pane, 1));
+        EXPECT_EQ(kPress | kCaptured, TrackState());
+        Move(Empty(pane));
+        Move(Button(pane, 1));
+        EXPECT_FALSE(Pressed(2));
+        EXPECT_TRUE(Look(pane, 1) == look);
+        Up(releaseOn ? Button(pane, 1) : Empty(pane));
+        EXPECT_EQ((std::vector<Heard>{Press(2), Release(2)}), FrameLog()) << Describe(FrameLog());
+        EXPECT_EQ(0u, QBR_GetButtonState(manager, 2));
+    }
+}
+
+TEST_F(InputTest, NotificationsCarrySixteenBitsAndCanBeSwitchedOff) {
+    AddButtons(0x12345, 1);
+    HWND pane = Make({0x12345});
+    Click(Button(pane, 0));
+    EXPECT_EQ((std::vector<Heard>{{kPressMessage, 0x2345, 0}, {kReleaseMessage, 0xFFFF2345, 0}, Command(0x12345)}),
+              FrameLog())
+        << Describe(FrameLog());
+    QBR_SetNotifyMessages(0, 0);
+    ClearFrameLog();
+    Click(Button(pane, 0));
+    EXPECT_EQ(std::vector<Heard>{Command(0x12345)}, FrameLog()) << Describe(FrameLog());
+}
+
+TEST_F(InputTest, CheckButtonsMakeARadioGroupWithTheHost) {
+    hostRunsRadio = true;
+    for (UINT id = 1; id <= 4; ++id)
+        QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
+    QBR_SetRadioRange(manager, 1, 4, 1);
+    HWND pane = Make({1, 2, 3, 4});
+    HWND other = Make({4});
+    const std::vector<COLORREF> off4 = Look(other, 0);
+    // Clicking the button that is on leaves it on: the library turns it
+    // off, and the host's answer to the command turns it on again.
+    for (UINT click : {3, 3, 4, 1}) {
+        Click(Button(pane, click - 1));
+        for (UINT id = 1; id <= 4; ++id)
+            EXPECT_EQ(id == click ? 1u : 0u, QBR_GetButtonState(manager, id)) << "click " << click << ", id " << id;
+        EXPECT_EQ(click != 4, Look(other, 0) == off4) << "the other toolbar follows at once, click " << click;
+    }
+}
+
+// Through the platform's input queue, with activation and double click
+// detection. The cursor is settled first: under Wine, GetCursorPos can lag
+// behind an input event that moves it.
+TEST_F(InputTest, RealInputClicksAButtonAndDoubleClicksAToolbarOff) {
+    auto real = [](POINT p, std::vector<DWORD> buttons) {
+        PlaceCursor(p);
+        for (DWORD flags : buttons) {
+            INPUT in = {};
+            in.type = INPUT_MOUSE;
+            in.mi.dwFlags = flags;
+            SendInput(1, &in, sizeof in);
+        }
+    };
+    auto pumpUntil = [](auto done) { // bounded: the queue delivers later
+        for (int round = 0; round < 200 && !done(); ++round)
+            PumpFor(5);
+        return done();
+    };
+    HWND pane = Make({1, 2, 3});
+    real(Button(pane, 2), {MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP});
+    ASSERT_TRUE(pumpUntil([] { return CountHeard(WM_COMMAND) > 0; }));
+    EXPECT_EQ((std::vector<Heard>{Press(3), Release(3), Command(3)}), FrameLog()) << Describe(FrameLog());
+    real(Empty(pane), {MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP, MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP});
+    EXPECT_TRUE(pumpUntil([&] { return QBR_IsToolbarFloating(pane) != 0; }));
+    pumpUntil([] { return TrackState() == 0; });
+}
+
+// ---- The close box ---------------------------------------------------------------
+
+// Scripts as above, with b the close box and c the caption beside it;
+// `looks` says whether the box is shown inverted.
+TEST_F(InputTest, TheCloseBoxTracksLikeAButtonAndHides) {
+    struct Sequence {
+        const char *name;
+        UINT flags;
+        const char *script, *looks;
+        bool hidden;
+    } const sequences[] = {
+        {"out and in again", TBF_FLOATING, "db mc mb ub", "1010", true},
+        {"let go outside", TBF_FLOATING, "db mc uc", "100", false},
+        {"locked place", TBF_FLOATING | TBF_LOCKED_PLACE, "db ub", "10", true},
+    };
+    for (const Sequence &s : sequences) {
+        SCOPED_TRACE(s.name);
+        HWND pane = Make({1, 2}, TBF_VISIBLE | s.flags);
+        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT box;
+        CloseBoxRect(floating, &box);
+        const std::vector<COLORREF> plain = Look(floating, box);
+        std::vector<COLORREF> inverted = plain;
+        for (COLORREF &c : inverted)
+            c ^= 0xFFFFFF;
+        for (int i = 0; s.looks[i]; ++i) {
+            const char *step = s.script + 3 * i;
+            const POINT at = step[1] == 'b' ? CloseBox(pane) : Caption(pane);
+            Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
+            if (IsWindowVisible(floating))
+                EXPECT_TRUE(Look(floating, box) == (s.looks[i] == '1' ? inverted : plain)) << "step " << i;
+        }
+        EXPECT_EQ(s.hidden ? TBF_HIDDEN | TBF_FLOATING : TBF_VISIBLE | TBF_FLOATING, Place(pane));
+        EXPECT_EQ(s.hidden, !IsWindowVisible(floating));
+        EXPECT_EQ(0, CountHeard(WM_COMMAND) + CountHeard(kPressMessage) + CountHeard(kReleaseMessage));
+        QBR_DestroyToolbar(pane);
+    }
+}
+
+// ---- Double clicks -----------------------------------------------------------------
+
+TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
+    enum Where { EmptySpace, CaptionBand, Box, OnButton };
+    struct Case {
+        const char *name;
+        UINT flags;
+        Where where;
+        UINT place;
+        int commands;
+    } const cases[] = {
+        {"docked, empty space: floats", TBF_DOCKED, EmptySpace, TBF_VISIBLE | TBF_FLOATING, 0},
+        {"docked, on a button: only the click", TBF_DOCKED, OnButton, TBF_VISIBLE | TBF_DOCKED, 1},
+        {"floating, caption: docks", TBF_FLOATING, CaptionBand, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"floating, empty space: docks", TBF_FLOATING, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"floating, on a button: only the click", TBF_FLOATING, OnButton, TBF_VISIBLE | TBF_FLOATING, 1},
+        {"floating, close box: hidden", TBF_FLOATING, Box, TBF_HIDDEN | TBF_FLOATING, 0},
+        {"locked docked: stays", TBF_DOCKED | TBF_LOCKED_PLACE, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"locked floating: stays", TBF_FLOATING | TBF_LOCKED_PLACE, CaptionBand, TBF_VISIBLE | TBF_FLOATING, 0},
+        {"locked floating, close box: hidden", TBF_FLOATING | TBF_LOCKED_PLACE, Box, TBF_HIDDEN | TBF_FLOATING, 0},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND pane = Make({1, 2}, TBF_VISIBLE | c.flags);
+        const POINT p = c.where == EmptySpace    ? Empty(pane)
+                        : c.where == CaptionBand ? Caption(pane)
+                        : c.where == Box         ? CloseBox(pane)
+                                                 : Button(pane, 0);
+        // What the window system sends for a double click. On the close box
+        // the first click hides the toolbar already, so there the double
+        // click message comes alone.
+        if (c.where != Box) Click(p);
+        Mouse(WM_LBUTTONDBLCLK, p);
+        Up(p);
+        EXPECT_EQ(c.place, Place(pane));
+        EXPECT_EQ(c.commands, CountHeard(WM_COMMAND));
+        EXPECT_EQ(c.commands, CountHeard(kReleaseMessage));
+        QBR_DestroyToolbar(pane);
+    }
+}
+
+// ---- Toolbar drags -----------------------------------------------------------------
+
+TEST_F(InputTest, DropsDockFloatAndKeepLockedToolbarsOnTheirSide) {
+    HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
+    enum Drop { Outside_, OnTop, OnLeft, OnRight };
+    const UINT kLocked = TBF_LOCKED_PLACE;
+    struct Case {
+        const char *name;
+        UINT flags;
+        Drop drop;
+        UINT place;
+        HWND *dock;           // where the pane stands afterwards
+        bool frameFollows;    // the floating frame is at the drag frame's corner
+        HWND *from = nullptr; // the dock it starts in, if not the top dock
+    } const cases[] = {
+        {"docked, let go outside: floats", TBF_DOCKED, Outside_, TBF_FLOATING, &top, true},
+        {"floating onto the top dock", TBF_FLOATING, OnTop, TBF_DOCKED, &top, false},
+        {"floating onto the hidden left dock", TBF_FLOATING, OnLeft, TBF_DOCKED, &left, false},
+        {"floating onto the hidden right dock", TBF_FLOATING, OnRight, TBF_DOCKED, &right, false},
+        {"floating, let go outside: the frame moves", TBF_FLOATING, Outside_, TBF_FLOATING, &top, true},
+        {"docked onto another dock", TBF_DOCKED, OnLeft, TBF_DOCKED, &left, false},
+        {"the last toolbar leaves a side dock, which hides", TBF_DOCKED, OnRight, TBF_DOCKED, &right, false, &left},
+        {"locked docked, outside: nothing moves", TBF_DOCKED | kLocked, Outside_, TBF_DOCKED, &top, false},
+        {"locked docked onto another dock", TBF_DOCKED | kLocked, OnRight, TBF_DOCKED, &right, false},
+        {"locked floating over a dock: stays floating", TBF_FLOATING | kLocked, OnTop, TBF_FLOATING, &top, true},
+        {"locked floating, outside: the frame moves", TBF_FLOATING | kLocked, Outside_, TBF_FLOATING, &top, true},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND anchor = Make({5, 6}); // keeps the top dock showing
+        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | c.flags, c.from ? *c.from : top);
+        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT pressed, frameBefore, frameAfter;
+        GetWindowRect(Active(pane), &pressed);
+        GetWindowRect(floating, &frameBefore);
+        const RECT paneBefore = WindowRectInParent(pane);
+        const POINT from = c.flags & TBF_FLOATING ? Caption(pane) : Empty(pane);
+        const POINT to = c.drop == Outside_ ? Outside()
+                                            : InDock(c.drop == OnTop    ? top
+                                                     : c.drop == OnLeft ? left
+                                                                        : right);
+        Down(from);
+        EXPECT_EQ(kDrag | kCaptured, TrackState());
+        Move(Offset(from, 7, 9));
+        Move(to);
+        Up(to);
+        EXPECT_EQ(c.place | TBF_VISIBLE, Place(pane));
+        EXPECT_EQ(*c.dock, GetParent(pane));
+        EXPECT_EQ(*c.dock, RecordOfWindow(pane)->dockWindow);
+        const std::vector<HWND> order = Order(*c.dock);
+        EXPECT_NE(order.end(), std::find(order.begin(), order.end(), pane));
+        GetWindowRect(floating, &frameAfter);
+        if (c.frameFollows) {
+            EXPECT_EQ(pressed.left + to.x - from.x, frameAfter.left);
+            EXPECT_EQ(pressed.top + to.y - from.y, frameAfter.top);
+        } else {
+            EXPECT_EQ(frameBefore, frameAfter);
+        }
+        if (c.place == TBF_DOCKED && c.flags & TBF_DOCKED && *c.dock == top)
+            EXPECT_EQ(paneBefore, WindowRectInParent(pane));
+        if (*c.dock != top) EXPECT_TRUE(IsWindowVisible(*c.dock)) << "a dropped-on dock shows";
+        if (c.from) EXPECT_FALSE(IsWindowVisible(*c.from)) << "the emptied dock hides";
+        for (UINT state : stateHeard)
+            EXPECT_EQ(0u, state) << "the frame heard of the drop before the state was clear";
+        QBR_DestroyToolbar(pane);
+        QBR_DestroyToolbar(anchor);
+    }
+}
+
+TEST_F(InputTest, DropsReorderADock) {
+    enum Target { OnA, OnB, OnC, AfterAll };
+    struct Case {
+        const char *name;
+        int dragged; // 0 A, 1 B, 2 C
+        Target target;
+        const char *order;
+    } const cases[] = {
+        {"A onto C goes before C", 0, OnC, "BAC"},
+        {"C onto A goes first", 2, OnA, "CAB"},
+        {"A just behind its own place stays", 0, OnB, "ABC"},
+        {"B on itself stays", 1, OnB, "ABC"},
+        {"B past the end goes last", 1, AfterAll, "ACB"},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND panes[3] = {Make({1, 2}), Make({3, 4}), Make({5, 6})};
+        RECT last;
+        GetWindowRect(panes[2], &last);
+        const POINT to =
+            c.target == AfterAll ? POINT{last.right + 30, (last.top + last.bottom) / 2} : Button(panes[c.target], 0);
+        Down(Empty(panes[c.dragged]));
+        Move(to);
+        Up(to);
+        std::string order;
+        for (HWND pane : Order(top))
+            order += static_cast<char>('A' + (std::find(panes, panes + 3, pane) - panes));
+        EXPECT_EQ(c.order, order);
+        // The dock packs in list order: each pane starts right of the one before.
+        const std::vector<HWND> packed = Order(top);
+        for (size_t i = 1; i < packed.size(); ++i)
+            EXPECT_LT(WindowRectInParent(packed[i - 1]).left, WindowRectInParent(packed[i]).left);
+        for (HWND pane : panes)
+            QBR_DestroyToolbar(pane);
+    }
+}
+
+// Inside the 2-pixel band of `frame` every pixel is kept or exactly inverted,
+// about half of them inverted (a checker); everywhere else nothing changed.
+void ExpectFrameOnScreen(const Pixels &before, const RECT &area, const RECT &frame) {
+    const Pixels now = ReadScreenPixels(area);
+    int band = 0, inverted = 0, changedOutside = 0;
+    for (int y = 0; y < now.height; ++y)
+        for (int x = 0; x < now.width; ++x) {
+            const POINT s = {area.left + x, area.top + y};
+            RECT inside = frame;
+            InflateRect(&inside, -2, -2);
+            const COLORREF was = before.At(x, y), is = now.At(x, y);
+            if (PtInRect(&frame, s) && !PtInRect(&inside, s)) {
+                ++band;
+                inverted += is == (was ^ 0xFFFFFF);
+                EXPECT_TRUE(is == was || is == (was ^ 0xFFFFFF)) << s.x << "," << s.y;
+            } else {
+                changedOutside += is != was;
+            }
+        }
+    EXPECT_EQ(0, changedOutside);
+    EXPECT_TRUE(inverted * 10 > band * 4 && inverted * 10 < band * 6) << inverted << " of " << band;
+}
+
+TEST_F(InputTest, TheDragFrameIsInvertedOnTheScreenAndErasedAfter) {
+    HWND pane = Make({1, 2, 3});
+    RECT outer, after;
+    GetWindowRect(pane, &outer);
+    const RECT area = {outer.left - 30, outer.top - 20, outer.right + 60, outer.bottom + 60};
+    const POINT from = Empty(pane);
+    const Pixels before = ReadScreenPixels(area);
+    Down(from);
+    ExpectFrameOnScreen(before, area, outer);
+    Move(Offset(from, 40, 25));
+    RECT moved = outer;
+    OffsetRect(&moved, 40, 25);
+    EXPECT_EQ(moved, mouseTrack.dragFrame);
+    ExpectFrameOnScreen(before, area, moved);
+    // Back to its own place and let go: nothing moves, the screen is as it was.
+    Move(from);
+    Up(from);
+    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
+    GetWindowRect(pane, &after);
+    EXPECT_EQ(outer, after);
+}
+
+// ---- The order of tests --------------------------------------------------------------
+
+TEST_F(InputTest, ARunningPressOrDragHoldsOffOtherPresses) {
+    HWND pane = Make({1, 2, 3});
+    Down(Button(pane, 0));
+    Down(Button(pane, 1));
+    Down(Empty(pane));
+    EXPECT_EQ(kPress | kCaptured, TrackState());
+    Up(Button(pane, 0));
+    EXPECT_EQ((std::vector<Heard>{Press(1), Release(1), Command(1)}), FrameLog()) << Describe(FrameLog());
+    ClearFrameLog();
+    Down(Empty(pane));
+    Down(Button(pane, 1));
+    EXPECT_EQ(kDrag | kCaptured, TrackState());
+    EXPECT_FALSE(Pressed(2));
+    Up(Empty(pane));
+    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
+}
+
+// A close box release outside every toolbar window is missed. Until the next
+// left release on a toolbar, moves run only the close box tracking, and a
+// drag begun meanwhile outlives that release and ends with the next.
+TEST_F(InputTest, AMissedCloseBoxReleaseServesTheNextOneFirst) {
+    HWND floatingPane = Make({1}, TBF_VISIBLE | TBF_FLOATING);
+    HWND pane = Make({2, 3});
+    Down(CloseBox(floatingPane));
+    ASSERT_EQ(frame, WindowFromPoint(Outside()));
+    Up(Outside());
+    EXPECT_EQ(kClose, TrackState());
+    Down(Empty(pane));
+    EXPECT_EQ(kClose | kDrag | kCaptured, TrackState());
+    const RECT frameAtPress = mouseTrack.dragFrame;
+    Move(Offset(Empty(pane), -30, 0));
+    EXPECT_EQ(frameAtPress, mouseTrack.dragFrame) << "the drag frame must not follow";
+    Up(Empty(pane));
+    EXPECT_EQ(kDrag | kCaptured, TrackState());
+    Up(Empty(pane));
+    EXPECT_EQ(0u, TrackState());
+    EXPECT_EQ(TBF_VISIBLE | TBF_FLOATING, Place(floatingPane));
+    EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, Place(pane));
+    InvalidateRect(pane, nullptr, TRUE); // the close box tracking drew on it
+}
+
+} // namespace
