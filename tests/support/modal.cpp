@@ -1,0 +1,170 @@
+#include "modal.h"
+
+#include <gtest/gtest.h>
+
+#include <deque>
+#include <memory>
+
+namespace {
+
+std::deque<std::function<bool()>> steps;
+UINT_PTR timer = 0;
+bool running = false;
+size_t insertAt = 0;
+int idleTicks = 0;
+constexpr int kGiveUpTicks = 300;
+
+BOOL CALLBACK CloseDialog(HWND window, LPARAM) {
+    char name[16];
+    if (GetClassNameA(window, name, sizeof name) && std::string(name) == "#32770") {
+        PostMessageA(window, WM_COMMAND, IDCANCEL, 0);
+        PostMessageA(window, WM_COMMAND, IDNO, 0); // a message box without Cancel
+    }
+    return TRUE;
+}
+
+void CALLBACK Tick(HWND, UINT, UINT_PTR, DWORD) {
+    if (++idleTicks == kGiveUpTicks) {
+        ADD_FAILURE() << (steps.empty() ? "a menu or dialog was left open" : "a step waited in vain");
+        steps.clear();
+        EndMenu();
+        EnumThreadWindows(GetCurrentThreadId(), CloseDialog, 0);
+    }
+    if (steps.empty()) return;
+    std::function<bool()> step = std::move(steps.front());
+    steps.pop_front();
+    running = true;
+    insertAt = 0;
+    const bool done = step();
+    running = false;
+    if (done)
+        idleTicks = 0;
+    else
+        steps.push_front(std::move(step));
+}
+
+bool CursorAt(POINT at) {
+    POINT p;
+    return GetCursorPos(&p) && p.x == at.x && p.y == at.y;
+}
+
+HWND visibleMenuWindow;
+BOOL CALLBACK FindMenuWindow(HWND window, LPARAM) {
+    char name[16];
+    if (IsWindowVisible(window) && GetClassNameA(window, name, sizeof name) && std::string(name) == "#32768") {
+        visibleMenuWindow = window;
+        return FALSE;
+    }
+    return TRUE;
+}
+
+BOOL CALLBACK CollectText(HWND child, LPARAM out) {
+    *reinterpret_cast<std::string *>(out) += TextOf(child) + "|";
+    return TRUE;
+}
+
+} // namespace
+
+void ModalSteps::Add(std::function<void()> step) {
+    Until([step] {
+        step();
+        return true;
+    });
+}
+
+void ModalSteps::Until(std::function<bool()> step) {
+    if (running)
+        steps.insert(steps.begin() + static_cast<std::ptrdiff_t>(insertAt++), std::move(step));
+    else
+        steps.push_back(std::move(step));
+    if (!timer) timer = SetTimer(nullptr, 0, 10, Tick);
+    idleTicks = 0;
+}
+
+void ModalSteps::Stop() {
+    if (timer) KillTimer(nullptr, timer);
+    timer = 0;
+    steps.clear();
+}
+
+void PlaceCursorStep(POINT at) {
+    SetCursorPos(at.x, at.y);
+    auto ticksThere = std::make_shared<int>(0);
+    ModalSteps::Until([at, ticksThere] {
+        if (!CursorAt(at)) {
+            SetCursorPos(at.x, at.y);
+            *ticksThere = 0;
+            return false;
+        }
+        return ++*ticksThere >= 3;
+    });
+}
+
+void ClickAtStep(POINT at) {
+    PlaceCursorStep(at);
+    ModalSteps::Add([] {
+        SendButton(MOUSEEVENTF_LEFTDOWN);
+        SendButton(MOUSEEVENTF_LEFTUP);
+    });
+}
+
+void SendButton(DWORD flags) {
+    INPUT input = {};
+    input.type = INPUT_MOUSE;
+    input.mi.dwFlags = flags;
+    SendInput(1, &input, sizeof input);
+}
+
+bool ButtonDown(int key) { return (GetKeyState(key) & 0x8000) != 0; }
+
+HMENU OpenMenu() {
+    visibleMenuWindow = nullptr;
+    EnumThreadWindows(GetCurrentThreadId(), FindMenuWindow, 0);
+    return visibleMenuWindow ? reinterpret_cast<HMENU>(SendMessageA(visibleMenuWindow, MN_GETHMENU, 0, 0)) : nullptr;
+}
+
+std::string DescribeMenu(HMENU menu) {
+    std::string out;
+    for (int i = 0; i < GetMenuItemCount(menu); ++i) {
+        UINT state = GetMenuState(menu, i, MF_BYPOSITION);
+        if (!out.empty()) out += " | ";
+        if (state & MF_SEPARATOR) {
+            out += "--";
+            continue;
+        }
+        char text[64] = "";
+        GetMenuStringA(menu, i, text, sizeof text, MF_BYPOSITION);
+        out += text;
+        if (state & MF_CHECKED) out += "*";
+        out += ":" + std::to_string(GetMenuItemID(menu, i));
+    }
+    return out;
+}
+
+void ClickMenuEntry(HMENU menu, const char *text) {
+    for (int i = 0; i < GetMenuItemCount(menu); ++i) {
+        char entry[64] = "";
+        GetMenuStringA(menu, i, entry, sizeof entry, MF_BYPOSITION);
+        RECT r;
+        if (std::string(entry) == text && GetMenuItemRect(nullptr, menu, i, &r)) {
+            ClickAtStep(Centre(r));
+            return;
+        }
+    }
+    ADD_FAILURE() << "no menu entry " << text;
+    EndMenu();
+}
+
+POINT Centre(const RECT &r) { return POINT{(r.left + r.right) / 2, (r.top + r.bottom) / 2}; }
+
+std::string TextOf(HWND window) {
+    char text[300] = "";
+    GetWindowTextA(window, text, sizeof text);
+    return text;
+}
+
+std::string ChildTexts(HWND window) {
+    std::string out;
+    EnumChildWindows(window, CollectText, reinterpret_cast<LPARAM>(&out));
+    return out;
+}
