@@ -1,0 +1,235 @@
+// Quick help: a small tip window with a button's short help text, opened
+// beside the cursor once it has rested on the button for one timer period.
+//
+// A toolbar window gets no message when the cursor leaves it, so the tip
+// cannot wait to be told to go: once a timer runs, it polls the cursor every
+// period and is what notices that the cursor has gone elsewhere.
+#include "quickhelp/quickhelp.h"
+
+#include "core/core.h"
+#include "core/gdi.h"
+#include "toolbar/toolbar.h"
+
+UINT_PTR helpTimer = 0;
+ToolbarItem *helpItem = nullptr;
+HFONT helpFont = nullptr;
+
+namespace {
+
+constexpr char kHelpClassName[] = "QBR_HelpWindow";
+constexpr DWORD kHelpStyle = WS_POPUP | WS_BORDER | WS_CLIPSIBLINGS; // created hidden
+
+// One period is both the delay before a tip and the step of the poll.
+constexpr UINT kHelpPeriod = 200;
+
+// The tip and its text, in screen and client pixels:
+//
+//        + cursor (x, y)
+//        |
+//        | kTipBelowCursor
+//   +----v-------------------+  ^
+//   | (2,1) text             |  | text height (no internal leading)
+//   +------------------------+  v + kTipExtraHeight
+//   <-- text width + kTipExtraWidth -->
+//
+// At the bottom of the screen the tip stands above the cursor's line instead,
+// its lower edge on y; at the right edge its right edge stands on x.
+constexpr int kTipBelowCursor = 18;
+constexpr int kTipExtraWidth = 8;
+constexpr int kTipExtraHeight = 6;
+constexpr int kTextLeft = 2;
+constexpr int kTextTop = 1;
+constexpr COLORREF kTipBackground = RGB(255, 255, 128);
+
+// Help text buffers hold kHelpTextSize characters and the terminator, with
+// room to spare.
+constexpr int kTextBuffer = 256;
+
+HWND HelpWindow() {
+    ToolbarClient *client = CurrentClient();
+    return client ? client->helpWindow : nullptr;
+}
+
+void KillHelpTimer() {
+    if (helpTimer) KillTimer(nullptr, helpTimer);
+    helpTimer = 0;
+}
+
+void RestartHelpTimer() {
+    KillHelpTimer();
+    helpTimer = SetTimer(nullptr, 0, kHelpPeriod, QuickHelpTimerProc);
+}
+
+bool IsButtonItem(const ToolbarItem *item) {
+    UINT kind = ITEM_SEPARATOR;
+    return item && ItemGetKind(item, &kind) && kind == ITEM_BUTTON;
+}
+
+// The item's quick help text into `text`; its length, or 0 for none. A host
+// that reports more than it wrote is held to what is in the buffer.
+int QuickHelpText(const ToolbarItem *item, char (&text)[kTextBuffer]) {
+    UINT id = 0;
+    if (!ItemGetId(item, &id)) return 0;
+    text[0] = '\0';
+    int length = RequestHelpText(id, HELP_QUICK, text, kHelpTextSize);
+    if (length <= 0) return 0;
+    text[kTextBuffer - 1] = '\0';
+    int written = lstrlenA(text);
+    return length < written ? length : written;
+}
+
+// The poll's stop: the tip goes and the timer with it, until the next move
+// over a button starts it again.
+void StopQuickHelp(HWND help) {
+    ShowWindow(help, SW_HIDE);
+    KillHelpTimer();
+}
+
+// Sizes and places the tip for `text` beside the cursor at `cursor` (screen).
+void PlaceTip(HWND help, POINT cursor, const char *text, int length) {
+    WindowDC dc(help);
+    SelectScope font(dc, helpFont);
+    TEXTMETRICA metrics;
+    BlockFill(&metrics, 0, sizeof(metrics));
+    GetTextMetricsA(dc, &metrics);
+    SIZE extent = {0, 0};
+    GetTextExtentPoint32A(dc, text, length, &extent);
+    int height = metrics.tmHeight - metrics.tmInternalLeading + kTipExtraHeight;
+    int width = extent.cx + kTipExtraWidth;
+    if (cursor.y - GetSystemMetrics(SM_CYSCREEN) + height + kTipBelowCursor > 0) cursor.y -= height + kTipBelowCursor;
+    if (cursor.x - GetSystemMetrics(SM_CXSCREEN) + width > 0) cursor.x -= width;
+    SetWindowPos(help, nullptr, cursor.x, cursor.y + kTipBelowCursor, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+void QuickHelpPaint(HWND window) {
+    // The window is validated on every path: an unvalidated window would be
+    // sent WM_PAINT again and again.
+    PaintScope dc(window);
+    if (!helpItem) return;
+    SelectScope font(dc, helpFont);
+    SetBkMode(dc, TRANSPARENT);
+    // Asked again rather than kept from the poll: the tip always shows what
+    // the host says now.
+    char text[kTextBuffer];
+    int length = QuickHelpText(helpItem, text);
+    if (length <= 0) return;
+    RECT client;
+    GetClientRect(window, &client);
+    ++client.right;
+    ++client.bottom;
+    SolidBrush background(kTipBackground);
+    FillRect(dc, &client, background);
+    ExtTextOutA(dc, kTextLeft, kTextTop, 0, nullptr, text, static_cast<UINT>(length), nullptr);
+}
+
+} // namespace
+
+UINT QuickHelpStart() {
+    ToolbarClient *client = CurrentClient();
+    if (!client) return 0;
+    WNDCLASSA info;
+    if (!GetClassInfoA(moduleInstance, kHelpClassName, &info)) {
+        WNDCLASSA wc;
+        BlockFill(&wc, 0, sizeof(wc));
+        wc.lpfnWndProc = QuickHelpWindowProc;
+        wc.hInstance = moduleInstance;
+        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
+        wc.lpszClassName = kHelpClassName;
+        if (!RegisterClassA(&wc)) return 0;
+    }
+    client->helpWindow =
+        CreateWindowExA(0, kHelpClassName, "", kHelpStyle, 0, 0, 0, 0, nullptr, nullptr, moduleInstance, nullptr);
+    if (!client->helpWindow) return 0;
+    // Every client has a tip window of its own, but the font is made once.
+    if (clientCount > 1) return 1;
+    helpFont = MakePointFont(8, VARIABLE_PITCH | FF_SWISS, "MS Sans Serif");
+    return 1;
+}
+
+void QuickHelpEnd() {
+    if (clientCount > 1) return;
+    // The last client goes: a running poll would find no client from now on
+    // and tick for nothing, so it stops here with its tip. The tip window
+    // itself stays; it ends with the program.
+    if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
+    KillHelpTimer();
+    helpItem = nullptr;
+    if (helpFont) GdiDelete(helpFont);
+    helpFont = nullptr;
+}
+
+void QuickHelpForgetManager(const ToolbarManager *manager) {
+    if (!manager || !helpItem || !PointerListFind(manager->items, ListValue(helpItem), nullptr)) return;
+    // The item the tip names is about to be freed. The tip is hidden and the
+    // item forgotten now, so that no paint can read it; a running timer goes
+    // on polling, and the next button it finds counts as a new one.
+    if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
+    helpItem = nullptr;
+}
+
+void QuickHelpMouseMove(HWND window, int x, int y) {
+    HWND help = HelpWindow();
+    if (!help) return;
+    ToolbarItem *item = HitTestToolbar(ResolveRoleWindow(window, ROLE_DOCKED), x, y, nullptr, nullptr);
+    if (!IsWindowVisible(help)) {
+        // No tip yet: every move over a button starts the wait anew, so the
+        // tip comes only once the cursor rests.
+        KillHelpTimer();
+        if (!IsButtonItem(item)) return;
+        RestartHelpTimer();
+    }
+    if (item != helpItem) {
+        // Another button, or none: the tip goes and the wait begins again.
+        ShowWindow(help, SW_HIDE);
+        RestartHelpTimer();
+    }
+}
+
+void CALLBACK QuickHelpTimerProc(HWND, UINT, UINT_PTR, DWORD) {
+    HWND help = HelpWindow();
+    if (!help) return;
+    POINT p;
+    GetCursorPos(&p);
+    // A timer belongs to no window: the toolbar is the one under the cursor,
+    // whatever window had the last mouse message.
+    HWND w = WindowFromPoint(p);
+    if (!w || GetKeyState(VK_LBUTTON) < 0 || GetKeyState(VK_RBUTTON) < 0 || !IsToolbarWindow(w)) {
+        StopQuickHelp(help);
+        return;
+    }
+    ScreenToClient(w, &p);
+    ToolbarItem *item = HitTestToolbar(ResolveRoleWindow(w, ROLE_DOCKED), p.x, p.y, nullptr, nullptr);
+    ClientToScreen(w, &p);
+    if (!IsButtonItem(item)) {
+        StopQuickHelp(help);
+        return;
+    }
+    if (IsWindowVisible(help)) {
+        if (item == helpItem) return;
+        ShowWindow(help, SW_HIDE);
+    }
+    helpItem = item;
+    // A button without a text gets no tip; the timer goes on and asks again
+    // at the next poll.
+    char text[kTextBuffer];
+    int length = QuickHelpText(item, text);
+    if (length <= 0) return;
+    PlaceTip(help, p, text, length);
+    // The tip never takes activation from the frame.
+    ShowWindow(help, SW_SHOWNA);
+}
+
+LRESULT CALLBACK QuickHelpWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    switch (message) {
+    case WM_PAINT:
+        QuickHelpPaint(window);
+        return 0;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+UINT IsToolbarWindow(HWND window) {
+    char name[32];
+    if (!GetClassNameA(window, name, sizeof(name))) return 0;
+    return lstrcmpA(name, kToolbarClassName) == 0 ? 1 : 0;
+}
