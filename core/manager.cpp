@@ -44,8 +44,14 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     // toolbar lookup cache, not the quick-help tip.
     ForgetManager(manager);
     QuickHelpForgetManager(manager);
-    while (ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, 0))
-        DestroyToolbarRecord(record);
+    // Everything goes at once: the docks let go of their toolbars first, so
+    // that no dock is laid out again for every toolbar that leaves it (with
+    // many toolbars that alone took minutes).
+    for (UINT i = 0; i < PointerListCount(manager->docks); ++i)
+        if (DockArea *dock = ListAt<DockArea>(manager->docks, i))
+            while (UINT count = PointerListCount(dock->toolbars)) PointerListRemoveAt(dock->toolbars, count - 1);
+    while (UINT count = PointerListCount(manager->toolbars))
+        DestroyToolbarRecord(ListAt<ToolbarRecord>(manager->toolbars, count - 1));
     PointerListDestroy(manager->toolbars);
     manager->toolbars = nullptr;
     while (DockArea *dock = ListAt<DockArea>(manager->docks, 0))

@@ -3,21 +3,9 @@
 # places, a menu command given with real X input, a clean close that writes
 # the settings file. Leaves BUILD_DIR/e2e/*.png to look at.
 set -u
-build=$(cd "$1" && pwd)
-here=$(cd "$(dirname "$0")/../.." && pwd)
-"$here/scripts/wine-env.sh" start "$build" || exit 1
-. "$build/wine-env/exports.sh"
-out="$build/e2e"
-mkdir -p "$out"
-ctl() { wine "$build/bin/qbr_ctl.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; return "${PIPESTATUS[0]}"; }
-fail() { echo "FAIL: $*"; ctl close "Quaybar Demo"; exit 1; }
-ini="$build/bin/qbrdemo.INI"
+. "$(dirname "$0")/lib.sh" "$1"
 rm -f "$ini"
-
-wine "$build/bin/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
-pid=$!
-ctl wait "Quaybar Demo" 20000 || fail "the main window did not appear"
-sleep 1
+start_demo "first start"
 
 # Floating frames: "Align" at (300, 100); "Palette" at (300, 200), made 100
 # wide, wrapped into rows and then narrowed by the refit.
@@ -36,24 +24,37 @@ for title in Align Palette; do
     at=$(grep -n "^$title owned by" <<<"$order" | cut -d: -f1)
     [ -n "$at" ] && [ "$at" -lt "$main_at" ] || fail "$title is not above the main window: $order"
 done
-/usr/bin/import -display "$DISPLAY" -window root "$out/demo-start.png"
+shot demo-start
 
 # View > Button Text with real keys, as a person without a mouse would.
 read -r ml mt mr mb mv <<<"$(ctl rect 'Quaybar Demo')"
 xdotool mousemove $((ml + 300)) $((mt + 300)) click 1 # the edit control: the window has the focus
 sleep 0.3
+[ "$(ctl status 'Quaybar Demo')" = "Welcome to the Quaybar Demo!" ] || fail "status line at start: $(ctl status 'Quaybar Demo')"
 xdotool key alt+v
 sleep 0.5
-/usr/bin/import -display "$DISPLAY" -window root "$out/demo-menu.png"
+shot demo-menu
+line=$(ctl status 'Quaybar Demo')
+[ "$line" != "Welcome to the Quaybar Demo!" ] && [ -n "$line" ] || fail "the open menu did not change the status line"
 xdotool key b
 sleep 1
-/usr/bin/import -display "$DISPLAY" -window root "$out/demo-button-text.png"
+shot demo-button-text
 read -r l t r b v <<<"$(ctl rect Align)"
 [ $((b - t)) -gt 60 ] || fail "button text did not make Align taller: height $((b - t))"
 
-ctl close "Quaybar Demo"
-for _ in $(seq 1 100); do kill -0 $pid 2>/dev/null || break; sleep 0.1; done
-kill -0 $pid 2>/dev/null && { kill $pid; fail "the program did not end after WM_CLOSE"; }
+# A press on the first button of "Standard" (New, 101) shows its line while
+# the button is held, and the release takes it back.
+read -r l t r b v <<<"$(ctl childrect 'Quaybar Demo' Standard)"
+xdotool mousemove $((l + 20)) $((t + 15)) mousedown 1
+sleep 0.4
+line=$(ctl status 'Quaybar Demo')
+xdotool mouseup 1
+sleep 0.4
+[ "$line" = "Display help text for identifier #101." ] || fail "status line during the press: '$line'"
+line=$(ctl status 'Quaybar Demo')
+[ "$line" = "Welcome to the Quaybar Demo!" ] || fail "status line after the release: '$line'"
+
+stop_demo "after the first start"
 
 grep -q '^\[Main Layout\]' "$ini" || fail "no [Main Layout] in $ini"
 grep -q '^Top Dock=Standard,Style,Align,Palette' "$ini" || fail "dock line wrong: $(grep 'Top Dock' "$ini")"

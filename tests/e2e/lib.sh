@@ -1,0 +1,51 @@
+# Shared by the end-to-end scripts: the Wine environment of a build folder,
+# the control tool, starting and ending the demonstration program.
+# Source it with the build folder as $1.
+build=$(cd "$1" && pwd)
+here=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
+"$here/scripts/wine-env.sh" start "$build" || exit 1
+. "$build/wine-env/exports.sh"
+out="$build/e2e"
+mkdir -p "$out"
+ini="$build/bin/qbrdemo.INI"
+main="Quaybar Demo"
+demo_pid=""
+
+ctl() { wine "$build/bin/qbr_ctl.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; return "${PIPESTATUS[0]}"; }
+fail() {
+    echo "FAIL: $*"
+    [ -n "$demo_pid" ] && { ctl close "$main"; sleep 1; kill "$demo_pid" 2>/dev/null; }
+    exit 1
+}
+shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1.png"; }
+
+# Starts the program and waits for its main window and its first paint.
+start_demo() {
+    wine "$build/bin/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
+    demo_pid=$!
+    ctl wait "$main" 20000 || fail "the main window did not appear ($1)"
+    sleep 1
+}
+
+# Closes the main window as a user does and waits for the program to end.
+stop_demo() {
+    ctl close "$main"
+    for _ in $(seq 1 300); do kill -0 "$demo_pid" 2>/dev/null || break; sleep 0.1; done
+    if kill -0 "$demo_pid" 2>/dev/null; then
+        kill "$demo_pid"
+        fail "the program did not end after WM_CLOSE ($1)"
+    fi
+    wait "$demo_pid"
+    local code=$?
+    demo_pid=""
+    [ "$code" = 0 ] || fail "the program ended with code $code ($1)"
+}
+
+# The value of KEY in SECTION of the settings file (written with CR LF).
+ini_value() {
+    awk -v s="[$1]" -v k="$2" '
+        { sub(/\r$/, "") }
+        /^\[/ { inside = ($0 == s); next }
+        inside { i = index($0, "="); if (i && substr($0, 1, i - 1) == k) { print substr($0, i + 1); exit } }
+    ' "$ini"
+}
