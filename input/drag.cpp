@@ -10,15 +10,11 @@
 #include "toolbar/toolbar.h"
 
 void BeginToolbarDrag(HWND window, int x, int y) {
-    SetCapture(window);
-    mouseTrack.dragActive = 1;
     // The frame starts as the outer rectangle of whichever window was pressed;
     // it keeps that size for the whole drag.
-    GetWindowRect(window, &mouseTrack.dragFrame);
-    DrawDragFrame(&mouseTrack.dragFrame);
-    ClientPointToScreen(window, &x, &y);
-    mouseTrack.dragLastX = x;
-    mouseTrack.dragLastY = y;
+    RECT frame;
+    GetWindowRect(window, &frame);
+    StartFrameDrag(window, &frame, x, y);
 }
 
 // The floating frame goes to the drag frame's corner and keeps its own size,

@@ -37,6 +37,9 @@ void BeginToolbarDrag(HWND window, int x, int y);
 void DropToolbar(HWND window, int x, int y);
 
 void DrawDragFrame(const RECT *rect);
+// Takes capture and starts a frame drag at `frame` (screen coordinates) from the
+// press point (x, y) in the client coordinates of `window`.
+void StartFrameDrag(HWND window, const RECT *frame, int x, int y);
 // Erases the frame, moves it by the cursor's travel in screen coordinates and draws it again.
 void FollowDragFrame(HWND window, int x, int y);
 void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar);

@@ -32,13 +32,9 @@ void OnToolbarRightDown(HWND window, int x, int y, UINT keys) {
     bool separator;
     if (!IsSeparatorKind(mouseTrack.hitItem, &separator) || separator) return;
 
-    SetCapture(window);
-    mouseTrack.dragActive = 1;
-    ClientRectToScreen(window, &mouseTrack.dragFrame);
-    DrawDragFrame(&mouseTrack.dragFrame);
-    ClientPointToScreen(window, &x, &y);
-    mouseTrack.dragLastX = x;
-    mouseTrack.dragLastY = y;
+    RECT frame = mouseTrack.dragFrame; // the item's rectangle from the hit test
+    ClientRectToScreen(window, &frame);
+    StartFrameDrag(window, &frame, x, y);
     // The key counts at the press; its state at the release is never read.
     mouseTrack.dragCopy = keys & MK_CONTROL;
 }

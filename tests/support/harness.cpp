@@ -137,29 +137,26 @@ RECT ClientRectOf(HWND window) {
     return r;
 }
 
-Pixels ReadWindowPixels(HWND window) {
-    UpdateWindow(window);
-    Pump();
+// Copies a rectangle of a device context into a top-down 32-bit DIB and
+// hands back its colours.
+static Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height) {
     Pixels out;
-    RECT client;
-    GetClientRect(window, &client);
-    out.width = client.right;
-    out.height = client.bottom;
-    if (out.width <= 0 || out.height <= 0) return out;
-    HDC source = GetDC(window);
+    out.width = width;
+    out.height = height;
+    if (width <= 0 || height <= 0 || !source) return out;
     HDC memory = CreateCompatibleDC(source);
     BITMAPINFO info = {};
     info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-    info.bmiHeader.biWidth = out.width;
-    info.bmiHeader.biHeight = -out.height; // top-down
+    info.bmiHeader.biWidth = width;
+    info.bmiHeader.biHeight = -height; // top-down
     info.bmiHeader.biPlanes = 1;
     info.bmiHeader.biBitCount = 32;
     void *bits = nullptr;
     HBITMAP dib = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
     HGDIOBJ old = SelectObject(memory, dib);
-    BitBlt(memory, 0, 0, out.width, out.height, source, 0, 0, SRCCOPY);
+    BitBlt(memory, 0, 0, width, height, source, left, top, SRCCOPY);
     GdiFlush();
-    out.colors.resize(static_cast<size_t>(out.width) * out.height);
+    out.colors.resize(static_cast<size_t>(width) * height);
     auto *raw = static_cast<const DWORD *>(bits);
     for (size_t i = 0; i < out.colors.size(); ++i) {
         DWORD p = raw[i]; // 0x00RRGGBB
@@ -168,6 +165,16 @@ Pixels ReadWindowPixels(HWND window) {
     SelectObject(memory, old);
     DeleteObject(dib);
     DeleteDC(memory);
+    return out;
+}
+
+Pixels ReadWindowPixels(HWND window) {
+    UpdateWindow(window);
+    Pump();
+    RECT client;
+    GetClientRect(window, &client);
+    HDC source = GetDC(window);
+    Pixels out = ReadPixelsFrom(source, 0, 0, client.right, client.bottom);
     ReleaseDC(window, source);
     return out;
 }
@@ -204,32 +211,8 @@ HWND SendMouse(UINT message, POINT p, WPARAM keys) {
 }
 
 Pixels ReadScreenPixels(const RECT &rect) {
-    Pixels out;
-    out.width = rect.right - rect.left;
-    out.height = rect.bottom - rect.top;
-    if (out.width <= 0 || out.height <= 0) return out;
     HDC screen = GetDC(nullptr);
-    HDC memory = CreateCompatibleDC(screen);
-    BITMAPINFO info = {};
-    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-    info.bmiHeader.biWidth = out.width;
-    info.bmiHeader.biHeight = -out.height; // top-down
-    info.bmiHeader.biPlanes = 1;
-    info.bmiHeader.biBitCount = 32;
-    void *bits = nullptr;
-    HBITMAP dib = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
-    HGDIOBJ old = SelectObject(memory, dib);
-    BitBlt(memory, 0, 0, out.width, out.height, screen, rect.left, rect.top, SRCCOPY);
-    GdiFlush();
-    out.colors.resize(static_cast<size_t>(out.width) * out.height);
-    auto *raw = static_cast<const DWORD *>(bits);
-    for (size_t i = 0; i < out.colors.size(); ++i) {
-        DWORD p = raw[i]; // 0x00RRGGBB
-        out.colors[i] = RGB((p >> 16) & 0xff, (p >> 8) & 0xff, p & 0xff);
-    }
-    SelectObject(memory, old);
-    DeleteObject(dib);
-    DeleteDC(memory);
+    Pixels out = ReadPixelsFrom(screen, rect.left, rect.top, rect.right - rect.left, rect.bottom - rect.top);
     ReleaseDC(nullptr, screen);
     return out;
 }
