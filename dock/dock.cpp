@@ -216,8 +216,13 @@ UINT RelayoutDock(HWND window) {
 //
 // The first pane sits one pixel above and left of the dock so that its own
 // top and left border lines fall outside the dock window.
+static UINT packingDeferred = 0;
+DeferDockPacking::DeferDockPacking() { ++packingDeferred; }
+DeferDockPacking::~DeferDockPacking() { --packingDeferred; }
+
 UINT PackDock(DockArea *dock) {
     if (!dock) return 0;
+    if (packingDeferred) return 1;
     RECT overall = {0, 0, 0, 0};
     RECT row = {-1, -1, 0, 0};
     // The full-screen width, not the frame's: a dock does not wrap because the

@@ -19,6 +19,17 @@ UINT InsertToolbarBefore(DockArea *dock, ToolbarRecord *anchor, ToolbarRecord *t
 UINT RemoveToolbarFromDock(DockArea *dock, ToolbarRecord *toolbar);
 UINT RelayoutDock(HWND window);
 UINT PackDock(DockArea *dock);
+
+// While one lives, PackDock does nothing: a whole arrangement being rebuilt
+// packs each dock once at its end, not once for every toolbar it receives
+// (which with many toolbars costs minutes).
+class DeferDockPacking {
+  public:
+    DeferDockPacking();
+    ~DeferDockPacking();
+    DeferDockPacking(const DeferDockPacking &) = delete;
+    DeferDockPacking &operator=(const DeferDockPacking &) = delete;
+};
 void PlaceDock(HWND window, RECT *rect);
 void ApplyDockSideRule(HWND window, RECT *rect);
 LRESULT CALLBACK DockWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam);

@@ -234,11 +234,16 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
         // The title buffer holds the whole rest, so no title read from a
         // damaged file can overrun it.
         std::vector<char> title(static_cast<size_t>(lstrlenA(titles)) + 1);
-        while (*titles) {
-            ReadTokenText(titles, title.data());
-            LPSTR value;
-            if (FindLayoutValue(keys, values, count, title.data(), &value)) RestoreToolbar(dock, title.data(), value);
+        {
+            DeferDockPacking once;
+            while (*titles) {
+                ReadTokenText(titles, title.data());
+                LPSTR value;
+                if (FindLayoutValue(keys, values, count, title.data(), &value))
+                    RestoreToolbar(dock, title.data(), value);
+            }
         }
+        RelayoutDock(dock);
     }
     return 1;
 }
