@@ -142,9 +142,9 @@ damaged comma-in-title 'has "Top Dock=Standard,Align"'
 damaged duplicate-keys 'true'
 {
     echo '[Main Layout]'
-    printf 'Top Dock='; seq -f "T%g" 1 200 | paste -sd, -
-    for i in $(seq 1 200); do echo "T$i=2,101,102,17,0,0,80,40"; done
+    printf 'Top Dock='; seq -f "T%g" 1 1000 | paste -sd, -
+    for i in $(seq 1 1000); do echo "T$i=2,101,102,17,0,0,80,40"; done
 } >"$ini"
-damaged many-toolbars '[ "$(grep -c "^T[0-9]*=" "$out/damaged-$name.txt")" = 200 ]'
+damaged many-toolbars '[ "$(grep -c "^T[0-9]*=" "$out/damaged-$name.txt")" = 1000 ]'
 
 echo "$passed passed, 0 failed"
