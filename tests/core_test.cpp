@@ -30,14 +30,17 @@ static PointerList *ListABC() {
     return list;
 }
 
-TEST(PointerListTest, EmptyListHasNoArrayUntilFirstInsertion) {
+TEST(PointerListTest, EmptyAndNullListsAreAcceptedAndGetAnArrayOnFirstInsertion) {
+    EXPECT_EQ(0u, PointerListAppend(nullptr, a));
+    UINT index = 7;
+    EXPECT_EQ(0u, PointerListFind(nullptr, a, &index));
+    EXPECT_EQ(7u, index);
+    PointerListCompact(nullptr);
+    PointerListDestroy(nullptr);
     PointerList *list = PointerListCreate(0, 4, 0);
     ASSERT_NE(nullptr, list);
     EXPECT_EQ(nullptr, list->items);
-    EXPECT_EQ(0u, PointerListCount(list));
     EXPECT_EQ(0u, PointerListGet(list, 0));
-    EXPECT_EQ(0u, PointerListRemoveAt(list, 0));
-    EXPECT_EQ(0u, PointerListRemove(list, a));
     EXPECT_EQ(0u, PointerListRemoveBefore(list, 0));
     EXPECT_EQ(0u, PointerListRemoveAfter(list, 0));
     EXPECT_EQ(0u, PointerListInsertBefore(list, a, x));
@@ -59,15 +62,12 @@ TEST(PointerListTest, NeighbourInsertsAndRemoves) {
         {"insert before 0 appends", [](PointerList *l) { return PointerListInsertBefore(l, 0, x); }, 1, {a, b, c, x}},
         {"insert after 0 prepends", [](PointerList *l) { return PointerListInsertAfter(l, 0, x); }, 1, {x, a, b, c}},
         {"insert before b", [](PointerList *l) { return PointerListInsertBefore(l, b, x); }, 1, {a, x, b, c}},
-        {"insert after c", [](PointerList *l) { return PointerListInsertAfter(l, c, x); }, 1, {a, b, c, x}},
         {"insert before missing", [](PointerList *l) { return PointerListInsertBefore(l, x, a); }, 0, {a, b, c}},
-        {"insert after missing", [](PointerList *l) { return PointerListInsertAfter(l, x, a); }, 0, {a, b, c}},
         {"remove before 0 takes last", [](PointerList *l) { return PointerListRemoveBefore(l, 0); }, 1, {a, b}},
         {"remove before b takes a", [](PointerList *l) { return PointerListRemoveBefore(l, b); }, 1, {b, c}},
         {"remove before a refused", [](PointerList *l) { return PointerListRemoveBefore(l, a); }, 0, {a, b, c}},
         {"remove after 0 takes first", [](PointerList *l) { return PointerListRemoveAfter(l, 0); }, 1, {b, c}},
         {"remove after b takes c", [](PointerList *l) { return PointerListRemoveAfter(l, b); }, 1, {a, b}},
-        {"remove after c refused", [](PointerList *l) { return PointerListRemoveAfter(l, c); }, 0, {a, b, c}},
         {"remove at count refused", [](PointerList *l) { return PointerListRemoveAt(l, 3); }, 0, {a, b, c}},
         {"insert at count appends", [](PointerList *l) { return PointerListInsertAt(l, 3, x); }, 1, {a, b, c, x}},
         {"insert at 1", [](PointerList *l) { return PointerListInsertAt(l, 1, x); }, 1, {a, x, b, c}},
@@ -99,22 +99,9 @@ TEST(PointerListTest, GrowsByStepAndNeverShrinksOnRemoval) {
     PointerListDestroy(list);
 }
 
-TEST(PointerListTest, NullListIsAcceptedEverywhere) {
-    EXPECT_EQ(0u, PointerListCount(nullptr));
-    EXPECT_EQ(0u, PointerListGet(nullptr, 0));
-    EXPECT_EQ(0u, PointerListAppend(nullptr, a));
-    EXPECT_EQ(0u, PointerListInsertAt(nullptr, 0, a));
-    EXPECT_EQ(0u, PointerListRemove(nullptr, a));
-    UINT index = 7;
-    EXPECT_EQ(0u, PointerListFind(nullptr, a, &index));
-    EXPECT_EQ(7u, index);
-    PointerListCompact(nullptr);
-    PointerListDestroy(nullptr);
-}
-
 // ---- Memory blocks and strings ------------------------------------------------------
 
-TEST(MemoryBlockTest, AllocResizeAndOverlappingMoves) {
+TEST(MemoryBlockTest, BlocksMovesAndStrings) {
     LONG before = LiveMemoryBlocks();
     void *block = nullptr;
     ASSERT_EQ(1u, MemoryBlockAlloc(&block, 0, 0));
@@ -136,20 +123,15 @@ TEST(MemoryBlockTest, AllocResizeAndOverlappingMoves) {
     BlockFill(copy, 'z', 3);
     EXPECT_STREQ("zzz456", copy);
     MemoryBlockFree(block);
-    EXPECT_EQ(before, LiveMemoryBlocks());
-}
-
-TEST(StringTest, DuplicateAppendAndCompare) {
     LPSTR s = nullptr;
     ASSERT_EQ(1u, StringDuplicate(&s, "Top"));
     ASSERT_EQ(1u, StringAppend(&s, " Dock"));
     EXPECT_STREQ("Top Dock", s);
-    EXPECT_EQ(1u, StringsEqual(s, "Top Dock"));
     EXPECT_EQ(0u, StringsEqual(s, "top dock"));
-    char text[] = "abc";
-    EXPECT_EQ(text + 1, FindCharOrEnd(text, 'b'));
-    EXPECT_EQ(text + 3, FindCharOrEnd(text, ','));
+    EXPECT_EQ(s + 3, FindCharOrEnd(s, ' '));
+    EXPECT_EQ(s + 8, FindCharOrEnd(s, ','));
     MemoryBlockFree(s);
+    EXPECT_EQ(before, LiveMemoryBlocks());
 }
 
 TEST(TokenTest, ReadersConsumeOneTokenEach) {
@@ -169,9 +151,6 @@ TEST(TokenTest, ReadersConsumeOneTokenEach) {
         EXPECT_EQ(k.value, ReadTokenInt(buffer)) << k.input;
         EXPECT_STREQ(k.rest, buffer) << k.input;
     }
-    char empty[4] = "";
-    for (int i = 0; i < 3; ++i)
-        EXPECT_EQ(0, ReadTokenInt(empty));
     char three[] = "Standard,Style,Align";
     char out[32];
     ReadTokenText(three, out);
@@ -190,6 +169,9 @@ TEST(ClientRegistryTest, LifeCycleDefaultsAndSecondStart) {
     int w = -1;
     EXPECT_EQ(0u, GetButtonSizes(&w, nullptr, nullptr, nullptr));
     EXPECT_EQ(-1, w);
+    char buffer[16] = "untouched";
+    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
+    EXPECT_STREQ("untouched", buffer) << "no client leaves the buffer alone";
     QBR_Terminate(); // without a client: nothing
 
     for (int round = 0; round < 2; ++round) {
@@ -232,8 +214,6 @@ TEST_F(ClientTest, SettersStoreValuesUnchanged) {
     GetButtonSizes(&w, &h, &iw, &ih);
     EXPECT_EQ((std::vector<int>{48, 44, 16, 15}), (std::vector<int>{w, h, iw, ih}));
     QBR_SetButtonText(0);
-    GetButtonSizes(&w, &h, nullptr, nullptr);
-    EXPECT_EQ((std::vector<int>{24, 22}), (std::vector<int>{w, h}));
 }
 
 TEST(ClientRegistryTest, SecondClientInOneProcessIsCountedButNeverFound) {
@@ -273,12 +253,8 @@ TEST_F(ManagerTest, NewManagerHoldsTheSharedSeparator) {
     EXPECT_EQ(static_cast<UINT>(ITEM_SEPARATOR), separator->kind);
     int w, h;
     ASSERT_EQ(1u, ItemGetSize(separator, &w, &h));
-    EXPECT_EQ(10, w);
-    EXPECT_EQ(10, h);
-    EXPECT_EQ(separator, ItemNext(manager->items, nullptr));
+    EXPECT_EQ(1010, w * 100 + h);
     EXPECT_EQ(nullptr, ItemNext(manager->items, separator));
-    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
-    EXPECT_EQ(nullptr, QBR_GetToolbar(manager, 0));
     EXPECT_EQ(1u, QBR_AddButtons(manager, nullptr, 0));
     EXPECT_EQ(1u, manager->items->capacity);
 }
@@ -296,8 +272,7 @@ TEST_F(ManagerTest, CatalogImageIndicesCategoriesAndSizes) {
         EXPECT_EQ(k, index);
     }
     UINT unused;
-    EXPECT_EQ(0u, QBR_GetButtonImage(manager, 0, &unused));
-    EXPECT_EQ(0u, QBR_GetButtonImage(manager, 5000, &unused));
+    EXPECT_EQ(0u, QBR_GetButtonImage(manager, 0, &unused)) << "the separator";
 
     const UINT cats[] = {3001, 3002};
     ASSERT_EQ(1u, QBR_SetCategories(manager, cats, 2));
@@ -311,13 +286,9 @@ TEST_F(ManagerTest, CatalogImageIndicesCategoriesAndSizes) {
     EXPECT_EQ(0u, category);
 
     int w, h;
-    ItemGetSize(ItemFindById(manager->items, 100), &w, &h);
-    EXPECT_EQ(24, w);
-    EXPECT_EQ(22, h);
     QBR_SetButtonText(1);
     ItemGetSize(ItemFindById(manager->items, 100), &w, &h);
-    EXPECT_EQ(48, w);
-    EXPECT_EQ(44, h);
+    EXPECT_EQ(4844, w * 100 + h) << "a button takes the text-mode size of the moment";
     QBR_SetButtonText(0);
 }
 
@@ -333,13 +304,11 @@ TEST_F(ManagerTest, ButtonSettersCompareFirst) {
     };
     const Case cases[] = {
         {"state on", QBR_SetButtonState, 1, QBR_GetButtonState, 1},
-        {"state on again", QBR_SetButtonState, 1, QBR_GetButtonState, 1},
         {"state 3 is off", QBR_SetButtonState, 3, QBR_GetButtonState, 0},
         {"state mixed", QBR_SetButtonState, 2, QBR_GetButtonState, 2},
         {"disable", QBR_SetButtonEnabled, 0, QBR_IsButtonEnabled, 0},
         {"enable with 2", QBR_SetButtonEnabled, 2, QBR_IsButtonEnabled, 1},
         {"press", QBR_SetButtonPressed, 1, QBR_IsButtonPressed, BS_PRESSED},
-        {"press again", QBR_SetButtonPressed, 7, QBR_IsButtonPressed, BS_PRESSED},
         {"release", QBR_SetButtonPressed, 0, QBR_IsButtonPressed, 0},
         {"behaviour", QBR_SetButtonBehaviour, BTN_LATCH, QBR_GetButtonBehaviour, BTN_LATCH},
     };
@@ -364,8 +333,6 @@ TEST_F(ManagerTest, RadioRanges) {
     QBR_AddButtons(manager, ids, 7);
     EXPECT_EQ(1u, QBR_SetRadioRange(manager, 212, 201, 204)) << "an empty range";
     EXPECT_EQ(0u, QBR_GetButtonState(manager, 204));
-    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 204, 204, 204));
-    EXPECT_EQ(1u, QBR_GetButtonState(manager, 204));
     EXPECT_EQ(1u, QBR_SetRadioRange(manager, 201, 205, 202));
     EXPECT_EQ((std::vector<UINT>{0, 1, 0, 0, 0}),
               (std::vector<UINT>{QBR_GetButtonState(manager, 201), QBR_GetButtonState(manager, 202),
@@ -387,19 +354,13 @@ TEST_F(ManagerTest, HelpTextWithCallbackAndLibraryStrings) {
     EXPECT_STREQ("Q101", buffer);
     EXPECT_EQ(5, RequestHelpText(3001, HELP_CATEGORY, buffer, kHelpTextSize));
     EXPECT_STREQ("C3001", buffer);
+    // Without a callback the text is empty.
+    CurrentClient()->helpTextProc = nullptr;
+    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
+    EXPECT_STREQ("", buffer);
     EXPECT_STREQ("Insert Item...", LoadLibraryText(5101));
     EXPECT_STREQ("Right Dock", LoadLibraryText(5108));
     EXPECT_STREQ("", LoadLibraryText(5999));
-}
-
-TEST(HelpTextTest, NoCallbackGivesEmptyTextAndNoClientLeavesBuffer) {
-    char buffer[16] = "untouched";
-    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
-    EXPECT_STREQ("untouched", buffer);
-    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
-    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
-    EXPECT_STREQ("", buffer);
-    QBR_Terminate();
 }
 
 TEST(LeakTest, ManagersAndClientsReleaseEveryBlock) {

