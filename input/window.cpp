@@ -48,7 +48,10 @@ static void OnPaint(HWND window) {
 }
 
 static void ActivateHostFrame(HWND window) {
-    if (ToolbarManager *manager = ManagerOfToolbar(window)) SetActiveWindow(manager->frame);
+    ToolbarManager *manager = ManagerOfToolbar(window);
+    if (!manager) return;
+    SetActiveWindow(manager->frame);
+    KeepFloatingFramesAbove(manager);
 }
 
 // The library moves and sizes its own windows all the time, and none of those

@@ -511,7 +511,7 @@ bool Above(HWND window, HWND other) {
 // Floating frames stand above their host frame (they are owned by it), even
 // when a host builds them in WM_CREATE, before its frame is on screen, and
 // after the host is raised.
-TEST_F(ToolbarTest, FloatingFramesMadeBeforeTheirHostShowsEndAboveIt) {
+TEST_F(ToolbarTest, FloatingFramesStayAboveTheirHost) {
     HWND host = CreateWindowExA(0, "QbrTestFrame", "Hidden Host", WS_OVERLAPPEDWINDOW, 60, 60, 500, 400, nullptr,
                                 nullptr, GetModuleHandleA(nullptr), nullptr);
     ToolbarManager *hostManager = QBR_CreateManager(host);
@@ -529,6 +529,18 @@ TEST_F(ToolbarTest, FloatingFramesMadeBeforeTheirHostShowsEndAboveIt) {
     SetWindowPos(host, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
     Pump();
     EXPECT_TRUE(Above(floating, host)) << "after the host frame was raised";
+
+    // The window system may hand the activation to a floating frame (as when
+    // another top-level window of the program closes); a click on a docked
+    // toolbar then activates the host, which must not bury the frame.
+    HWND docked = QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, dock, ids, 2);
+    Pump();
+    SetActiveWindow(floating);
+    Pump();
+    SendMessageA(docked, WM_MOUSEACTIVATE, reinterpret_cast<WPARAM>(host), MAKELPARAM(HTCLIENT, WM_LBUTTONDOWN));
+    PumpFor(1000);
+    EXPECT_EQ(host, GetActiveWindow());
+    EXPECT_TRUE(Above(floating, host)) << "after a click on a docked toolbar activated the host";
     QBR_DestroyManager(hostManager);
     DestroyWindow(host);
     Pump();

@@ -86,6 +86,8 @@ constexpr UINT_PTR kWaitForOwnerTimer = 0x5101;
 constexpr UINT_PTR kSettleTimer = 0x5102;
 constexpr UINT kRestackPeriod = 250;
 void OnRestackTimer(HWND frame, UINT_PTR timer);
+// Puts the manager's shown floating frames back above their owner.
+void KeepFloatingFramesAbove(ToolbarManager *manager);
 UINT SwitchToFloating(HWND window);
 UINT SwitchToDocked(HWND window);
 UINT RewrapAllManagers(int newWidth, int newHeight);

@@ -292,6 +292,20 @@ static void ShowWithoutActivating(HWND window) {
     if (owner && !IsWindowVisible(owner)) SetTimer(window, kWaitForOwnerTimer, kRestackPeriod, nullptr);
 }
 
+// Activating the host frame from a click on a toolbar raises the frame; under
+// some window systems that happens again a moment later, without a message,
+// when it is exposed. The shown floating frames go back on top at once and
+// once more when that has settled.
+void KeepFloatingFramesAbove(ToolbarManager *manager) {
+    if (!manager) return;
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
+        HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
+        if (!frame || !IsWindowVisible(frame)) continue;
+        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+        SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
+    }
+}
+
 void OnRestackTimer(HWND frame, UINT_PTR timer) {
     KillTimer(frame, timer);
     HWND owner = GetWindow(frame, GW_OWNER);
