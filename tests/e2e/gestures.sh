@@ -1,0 +1,81 @@
+# Mouse gestures and window lookups shared by the end-to-end scripts that
+# rearrange toolbars. Source it after lib.sh. All coordinates are screen
+# coordinates, which Wine's virtual desktop shares with X.
+
+# Short pauses between steps: a drag with capture follows X input reliably
+# when each step has time to reach the program's queue.
+step() { sleep "${1:-0.05}"; }
+
+# Pumps the program through one round trip, so what the input did has been
+# handled before anyone looks.
+settle() { sleep 0.2; ctl ping "$main" 5000 >/dev/null || fail "the program does not answer"; }
+
+# A drag with mouse button $1 from ($2, $3) to ($4, $5), through a few points
+# on the way, as a hand moves.
+drag() {
+    local button=$1 x1=$2 y1=$3 x2=$4 y2=$5 i
+    xdotool mousemove "$x1" "$y1"
+    step 0.1
+    xdotool mousedown "$button"
+    step
+    for i in 1 2 3 4; do
+        xdotool mousemove $((x1 + (x2 - x1) * i / 4)) $((y1 + (y2 - y1) * i / 4))
+        step
+    done
+    step
+    xdotool mouseup "$button"
+    settle
+}
+ldrag() { drag 1 "$@"; }
+rdrag() { drag 3 "$@"; }
+
+# The separator gesture: a right press on a button, a few pixels sideways, a
+# release on the same button.
+nudge() {
+    local x=$1 y=$2 dx=$3
+    xdotool mousemove "$x" "$y"
+    step 0.1
+    xdotool mousedown 3
+    step
+    xdotool mousemove $((x + dx)) "$y"
+    step
+    xdotool mouseup 3
+    settle
+}
+
+# "visible left top right bottom" of one window of a toolbar of frame $1:
+# $2 is pane or frame, $3 the title. Empty if there is no such window.
+toolbar_rect() {
+    ctl toolbars "$1" | awk -v k="$2" -v t="$3" '
+        { title = $0; sub(/^[^ ]+ [^ ]+ [^ ]+ [^ ]+ [^ ]+ [^ ]+ /, "", title) }
+        $1 == k && title == t { print $2, $3, $4, $5, $6 }'
+}
+
+# "visible left top right bottom" of the dock on side $2 (top, left, right)
+# of frame $1, found by its place: the top dock is the highest, at the
+# client area's top; the side docks start below it, the left one at the
+# client area's left edge, which the top dock shares.
+dock_rect() {
+    ctl docks "$1" | sort -n -k3 | awk -v side="$2" '
+        { v[NR] = $0; l[NR] = $2 }
+        END {
+            if (NR == 0) exit
+            if (side == "top") { print v[1]; exit }
+            for (i = 2; i <= NR; i++)
+                if ((side == "left") == (l[i] <= l[1] + 1)) { print v[i]; exit }
+        }'
+}
+
+# Centre of the button at place $3 (0 = first) of a docked or floating
+# toolbar window whose outer rectangle starts at ($1, $2), counting only
+# buttons before the first separator: a pane has a one-pixel border and an
+# item area 6 pixels in and 3 down; buttons share one pixel column.
+button_centre() { # left top index [buttonWidth buttonHeight]
+    local w=${4:-24} h=${5:-22}
+    echo $(($1 + 1 + 6 + ($w - 1) * $3 + $w / 2)) $(($2 + 1 + 3 + $h / 2))
+}
+
+# Centre of a floating frame's caption band, away from the close box.
+caption_point() { # left top right bottom
+    echo $(($1 + 20)) $(($2 + 8))
+}
