@@ -9,6 +9,11 @@ void GdiCountMade() { ++liveGdiObjects; }
 void GdiCountDeleted() { --liveGdiObjects; }
 LONG LiveGdiObjects() { return liveGdiObjects; }
 
+extern "C" void QBR_GetLiveCounts(LONG *memoryBlocks, LONG *gdiObjects) {
+    if (memoryBlocks) *memoryBlocks = LiveMemoryBlocks();
+    if (gdiObjects) *gdiObjects = LiveGdiObjects();
+}
+
 HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName) {
     LOGFONTA font;
     BlockFill(&font, 0, sizeof(font));

@@ -49,7 +49,8 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     // many toolbars that alone took minutes).
     for (UINT i = 0; i < PointerListCount(manager->docks); ++i)
         if (DockArea *dock = ListAt<DockArea>(manager->docks, i))
-            while (UINT count = PointerListCount(dock->toolbars)) PointerListRemoveAt(dock->toolbars, count - 1);
+            while (UINT count = PointerListCount(dock->toolbars))
+                PointerListRemoveAt(dock->toolbars, count - 1);
     while (UINT count = PointerListCount(manager->toolbars))
         DestroyToolbarRecord(ListAt<ToolbarRecord>(manager->toolbars, count - 1));
     PointerListDestroy(manager->toolbars);

@@ -121,6 +121,14 @@ void DestroyMainContents() {
 }
 
 LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    // A leak check from outside the process: the library's live memory blocks
+    // (wParam 0) or GDI objects (wParam 1), which the platform cannot report.
+    static const UINT countersMessage = RegisterWindowMessageA("QBR_DemoCounters");
+    if (message == countersMessage && countersMessage) {
+        LONG blocks = 0, gdiObjects = 0;
+        QBR_GetLiveCounts(&blocks, &gdiObjects);
+        return wParam ? gdiObjects : blocks;
+    }
     switch (message) {
     case WM_CREATE:
         return OnMainCreate(window);
@@ -334,9 +342,11 @@ void ToggleGlobal(HWND frame, UINT command) {
 }
 
 HWND CreateEditControl(HWND frame, HFONT *font) {
-    HWND edit = CreateWindowExA(
-        0, "Edit", "", WS_CHILD | WS_VISIBLE | WS_VSCROLL | WS_BORDER | ES_MULTILINE | ES_AUTOVSCROLL, 0, 0, 0, 0,
-        frame, reinterpret_cast<HMENU>(static_cast<INT_PTR>(kEditId)), moduleInstance, nullptr);
+    // Clipped by its siblings: the side docks lie over it.
+    constexpr DWORD style =
+        WS_CHILD | WS_VISIBLE | WS_CLIPSIBLINGS | WS_VSCROLL | WS_BORDER | ES_MULTILINE | ES_AUTOVSCROLL;
+    HWND edit = CreateWindowExA(0, "Edit", "", style, 0, 0, 0, 0, frame,
+                                reinterpret_cast<HMENU>(static_cast<INT_PTR>(kEditId)), moduleInstance, nullptr);
     *font = MakeDemoFont(11, VARIABLE_PITCH | FF_ROMAN, "Times New Roman");
     if (edit) SendMessageA(edit, WM_SETFONT, reinterpret_cast<WPARAM>(*font), 0);
     return edit;
@@ -362,9 +372,10 @@ void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND
         SetWindowPos(statusBar, nullptr, client.left, client.bottom - statusHeight, client.right, statusHeight,
                      SWP_NOZORDER | SWP_NOACTIVATE);
     }
+    // At the bottom of the z-order: the side docks lie over it and must get the mouse.
     if (edit)
-        SetWindowPos(edit, nullptr, client.left - 1, topSpace - 1, client.right + 1,
-                     client.bottom - topSpace - statusHeight + 1, SWP_NOZORDER | SWP_NOACTIVATE);
+        SetWindowPos(edit, HWND_BOTTOM, client.left - 1, topSpace - 1, client.right + 1,
+                     client.bottom - topSpace - statusHeight + 1, SWP_NOACTIVATE);
 }
 
 INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM) {

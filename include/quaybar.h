@@ -124,6 +124,10 @@ UINT QBR_GetLayoutEntry(UINT index, LPSTR key, LPSTR value);
 /* The lengths of entry `index`'s key and value, without terminators, so that a
    host can size its buffers before QBR_GetLayoutEntry. 0 for a bad index. */
 UINT QBR_GetLayoutEntrySize(UINT index, UINT *keyLength, UINT *valueLength);
+
+/* Diagnostics: the memory blocks and GDI objects the library holds now, for a
+   host's own leak checks (the platform cannot be asked under every system). */
+void QBR_GetLiveCounts(LONG *memoryBlocks, LONG *gdiObjects);
 void QBR_FreeLayout(void);
 UINT QBR_BeginLayout(void);
 UINT QBR_AddLayoutEntry(LPCSTR key, LPCSTR value);

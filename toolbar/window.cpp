@@ -314,8 +314,7 @@ void OnRestackTimer(HWND frame, UINT_PTR timer) {
         SetTimer(frame, IsWindowVisible(owner) ? kSettleTimer : kWaitForOwnerTimer, kRestackPeriod, nullptr);
         return;
     }
-    if (IsWindowVisible(frame))
-        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+    if (IsWindowVisible(frame)) SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
 }
 
 UINT ShowToolbarWindow(HWND window, UINT show) {
