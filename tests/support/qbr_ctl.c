@@ -43,8 +43,8 @@ static void PrintWindowLine(HWND window, const char *kind) {
     char title[256] = "";
     GetWindowRect(window, &r);
     GetWindowTextA(window, title, sizeof(title));
-    printf("%s%s%d %ld %ld %ld %ld%s%s\n", kind ? kind : "", kind ? " " : "", IsWindowVisible(window) ? 1 : 0,
-           r.left, r.top, r.right, r.bottom, kind ? " " : "", kind ? title : "");
+    printf("%s%s%d %ld %ld %ld %ld%s%s\n", kind ? kind : "", kind ? " " : "", IsWindowVisible(window) ? 1 : 0, r.left,
+           r.top, r.right, r.bottom, kind ? " " : "", kind ? title : "");
 }
 
 static BOOL CALLBACK PrintToolbarChild(HWND child, LPARAM unused) {
@@ -56,7 +56,8 @@ static BOOL CALLBACK PrintToolbarChild(HWND child, LPARAM unused) {
 /* Only the windows of one frame: the panes under it and the floating frames
    it owns. View windows run on the same thread and are left out. */
 static BOOL CALLBACK PrintToolbarTop(HWND window, LPARAM frame) {
-    if (window == (HWND)frame) EnumChildWindows(window, PrintToolbarChild, 0);
+    if (window == (HWND)frame)
+        EnumChildWindows(window, PrintToolbarChild, 0);
     else if (GetWindow(window, GW_OWNER) == (HWND)frame && IsClass(window, "QBR_ToolbarWindow"))
         PrintWindowLine(window, "frame");
     return TRUE;

@@ -1,0 +1,561 @@
+// The demonstration program's view windows and About box, run in this
+// process on the program's own resources (demo_view_test.rc): the program's
+// sources are built in, the main window is made as WinMain makes it, and
+// views are opened with its "Open Another Window" command.
+#include <windows.h>
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+#include "harness.h"
+#include "modal.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+// The fonts the program makes and deletes, counted where it makes them: the
+// platform cannot tell how many GDI objects a process holds.
+namespace {
+int fontsMade = 0;
+int fontsDeleted = 0;
+HFONT CountedCreateFont(const LOGFONTA *font) {
+    HFONT made = CreateFontIndirectA(font);
+    if (made) ++fontsMade;
+    return made;
+}
+BOOL CountedDeleteObject(HGDIOBJ object) {
+    const bool font = GetObjectType(object) == OBJ_FONT;
+    const BOOL deleted = DeleteObject(object);
+    if (deleted && font) ++fontsDeleted;
+    return deleted;
+}
+} // namespace
+
+#define CreateFontIndirectA CountedCreateFont
+#define DeleteObject CountedDeleteObject
+#include "demo/main.cpp"
+#include "demo/settings.cpp"
+#include "demo/statusbar.cpp"
+#include "demo/tables.cpp"
+#undef CreateFontIndirectA
+#undef DeleteObject
+
+namespace {
+
+// ---- Finding the program's windows -------------------------------------------------
+
+std::vector<HWND> WindowsOfClass(const char *className) {
+    struct Search {
+        const char *name;
+        std::vector<HWND> found;
+    } search{className, {}};
+    EnumThreadWindows(
+        GetCurrentThreadId(),
+        [](HWND window, LPARAM data) -> BOOL {
+            auto *s = reinterpret_cast<Search *>(data);
+            char name[64] = "";
+            GetClassNameA(window, name, sizeof name);
+            if (std::string(name) == s->name) s->found.push_back(window);
+            return TRUE;
+        },
+        reinterpret_cast<LPARAM>(&search));
+    return search.found;
+}
+
+ToolbarManager *ManagerOfView(HWND view) { return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(view, 0)); }
+
+// The pane of the toolbar with this title, or null.
+HWND PaneTitled(ToolbarManager *manager, const char *title) {
+    for (UINT i = 0; i < QBR_GetToolbarCount(manager); ++i) {
+        HWND pane = QBR_GetToolbar(manager, i);
+        char text[64] = "";
+        QBR_GetToolbarTitle(pane, text, sizeof text);
+        if (std::string(text) == title) return pane;
+    }
+    return nullptr;
+}
+
+// The screen centre of the button `id` on a toolbar's pane.
+POINT ButtonCentre(HWND pane, UINT id) {
+    ToolbarRecord *record = RecordOfWindow(pane);
+    for (UINT i = 0; record && ItemAt(record, i); ++i) {
+        if (ItemAt(record, i)->id != id) continue;
+        RECT r = {};
+        GetItemRect(record, i, &r);
+        POINT p = Centre(r);
+        ClientToScreen(pane, &p);
+        return p;
+    }
+    ADD_FAILURE() << "no button " << id;
+    return POINT{-1, -1};
+}
+
+bool MenuChecked(HWND frame, UINT id) { return (GetMenuState(GetMenu(frame), id, MF_BYCOMMAND) & MF_CHECKED) != 0; }
+
+// The radio group 304..307 as the buttons have it: the id that is on, 0 for none.
+UINT RadioOn(ToolbarManager *manager) {
+    UINT on = 0;
+    for (UINT id = 304; id <= 307; ++id)
+        if (QBR_GetButtonState(manager, id) & BS_ON) on = on ? 9999 : id;
+    return on;
+}
+// The same from a frame's menu.
+UINT MenuRadioOn(HWND frame) {
+    UINT on = 0;
+    for (UINT id = 304; id <= 307; ++id)
+        if (MenuChecked(frame, id)) on = on ? 9999 : id;
+    return on;
+}
+
+int Height(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    return r.bottom - r.top;
+}
+
+// ---- Fixture: the program's main window and its views ----------------------------------
+
+class DemoViewTest : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        moduleInstance = GetModuleHandleA(nullptr);
+        // Every test starts from the default toolbars.
+        DeleteFileA(SettingsPath());
+        ASSERT_EQ(RegisterMainWindow(), 1u);
+        mainWindow = FindWindowA("TestQBRApp", nullptr);
+        ASSERT_NE(mainWindow, nullptr);
+        Pump();
+        ASSERT_NE(mainManager, nullptr);
+    }
+    void TearDown() override {
+        ModalSteps::Stop();
+        // Views first: the main window ends the client, which their managers belong to.
+        for (HWND view : WindowsOfClass("TestQBRView"))
+            SendMessageA(view, WM_CLOSE, 0, 0);
+        if (IsWindow(mainWindow)) SendMessageA(mainWindow, WM_CLOSE, 0, 0);
+        Pump();
+        EXPECT_TRUE(WindowsOfClass("TestQBRView").empty());
+        DeleteFileA(SettingsPath());
+    }
+    // Opens a view with the main window's command; gives the new window.
+    HWND OpenView() {
+        std::vector<HWND> before = WindowsOfClass("TestQBRView");
+        SendMessageA(mainWindow, WM_COMMAND, kOpenViewCommand, 0);
+        Pump();
+        for (HWND view : WindowsOfClass("TestQBRView"))
+            if (std::find(before.begin(), before.end(), view) == before.end()) return view;
+        ADD_FAILURE() << "no new view window";
+        return nullptr;
+    }
+    // A left click with the real mouse on the button `id` of a pane, the
+    // pane's frame brought to the top first.
+    void ClickButton(HWND frame, HWND pane, UINT id) {
+        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
+        SetForegroundWindow(frame);
+        Pump();
+        POINT p = ButtonCentre(pane, id);
+        ASSERT_EQ(WindowFromPoint(p), pane) << "button " << id << " is covered";
+        PlaceCursor(p);
+        SendButton(MOUSEEVENTF_LEFTDOWN);
+        Pump();
+        SendButton(MOUSEEVENTF_LEFTUP);
+        Pump();
+    }
+    HWND mainWindow = nullptr;
+};
+
+TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
+    HWND a = OpenView(), b = OpenView();
+    ASSERT_TRUE(a && b);
+    ToolbarManager *ma = ManagerOfView(a), *mb = ManagerOfView(b);
+    ASSERT_TRUE(ma && mb);
+    EXPECT_NE(ma, mb);
+    EXPECT_NE(ma, mainManager);
+    for (ToolbarManager *m : {ma, mb}) {
+        EXPECT_EQ(QBR_GetToolbarCount(m), 2u);
+        EXPECT_NE(PaneTitled(m, "Standard"), nullptr);
+        EXPECT_NE(PaneTitled(m, "Style"), nullptr);
+        EXPECT_EQ(PaneTitled(m, "Palette"), nullptr);
+    }
+    char title[64] = "";
+    GetWindowTextA(a, title, sizeof title);
+    EXPECT_STREQ(title, "View Window");
+    EXPECT_EQ(GetWindow(a, GW_OWNER), nullptr) << "a view is not owned by the main window";
+
+    // Each step acts on one frame; afterwards every frame's group is checked,
+    // on its buttons and on its menu.
+    struct Step {
+        const char *what;
+        HWND frame;
+        UINT id;
+        bool realClick; // else the menu's WM_COMMAND
+        UINT expectMain, expectA, expectB;
+    } const steps[] = {
+        {"at the start", nullptr, 0, false, 304, 304, 304},
+        {"click Right in view A", a, 306, true, 304, 306, 304},
+        {"menu Justified in view B", b, 307, false, 304, 306, 307},
+        {"menu Centered in the main window", mainWindow, 305, false, 305, 306, 307},
+        {"click Left in view B", b, 304, true, 305, 306, 304},
+    };
+    for (const Step &s : steps) {
+        SCOPED_TRACE(s.what);
+        if (s.frame && s.realClick) {
+            ToolbarManager *m = s.frame == a ? ma : mb;
+            ClickButton(s.frame, PaneTitled(m, "Style"), s.id);
+        } else if (s.frame) {
+            SendMessageA(s.frame, WM_COMMAND, s.id, 0);
+            Pump();
+        }
+        EXPECT_EQ(RadioOn(mainManager), s.expectMain);
+        EXPECT_EQ(RadioOn(ma), s.expectA);
+        EXPECT_EQ(RadioOn(mb), s.expectB);
+        EXPECT_EQ(MenuRadioOn(mainWindow), s.expectMain);
+        EXPECT_EQ(MenuRadioOn(a), s.expectA);
+        EXPECT_EQ(MenuRadioOn(b), s.expectB);
+    }
+
+    // A check button toggles in its own frame only.
+    const UINT boldBefore = QBR_GetButtonState(mainManager, 301);
+    ClickButton(a, PaneTitled(ma, "Style"), 301);
+    EXPECT_EQ(QBR_GetButtonState(ma, 301) & BS_ON, static_cast<UINT>(BS_ON));
+    EXPECT_EQ(QBR_GetButtonState(mb, 301) & BS_ON, 0u);
+    EXPECT_EQ(QBR_GetButtonState(mainManager, 301), boldBefore);
+
+    // The Toolbars submenu of a view lists that view's toolbars.
+    HMENU viewPopup = GetSubMenu(GetMenu(a), 2);
+    HMENU toolbars = GetSubMenu(viewPopup, GetMenuItemCount(viewPopup) - 1);
+    ASSERT_NE(toolbars, nullptr);
+    SendMessageA(a, WM_INITMENUPOPUP, reinterpret_cast<WPARAM>(toolbars), 2);
+    EXPECT_EQ(DescribeMenu(toolbars), "Standard*:8500 | Style*:8501");
+    // Its entry hides that view's toolbar, not the other view's.
+    SendMessageA(a, WM_COMMAND, kToolbarsMenuBase + 1, 0);
+    Pump();
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(ma, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mb, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mainManager, "Style")));
+}
+
+TEST_F(DemoViewTest, ButtonTextRewrapsEveryFrameButChecksOnlyTheMenuThatAsked) {
+    HWND a = OpenView(), b = OpenView();
+    ASSERT_TRUE(a && b);
+    HWND panes[] = {PaneTitled(mainManager, "Standard"), PaneTitled(ManagerOfView(a), "Standard"),
+                    PaneTitled(ManagerOfView(b), "Standard")};
+    int before[3];
+    for (int i = 0; i < 3; ++i) {
+        ASSERT_NE(panes[i], nullptr);
+        before[i] = Height(panes[i]);
+    }
+    ASSERT_FALSE(QBR_GetButtonText());
+
+    SendMessageA(a, WM_COMMAND, kButtonTextCommand, 0);
+    Pump();
+    EXPECT_TRUE(QBR_GetButtonText());
+    for (int i = 0; i < 3; ++i)
+        EXPECT_GT(Height(panes[i]), before[i]) << "frame " << i << " kept its small buttons";
+    EXPECT_TRUE(MenuChecked(a, kButtonTextCommand));
+    EXPECT_FALSE(MenuChecked(b, kButtonTextCommand)) << "another view's check mark changed";
+    EXPECT_FALSE(MenuChecked(mainWindow, kButtonTextCommand));
+
+    // Turned off from the main window: every frame goes back to its rows.
+    SendMessageA(mainWindow, WM_COMMAND, kButtonTextCommand, 0);
+    Pump();
+    EXPECT_FALSE(QBR_GetButtonText());
+    for (int i = 0; i < 3; ++i)
+        EXPECT_EQ(Height(panes[i]), before[i]) << "frame " << i;
+    EXPECT_TRUE(MenuChecked(a, kButtonTextCommand)) << "the view's mark stays stale until its own toggle";
+
+    // Quick help follows the same rule.
+    const UINT quickHelp = QBR_GetQuickHelp();
+    SendMessageA(b, WM_COMMAND, kQuickHelpCommand, 0);
+    EXPECT_EQ(QBR_GetQuickHelp(), quickHelp ? 0u : 1u);
+    EXPECT_EQ(MenuChecked(b, kQuickHelpCommand), !quickHelp);
+    EXPECT_EQ(MenuChecked(a, kQuickHelpCommand), !!quickHelp);
+}
+
+TEST_F(DemoViewTest, ClosingOneViewLeavesTheOtherWorking) {
+    HWND a = OpenView(), b = OpenView();
+    ASSERT_TRUE(a && b);
+    const int fontsHeld = fontsMade - fontsDeleted;
+    HFONT bFont = reinterpret_cast<HFONT>(SendDlgItemMessageA(b, kEditId, WM_GETFONT, 0, 0));
+    HFONT aFont = reinterpret_cast<HFONT>(SendDlgItemMessageA(a, kEditId, WM_GETFONT, 0, 0));
+    ASSERT_NE(aFont, bFont);
+
+    SendMessageA(a, WM_COMMAND, kExitCommand, 0); // Exit in a view closes that view
+    Pump();
+    EXPECT_FALSE(IsWindow(a));
+    EXPECT_TRUE(IsWindow(mainWindow));
+    EXPECT_EQ(fontsMade - fontsDeleted, fontsHeld - 1) << "the closed view's edit font";
+    EXPECT_EQ(GetObjectType(bFont), static_cast<DWORD>(OBJ_FONT)) << "the other view's edit font went too";
+
+    ToolbarManager *mb = ManagerOfView(b);
+    ASSERT_NE(mb, nullptr);
+    EXPECT_EQ(QBR_GetToolbarCount(mb), 2u);
+    ClickButton(b, PaneTitled(mb, "Style"), 307);
+    EXPECT_EQ(RadioOn(mb), 307u);
+    EXPECT_EQ(MenuRadioOn(b), 307u);
+    // Its edit control still follows the frame's size.
+    SetWindowPos(b, nullptr, 0, 0, 500, 400, SWP_NOMOVE | SWP_NOZORDER);
+    Pump();
+    RECT client, edit;
+    GetClientRect(b, &client);
+    GetWindowRect(GetDlgItem(b, kEditId), &edit);
+    EXPECT_EQ(edit.right - edit.left, client.right + 1);
+}
+
+TEST_F(DemoViewTest, ViewLayoutIsSavedWhenAViewClosesAndRestoredByTheNextView) {
+    HWND a = OpenView();
+    ASSERT_NE(a, nullptr);
+    // Style hidden in the first view.
+    SendMessageA(a, WM_COMMAND, kToolbarsMenuBase + 1, 0);
+    Pump();
+    ASSERT_FALSE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(a), "Style")));
+    char value[256] = "";
+    EXPECT_EQ(GetPrivateProfileStringA(kViewLayout, "Style", "", value, sizeof value, SettingsPath()), 0u)
+        << "saved before the view closed";
+
+    // A second view opened meanwhile has the defaults: nothing was saved yet.
+    HWND b = OpenView();
+    ASSERT_NE(b, nullptr);
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(b), "Style")));
+
+    SendMessageA(a, WM_CLOSE, 0, 0);
+    Pump();
+    GetPrivateProfileStringA(kViewLayout, "Top Dock", "", value, sizeof value, SettingsPath());
+    EXPECT_STREQ(value, "Standard,Style");
+    GetPrivateProfileStringA(kViewLayout, "Style", "", value, sizeof value, SettingsPath());
+    EXPECT_STRNE(value, "");
+    char mainValue[256] = "";
+    EXPECT_EQ(GetPrivateProfileStringA(kMainLayout, "Style", "", mainValue, sizeof mainValue, SettingsPath()), 0u)
+        << "a view wrote the main window's section";
+
+    // The next view restores the hidden Style; the one still open is untouched.
+    HWND c = OpenView();
+    ASSERT_NE(c, nullptr);
+    ToolbarManager *mc = ManagerOfView(c);
+    ASSERT_NE(mc, nullptr);
+    EXPECT_EQ(QBR_GetToolbarCount(mc), 2u);
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(mc, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mc, "Standard")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(b), "Style")));
+    // Radio group and globals are set up as for a fresh view.
+    EXPECT_EQ(RadioOn(mc), 304u);
+    EXPECT_EQ(MenuRadioOn(c), 304u);
+
+    // Closing the last of them writes what it shows.
+    SendMessageA(b, WM_CLOSE, 0, 0);
+    Pump();
+    SendMessageA(c, WM_CLOSE, 0, 0);
+    Pump();
+    HWND d = OpenView();
+    ASSERT_NE(d, nullptr);
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(d), "Style"))) << "the view closed last wins";
+}
+
+// ---- The About box ---------------------------------------------------------------------
+
+HWND AboutBox() { return FindWindowA("#32770", "About QBR"); }
+
+struct AboutSeen {
+    bool opened = false;
+    RECT rect = {};
+    HFONT textFont = nullptr;
+    bool sameFontOnAllThree = false;
+    bool fontAlive = false;
+    int fontsHeldWhileOpen = 0;
+    UINT pressedWhileOpen = 0;
+    bool closed = false;
+};
+
+enum class Close { OkButton, EscapeKey, SystemMenu };
+
+// Steps that wait for the About box, look at it, and close it the way given.
+void AboutSteps(AboutSeen &seen, Close how, ToolbarManager *manager, int fontsHeldBefore) {
+    ModalSteps::Until([] { return AboutBox() != nullptr && IsWindowVisible(AboutBox()); });
+    ModalSteps::Add([&seen, how, manager, fontsHeldBefore] {
+        HWND box = AboutBox();
+        seen.opened = true;
+        GetWindowRect(box, &seen.rect);
+        seen.textFont = reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8001, WM_GETFONT, 0, 0));
+        seen.sameFontOnAllThree =
+            seen.textFont &&
+            seen.textFont == reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8002, WM_GETFONT, 0, 0)) &&
+            seen.textFont == reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8003, WM_GETFONT, 0, 0)) &&
+            seen.textFont != reinterpret_cast<HFONT>(SendDlgItemMessageA(box, IDOK, WM_GETFONT, 0, 0));
+        seen.fontAlive = GetObjectType(seen.textFont) == OBJ_FONT;
+        seen.fontsHeldWhileOpen = fontsMade - fontsDeleted - fontsHeldBefore;
+        seen.pressedWhileOpen = manager ? QBR_IsButtonPressed(manager, kAboutCommand) : 0;
+        switch (how) {
+        case Close::OkButton: {
+            RECT ok;
+            GetWindowRect(GetDlgItem(box, IDOK), &ok);
+            ClickAtStep(Centre(ok));
+            break;
+        }
+        case Close::EscapeKey: {
+            INPUT keys[2] = {};
+            keys[0].type = keys[1].type = INPUT_KEYBOARD;
+            keys[0].ki.wVk = keys[1].ki.wVk = VK_ESCAPE;
+            keys[1].ki.dwFlags = KEYEVENTF_KEYUP;
+            SendInput(2, keys, sizeof(INPUT));
+            break;
+        }
+        case Close::SystemMenu:
+            PostMessageA(box, WM_SYSCOMMAND, SC_CLOSE, 0);
+            break;
+        }
+    });
+    ModalSteps::Until([&seen] {
+        seen.closed = AboutBox() == nullptr;
+        return seen.closed;
+    });
+}
+
+// Pumps until the steps saw the box close (the modal loop runs inside a
+// dispatch of this loop when a button opened it).
+void RunUntilClosed(const AboutSeen &seen) {
+    for (int round = 0; round < 600 && !seen.closed; ++round)
+        PumpFor(5);
+    Pump();
+    ModalSteps::Stop();
+}
+
+TEST_F(DemoViewTest, AboutBoxOpensFromMenuAndLatchedButtonOfBothFramesAndClearsTheButton) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    // The main window away in a corner: the box is placed by the screen.
+    SetWindowPos(mainWindow, nullptr, 0, 0, 620, 440, SWP_NOZORDER);
+    Pump();
+    enum How { Menu, Button };
+    struct Case {
+        const char *what;
+        HWND frame;
+        How how;
+        Close close;
+    } const cases[] = {
+        {"main menu, OK", mainWindow, Menu, Close::OkButton},
+        {"main button, Escape", mainWindow, Button, Close::EscapeKey},
+        {"view button, system menu", view, Button, Close::SystemMenu},
+        {"view menu, OK", view, Menu, Close::OkButton},
+        {"view button again, OK", view, Button, Close::OkButton},
+    };
+    const int cx = GetSystemMetrics(SM_CXSCREEN), cy = GetSystemMetrics(SM_CYSCREEN);
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.what);
+        ToolbarManager *manager = c.frame == mainWindow ? mainManager : ManagerOfView(c.frame);
+        ASSERT_NE(manager, nullptr);
+        const int made = fontsMade, deleted = fontsDeleted;
+        AboutSeen seen;
+        AboutSteps(seen, c.close, manager, made - deleted);
+        if (c.how == Menu) {
+            SendMessageA(c.frame, WM_COMMAND, kAboutCommand, 0); // returns when the box closed
+        } else {
+            ClickButton(c.frame, PaneTitled(manager, "Standard"), kAboutCommand);
+        }
+        RunUntilClosed(seen);
+        ASSERT_TRUE(seen.opened);
+        ASSERT_TRUE(seen.closed);
+        const int w = seen.rect.right - seen.rect.left, h = seen.rect.bottom - seen.rect.top;
+        EXPECT_EQ(seen.rect.left, (cx - w) / 2);
+        EXPECT_EQ(seen.rect.top, (cy - h) / 3);
+        EXPECT_TRUE(seen.sameFontOnAllThree) << "8001..8003 share the box's own font";
+        EXPECT_TRUE(seen.fontAlive);
+        EXPECT_EQ(seen.fontsHeldWhileOpen, 1);
+        EXPECT_EQ(fontsMade - made, 1) << "one font per opening";
+        EXPECT_EQ(fontsDeleted - deleted, 1) << "and it is deleted at the close";
+        EXPECT_NE(GetObjectType(seen.textFont), static_cast<DWORD>(OBJ_FONT));
+        if (c.how == Button) EXPECT_NE(seen.pressedWhileOpen, 0u) << "the latched button stays down while open";
+        EXPECT_EQ(QBR_IsButtonPressed(manager, kAboutCommand), 0u) << "the button is cleared at the close";
+        EXPECT_TRUE(IsWindowEnabled(c.frame)) << "the frame is usable again";
+    }
+}
+
+TEST_F(DemoViewTest, HelpOpensThroughWinHelpWithoutHangingAndTheBoxStaysOpen) {
+    const int fontsHeld = fontsMade - fontsDeleted;
+    // The help viewer is disabled here; the call must come back all the same.
+    SendMessageA(mainWindow, WM_COMMAND, kHelpContentsCommand, 0);
+    Pump();
+    EXPECT_TRUE(IsWindow(mainWindow));
+
+    AboutSeen seen;
+    bool openAfterHelp = false;
+    ModalSteps::Until([] { return AboutBox() != nullptr; });
+    ModalSteps::Add([] {
+        RECT help;
+        GetWindowRect(GetDlgItem(AboutBox(), 8004), &help);
+        ClickAtStep(Centre(help));
+    });
+    ModalSteps::Add([&] {
+        openAfterHelp = AboutBox() != nullptr;
+        PostMessageA(AboutBox(), WM_COMMAND, IDOK, 0);
+    });
+    ModalSteps::Until([&] {
+        seen.closed = AboutBox() == nullptr;
+        return seen.closed;
+    });
+    SendMessageA(mainWindow, WM_COMMAND, kAboutCommand, 0);
+    RunUntilClosed(seen);
+    EXPECT_TRUE(openAfterHelp) << "Help closed the About box";
+    EXPECT_TRUE(seen.closed);
+    EXPECT_EQ(fontsMade - fontsDeleted, fontsHeld) << "Help or the box left a font behind";
+}
+
+// ---- Views whose parts cannot be made ----------------------------------------------------
+
+// A thread hook that refuses the creation of every window of one class.
+const char *refusedClass = nullptr;
+LRESULT CALLBACK RefuseCreation(int code, WPARAM wParam, LPARAM lParam) {
+    if (code == HCBT_CREATEWND && refusedClass) {
+        char name[64] = "";
+        GetClassNameA(reinterpret_cast<HWND>(wParam), name, sizeof name);
+        if (lstrcmpiA(name, refusedClass) == 0) return 1;
+    }
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+
+TEST_F(DemoViewTest, AViewWhosePartsCannotBeMadeStillRunsAndCloses) {
+    struct Case {
+        const char *refused;
+        bool hasManager;
+    } const cases[] = {
+        {"Edit", false},           // the view stays an empty frame
+        {"QBR_DockWindow", false}, // no dock: the toolbars are given up
+        {"QBR_ToolbarWindow", true},
+        {"StatusBar", true},
+    };
+    const int fontsHeld = fontsMade - fontsDeleted;
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.refused);
+        refusedClass = c.refused;
+        HHOOK hook = SetWindowsHookExA(WH_CBT, RefuseCreation, nullptr, GetCurrentThreadId());
+        ASSERT_NE(hook, nullptr);
+        HWND view = OpenView();
+        UnhookWindowsHookEx(hook);
+        refusedClass = nullptr;
+        ASSERT_NE(view, nullptr);
+        EXPECT_EQ(ManagerOfView(view) != nullptr, c.hasManager);
+        // Every command, the Toolbars submenu, menu selection and sizing.
+        for (UINT id : {304u, 306u, kToolbarsMenuBase, kToolbarsMenuBase + 1, kQuickHelpCommand, kQuickHelpCommand,
+                        kButtonTextCommand, kButtonTextCommand, 101u, 153u})
+            SendMessageA(view, WM_COMMAND, id, 0);
+        HMENU viewPopup = GetSubMenu(GetMenu(view), 2);
+        SendMessageA(view, WM_INITMENUPOPUP, reinterpret_cast<WPARAM>(GetSubMenu(viewPopup, 2)), 2);
+        SendMessageA(view, WM_MENUSELECT, MAKEWPARAM(304, 0), 0);
+        SendMessageA(view, WM_MENUSELECT, MAKEWPARAM(0, 0xFFFF), 0);
+        SetWindowPos(view, nullptr, 0, 0, 300, 200, SWP_NOMOVE | SWP_NOZORDER);
+        Pump();
+        EXPECT_TRUE(IsWindow(view));
+        SendMessageA(view, WM_CLOSE, 0, 0);
+        Pump();
+        EXPECT_FALSE(IsWindow(view));
+        EXPECT_EQ(fontsMade - fontsDeleted, fontsHeld) << "the view's font outlived it";
+    }
+    // A whole view opens afterwards, and the main window's toolbars still work.
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    ASSERT_NE(ManagerOfView(view), nullptr);
+    EXPECT_EQ(QBR_GetToolbarCount(ManagerOfView(view)), 2u);
+    ClickButton(view, PaneTitled(ManagerOfView(view), "Style"), 305);
+    EXPECT_EQ(RadioOn(ManagerOfView(view)), 305u);
+}
+
+} // namespace
