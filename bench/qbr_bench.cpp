@@ -1,0 +1,861 @@
+// Timings of the operations a person triggers by hand, on real windows,
+// beside the same operations on the platform's own toolbar control, so that
+// every figure can be read as a ratio.
+//
+// The harness is small on purpose: each operation is run once to warm up,
+// then its batch size is chosen so that one batch takes at least kBatchMs,
+// then several batches are timed. The figure is the median time of one
+// operation over the batches; the spread is the lowest and highest batch.
+// Operations that build a whole scene (layout apply, destroy) are timed once
+// per repetition, with the building outside the clock.
+//
+// Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|profile]
+//   --quick: fewer repetitions; a section name runs that section alone.
+#include <commctrl.h>
+#include <windows.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <functional>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "dock/dock.h"
+#include "input/input.h"
+#include "quaybar.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+// ---- Clock and statistics ---------------------------------------------------------
+
+double TicksPerUs() {
+    static double perUs = 0;
+    if (perUs == 0) {
+        LARGE_INTEGER f;
+        QueryPerformanceFrequency(&f);
+        perUs = static_cast<double>(f.QuadPart) / 1e6;
+    }
+    return perUs;
+}
+
+double NowUs() {
+    LARGE_INTEGER t;
+    QueryPerformanceCounter(&t);
+    return static_cast<double>(t.QuadPart) / TicksPerUs();
+}
+
+struct Stats {
+    double median = -1; // microseconds per operation; -1: not measured
+    double low = 0;
+    double high = 0;
+    long iterations = 0; // per batch
+    int repetitions = 0;
+};
+
+int repetitions = 7;
+int stormRepetitions = 2;
+double batchMs = 30;
+
+Stats Summarise(std::vector<double> perOp, long iterations) {
+    Stats s;
+    std::sort(perOp.begin(), perOp.end());
+    const size_t n = perOp.size();
+    s.median = n % 2 ? perOp[n / 2] : (perOp[n / 2 - 1] + perOp[n / 2]) / 2;
+    s.low = perOp.front();
+    s.high = perOp.back();
+    s.iterations = iterations;
+    s.repetitions = static_cast<int>(n);
+    return s;
+}
+
+// A cheap, repeatable operation: warm-up, calibrated batches, median.
+Stats Measure(const std::function<void()> &op, long maxIterations = 1000000) {
+    op(); // warm-up: first paint, first allocation, code pages
+    double t0 = NowUs();
+    op();
+    double one = NowUs() - t0;
+    long iterations = one <= 0 ? maxIterations : static_cast<long>(batchMs * 1000 / one);
+    iterations = std::max(1L, std::min(iterations, maxIterations));
+    for (long i = 0; i < iterations; ++i)
+        op(); // warm-up batch
+    std::vector<double> perOp;
+    for (int r = 0; r < repetitions; ++r) {
+        t0 = NowUs();
+        for (long i = 0; i < iterations; ++i)
+            op();
+        perOp.push_back((NowUs() - t0) / iterations);
+    }
+    return Summarise(perOp, iterations);
+}
+
+// An operation that needs a fresh scene each time: `setup` and `teardown`
+// run outside the clock, `op` once inside it.
+Stats MeasureOnce(const std::function<void()> &setup, const std::function<void()> &op,
+                  const std::function<void()> &teardown, int reps, bool warmUp = true) {
+    std::vector<double> perOp;
+    const int first = warmUp ? 1 : 0;
+    for (int r = 0; r < reps + first; ++r) {
+        setup();
+        const double t0 = NowUs();
+        op();
+        const double t = NowUs() - t0;
+        teardown();
+        if (r >= first) perOp.push_back(t); // the first is the warm-up
+    }
+    return Summarise(perOp, 1);
+}
+
+// ---- Message queue ---------------------------------------------------------------
+
+void Pump() {
+    MSG msg;
+    for (int quiet = 0; quiet < 2; ++quiet) {
+        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            TranslateMessage(&msg);
+            DispatchMessageA(&msg);
+            quiet = 0;
+        }
+    }
+}
+
+// ---- The host: a frame, its manager, a dock, toolbars ------------------------------
+
+constexpr UINT kFirstId = 1000;
+constexpr UINT kStripImages = 46; // 23 columns by 2 rows in the "Main" strip
+constexpr UINT kCatalog = 1000;
+
+int CALLBACK BenchHelpText(UINT id, UINT kind, LPSTR buffer, int size) {
+    return wsprintfA(buffer, "%c%u", "QDBC"[kind & 3], id) < size ? lstrlenA(buffer) : 0;
+}
+
+LRESULT CALLBACK FrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+HWND MakeFrame(int width = 1000, int height = 700) {
+    HWND frame = CreateWindowExA(0, "QBR_BenchFrame", "bench", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, 10, 10, width,
+                                 height, nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
+    ShowWindow(frame, SW_SHOW);
+    UpdateWindow(frame);
+    return frame;
+}
+
+struct Scene {
+    HWND frame = nullptr;
+    ToolbarManager *manager = nullptr;
+    HWND dock = nullptr;
+    std::vector<HWND> panes;
+};
+
+ToolbarManager *MakeManager(HWND frame) {
+    ToolbarManager *manager = QBR_CreateManager(frame);
+    std::vector<UINT> ids(kCatalog);
+    for (UINT i = 0; i < kCatalog; ++i)
+        ids[i] = kFirstId + i;
+    QBR_AddButtons(manager, ids.data(), kCatalog);
+    for (UINT i = 0; i < kCatalog; ++i)
+        QBR_SetButtonImage(manager, kFirstId + i, i % kStripImages);
+    QBR_SetImageStrip(manager, "Main");
+    return manager;
+}
+
+// `toolbars` toolbars of `items` buttons each in the top dock. With `shared`
+// every toolbar shows the same ids (one state, many toolbars); otherwise each
+// toolbar has ids of its own as long as the catalog lasts.
+Scene MakeScene(UINT toolbars, UINT items, bool shared) {
+    Scene s;
+    s.frame = MakeFrame();
+    s.manager = MakeManager(s.frame);
+    s.dock = QBR_CreateDock(s.manager, s.frame, DOCK_TOP);
+    std::vector<UINT> ids(items);
+    for (UINT t = 0; t < toolbars; ++t) {
+        for (UINT i = 0; i < items; ++i)
+            ids[i] = kFirstId + (shared ? i : (t * items + i) % kCatalog);
+        char name[32];
+        wsprintfA(name, "Toolbar %u", t);
+        s.panes.push_back(QBR_CreateToolbar(name, TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, s.dock, ids.data(), items));
+    }
+    Pump();
+    return s;
+}
+
+void DestroyScene(Scene &s) {
+    QBR_DestroyManager(s.manager);
+    DestroyWindow(s.frame);
+    Pump();
+    s = Scene();
+}
+
+// The centre of item `index` of a pane, in the pane's client coordinates.
+POINT ItemCentre(HWND pane, UINT index) {
+    RECT r = {};
+    GetItemRect(RecordOfWindow(pane), index, &r);
+    return POINT{(r.left + r.right) / 2, (r.top + r.bottom) / 2};
+}
+
+// ---- The platform's toolbar control ------------------------------------------------
+
+struct NativeScene {
+    HWND frame = nullptr;
+    HBITMAP strip = nullptr;
+    std::vector<HWND> bars;
+};
+
+HWND MakeNativeBar(HWND frame, HBITMAP strip, int y, UINT items, UINT firstId, bool wrap) {
+    HWND bar = CreateWindowExA(0, TOOLBARCLASSNAMEA, "",
+                               WS_CHILD | WS_VISIBLE | WS_CLIPSIBLINGS | (wrap ? TBSTYLE_WRAPABLE : 0) |
+                                   CCS_NOPARENTALIGN | CCS_NODIVIDER | CCS_NORESIZE,
+                               0, y, 980, 30, frame, nullptr, GetModuleHandleA(nullptr), nullptr);
+    SendMessageA(bar, TB_BUTTONSTRUCTSIZE, sizeof(TBBUTTON), 0);
+    SendMessageA(bar, TB_SETBITMAPSIZE, 0, MAKELPARAM(16, 15));
+    TBADDBITMAP add = {nullptr, reinterpret_cast<UINT_PTR>(strip)};
+    SendMessageA(bar, TB_ADDBITMAP, kStripImages, reinterpret_cast<LPARAM>(&add));
+    std::vector<TBBUTTON> buttons(items);
+    for (UINT i = 0; i < items; ++i) {
+        TBBUTTON &b = buttons[i];
+        ZeroMemory(&b, sizeof b);
+        b.iBitmap = static_cast<int>(i % kStripImages);
+        b.idCommand = static_cast<int>(firstId + i);
+        b.fsState = TBSTATE_ENABLED;
+        b.fsStyle = BTNS_CHECK;
+    }
+    SendMessageA(bar, TB_ADDBUTTONSA, items, reinterpret_cast<LPARAM>(buttons.data()));
+    SendMessageA(bar, TB_SETBUTTONSIZE, 0, MAKELPARAM(24, 22));
+    SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+    // Tall enough for every wrapped row, as a dock would make it; without
+    // wrapping, one row as wide as its buttons, clipped by the frame as a
+    // long docked toolbar is.
+    RECT last = {};
+    SendMessageA(bar, TB_GETITEMRECT, items - 1, reinterpret_cast<LPARAM>(&last));
+    SetWindowPos(bar, nullptr, 0, y, wrap ? 980 : last.right + 4, last.bottom + 4, SWP_NOZORDER | SWP_NOACTIVATE);
+    return bar;
+}
+
+NativeScene MakeNativeScene(UINT toolbars, UINT items, bool shared, bool wrap = true) {
+    NativeScene s;
+    s.frame = MakeFrame();
+    s.strip = LoadBitmapA(GetModuleHandleA(nullptr), "Main");
+    int y = 0;
+    for (UINT t = 0; t < toolbars; ++t) {
+        HWND bar = MakeNativeBar(s.frame, s.strip, y, items, kFirstId + (shared ? 0 : t * items), wrap);
+        RECT r;
+        GetWindowRect(bar, &r);
+        y += r.bottom - r.top;
+        s.bars.push_back(bar);
+    }
+    Pump();
+    return s;
+}
+
+void DestroyNativeScene(NativeScene &s) {
+    DestroyWindow(s.frame);
+    DeleteObject(s.strip);
+    Pump();
+    s = NativeScene();
+}
+
+// ---- Report ------------------------------------------------------------------------
+
+std::string Fmt(double us) {
+    char text[64];
+    if (us < 0) return "-";
+    if (us < 10)
+        snprintf(text, sizeof text, "%.2f us", us);
+    else if (us < 1000)
+        snprintf(text, sizeof text, "%.1f us", us);
+    else if (us < 1e6)
+        snprintf(text, sizeof text, "%.2f ms", us / 1000);
+    else
+        snprintf(text, sizeof text, "%.2f s", us / 1e6);
+    return text;
+}
+
+std::string Spread(const Stats &s) {
+    if (s.median < 0) return "";
+    char text[48];
+    snprintf(text, sizeof text, "%+.0f/%+.0f%%", (s.low / s.median - 1) * 100, (s.high / s.median - 1) * 100);
+    return text;
+}
+
+void Row(const char *name, const Stats &mine, const Stats &native = Stats()) {
+    std::string ratio = "-";
+    if (mine.median >= 0 && native.median > 0) {
+        char text[32];
+        snprintf(text, sizeof text, "%.2fx", mine.median / native.median);
+        ratio = text;
+    }
+    printf("| %-46s | %10s %-11s | %10s %-11s | %7s |\n", name, Fmt(mine.median).c_str(), Spread(mine).c_str(),
+           Fmt(native.median).c_str(), Spread(native).c_str(), ratio.c_str());
+    fflush(stdout);
+}
+
+void Header(const char *title) {
+    printf("\n### %s\n\n", title);
+    printf("| %-46s | %22s | %22s | %7s |\n", "operation", "Quaybar median (spread)", "comctl32 median (spread)",
+           "ratio");
+    printf("|%s|%s|%s|%s|\n", std::string(48, '-').c_str(), std::string(24, '-').c_str(), std::string(24, '-').c_str(),
+           std::string(9, '-').c_str());
+    fflush(stdout);
+}
+
+// ---- The operations ------------------------------------------------------------------
+
+void UpdateAll(const std::vector<HWND> &windows) {
+    for (HWND w : windows)
+        UpdateWindow(w);
+}
+
+void BenchStateChanges() {
+    Header("Button state, painting, hit testing (toolbars of 40 buttons)");
+    // One button changes state and its toolbar is painted at once.
+    {
+        Scene s = MakeScene(1, 40, false);
+        NativeScene n = MakeNativeScene(1, 40, false);
+        UINT on = 0;
+        Stats q = Measure([&] {
+            on ^= BS_ON;
+            QBR_SetButtonState(s.manager, kFirstId + 5, on);
+            UpdateWindow(s.panes[0]);
+        });
+        UINT check = 0;
+        Stats c = Measure([&] {
+            check ^= 1;
+            SendMessageA(n.bars[0], TB_CHECKBUTTON, kFirstId + 5, MAKELPARAM(check, 0));
+            UpdateWindow(n.bars[0]);
+        });
+        Row("button state change + repaint (1 toolbar)", q, c);
+
+        q = Measure([&] {
+            InvalidateRect(s.panes[0], nullptr, TRUE);
+            UpdateWindow(s.panes[0]);
+        });
+        c = Measure([&] {
+            InvalidateRect(n.bars[0], nullptr, TRUE);
+            UpdateWindow(n.bars[0]);
+        });
+        Row("full repaint of a 40-button toolbar", q, c);
+
+        POINT pq = ItemCentre(s.panes[0], 39);
+        q = Measure([&] { HitTestToolbar(s.panes[0], pq.x, pq.y, nullptr, nullptr); });
+        RECT rc = {};
+        SendMessageA(n.bars[0], TB_GETITEMRECT, 39, reinterpret_cast<LPARAM>(&rc));
+        POINT pc = {(rc.left + rc.right) / 2, (rc.top + rc.bottom) / 2};
+        c = Measure([&] { SendMessageA(n.bars[0], TB_HITTEST, 0, reinterpret_cast<LPARAM>(&pc)); });
+        Row("hit test, last button", q, c);
+
+        // The library reads the cursor itself, so it is put on the button.
+        POINT screen = pq;
+        ClientToScreen(s.panes[0], &screen);
+        SetCursorPos(screen.x, screen.y);
+        QBR_SetQuickHelp(1);
+        const LPARAM at = MAKELPARAM(pq.x, pq.y);
+        q = Measure([&] { SendMessageA(s.panes[0], WM_MOUSEMOVE, 0, at); });
+        screen = pc;
+        ClientToScreen(n.bars[0], &screen);
+        SetCursorPos(screen.x, screen.y);
+        const LPARAM atc = MAKELPARAM(pc.x, pc.y);
+        c = Measure([&] { SendMessageA(n.bars[0], WM_MOUSEMOVE, 0, atc); });
+        Row("WM_MOUSEMOVE over the last button", q, c);
+        QBR_SetQuickHelp(0);
+        SetCursorPos(1200, 900);
+        Pump();
+        DestroyNativeScene(n);
+        DestroyScene(s);
+    }
+    // A storm: 10,000 changes of buttons that stand on 4 toolbars each; every
+    // change is painted on all four before the next.
+    {
+        Scene s = MakeScene(4, 40, true);
+        NativeScene n = MakeNativeScene(4, 40, true);
+        const int kStorm = 10000;
+        // One storm takes tens of seconds; a short one warms up instead.
+        for (int i = 0; i < 200; ++i) {
+            QBR_SetButtonState(s.manager, kFirstId + i % 40, (i / 40) % 2 ? 0 : BS_ON);
+            UpdateAll(s.panes);
+            for (HWND bar : n.bars)
+                SendMessageA(bar, TB_CHECKBUTTON, kFirstId + i % 40, MAKELPARAM((i / 40) % 2 ? 0 : 1, 0));
+            UpdateAll(n.bars);
+        }
+        Stats q = MeasureOnce([] {},
+                              [&] {
+                                  for (int i = 0; i < kStorm; ++i) {
+                                      QBR_SetButtonState(s.manager, kFirstId + i % 40, (i / 40) % 2 ? 0 : BS_ON);
+                                      UpdateAll(s.panes);
+                                  }
+                              },
+                              [] {}, stormRepetitions, false);
+        Stats c = MeasureOnce([] {},
+                              [&] {
+                                  for (int i = 0; i < kStorm; ++i) {
+                                      for (HWND bar : n.bars)
+                                          SendMessageA(bar, TB_CHECKBUTTON, kFirstId + i % 40,
+                                                       MAKELPARAM((i / 40) % 2 ? 0 : 1, 0));
+                                      UpdateAll(n.bars);
+                                  }
+                              },
+                              [] {}, stormRepetitions, false);
+        Row("storm: 10,000 state changes on 4 toolbars", q, c);
+        DestroyNativeScene(n);
+        DestroyScene(s);
+    }
+}
+
+void BenchButtonText() {
+    Header("Button text on and off (one switch on, one off; toolbars of 10 buttons)");
+    for (UINT toolbars : {4u, 40u}) {
+        Scene s = MakeScene(toolbars, 10, false);
+        NativeScene n = MakeNativeScene(toolbars, 10, false);
+        Stats q = Measure([&] {
+            QBR_SetButtonText(1);
+            Pump();
+            UpdateAll(s.panes);
+            QBR_SetButtonText(0);
+            Pump();
+            UpdateAll(s.panes);
+        });
+        // The nearest native act: new button size and a re-fit of every bar.
+        auto resize = [&](int w, int h) {
+            for (HWND bar : n.bars) {
+                SendMessageA(bar, TB_SETBUTTONSIZE, 0, MAKELPARAM(w, h));
+                SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+            }
+            Pump();
+            UpdateAll(n.bars);
+        };
+        Stats c = Measure([&] {
+            resize(52, 40);
+            resize(24, 22);
+        });
+        char name[64];
+        snprintf(name, sizeof name, "QBR_SetButtonText on+off, %u toolbars", toolbars);
+        Row(name, q, c);
+        // The same pair taken apart: the call itself (rewrap, window moves,
+        // dock packing, WM_SIZE to the frame), the queue, the paints.
+        double call = 0, pump = 0, paint = 0;
+        const int kPairs = 10;
+        for (int i = 0; i < kPairs * 2; ++i) {
+            double t0 = NowUs();
+            QBR_SetButtonText(i % 2 ? 0 : 1);
+            double t1 = NowUs();
+            Pump();
+            double t2 = NowUs();
+            UpdateAll(s.panes);
+            paint += NowUs() - t2;
+            pump += t2 - t1;
+            call += t1 - t0;
+        }
+        printf("|   of which: call %s, queue %s, paint %s (means per pair) | | | |\n", Fmt(call / kPairs).c_str(),
+               Fmt(pump / kPairs).c_str(), Fmt(paint / kPairs).c_str());
+        DestroyNativeScene(n);
+        DestroyScene(s);
+    }
+}
+
+void BenchDrop() {
+    Header("Dock relayout after a drop (toolbar dragged to the front of its dock)");
+    for (UINT toolbars : {4u, 40u}) {
+        Scene s = MakeScene(toolbars, 10, false);
+        // The drag of the last toolbar, let go on the first one's left edge:
+        // the real drop path (drag frame, insertion index, relayout).
+        Stats q = Measure([&] {
+            HWND moving = nullptr;
+            int furthest = -1;
+            for (HWND p : s.panes) { // the toolbar that stands furthest down and right
+                RECT r;
+                GetWindowRect(p, &r);
+                if (r.top * 10000 + r.left > furthest) {
+                    furthest = r.top * 10000 + r.left;
+                    moving = p;
+                }
+            }
+            BeginToolbarDrag(moving, 8, 8);
+            RECT dock;
+            GetWindowRect(s.dock, &dock);
+            int x = dock.left + 2, y = dock.top + 2;
+            ScreenPointToClient(moving, &x, &y);
+            DropToolbar(moving, x, y);
+            UpdateAll(s.panes);
+        });
+        char name[64];
+        snprintf(name, sizeof name, "drop a toolbar into a dock of %u", toolbars);
+        Row(name, q);
+        DestroyScene(s);
+    }
+}
+
+// The table of one scene, as strings, so that it can be filled again for
+// every apply (an apply uses its table up).
+struct Table {
+    std::vector<std::string> keys, values;
+};
+
+Table CaptureTable(ToolbarManager *manager) {
+    Table t;
+    UINT count = 0;
+    QBR_CaptureLayout(manager, &count);
+    for (UINT i = 0; i < count; ++i) {
+        UINT kl = 0, vl = 0;
+        QBR_GetLayoutEntrySize(i, &kl, &vl);
+        std::string k(kl + 1, '\0'), v(vl + 1, '\0');
+        QBR_GetLayoutEntry(i, &k[0], &v[0]);
+        k.resize(kl);
+        v.resize(vl);
+        t.keys.push_back(k);
+        t.values.push_back(v);
+    }
+    QBR_FreeLayout();
+    return t;
+}
+
+void FillTable(const Table &t) {
+    QBR_BeginLayout();
+    for (size_t i = 0; i < t.keys.size(); ++i)
+        QBR_AddLayoutEntry(t.keys[i].c_str(), t.values[i].c_str());
+}
+
+void BenchLayout(const std::vector<UINT> &counts) {
+    Header("Layout capture, apply and destroy (toolbars of 10 buttons in one top dock)");
+    for (UINT toolbars : counts) {
+        const int reps = toolbars >= 1000 ? 1 : std::max(3, repetitions / 2);
+        const bool warmUp = toolbars < 1000;
+        Scene s = MakeScene(toolbars, 10, false);
+        Stats capture = Measure(
+            [&] {
+                UINT count = 0;
+                QBR_CaptureLayout(s.manager, &count);
+                char key[256], value[512];
+                for (UINT i = 0; i < count; ++i) {
+                    UINT kl = 0, vl = 0;
+                    QBR_GetLayoutEntrySize(i, &kl, &vl);
+                    if (kl < sizeof key && vl < sizeof value) QBR_GetLayoutEntry(i, key, value);
+                }
+                QBR_FreeLayout();
+            },
+            1000);
+        const Table table = CaptureTable(s.manager);
+        DestroyScene(s);
+
+        Scene fresh;
+        auto setup = [&] {
+            fresh.frame = MakeFrame();
+            fresh.manager = MakeManager(fresh.frame);
+            FillTable(table);
+        };
+        auto apply = [&] {
+            QBR_ApplyLayout(fresh.manager, fresh.frame);
+            Pump();
+        };
+        auto teardown = [&] {
+            QBR_FreeLayout();
+            DestroyScene(fresh);
+        };
+        Stats applied = MeasureOnce(setup, apply, teardown, reps, warmUp);
+
+        // Closing: the manager first, then the frame with every window.
+        double destroyManager = 0;
+        Stats destroyed = MeasureOnce(
+            [&] {
+                setup();
+                apply();
+                QBR_FreeLayout();
+            },
+            [&] {
+                const double t0 = NowUs();
+                QBR_DestroyManager(fresh.manager);
+                destroyManager += NowUs() - t0;
+                DestroyWindow(fresh.frame);
+                Pump();
+            },
+            [&] { fresh = Scene(); }, reps, warmUp);
+        destroyManager /= reps + (warmUp ? 1 : 0);
+
+        char name[80];
+        snprintf(name, sizeof name, "capture layout, %u toolbars", toolbars);
+        Row(name, capture);
+        snprintf(name, sizeof name, "apply layout to a new frame, %u toolbars", toolbars);
+        Row(name, applied);
+        snprintf(name, sizeof name, "close: DestroyManager+DestroyWindow, %u", toolbars);
+        Row(name, destroyed);
+        snprintf(name, sizeof name, "  of which QBR_DestroyManager (mean), %u", toolbars);
+        Stats dm;
+        dm.median = dm.low = dm.high = destroyManager;
+        Row(name, dm);
+    }
+}
+
+// Where an apply spends its time: the steps that restoring one toolbar takes,
+// each on its own clock, summed over all toolbars, then the queue drained.
+void ProfileApply(UINT toolbars) {
+    enum { kDock, kWindows, kItems, kMove, kInsert, kFlags, kPack, kPump, kPhases };
+    const char *names[kPhases] = {
+        "create dock",           "create pane + floating frame", "set items (with refit)", "move floating frame",
+        "insert into dock list", "set flags (show the pane)",    "pack the dock once",     "drain the queue"};
+    double spent[kPhases] = {};
+    HWND frame = MakeFrame();
+    ToolbarManager *manager = MakeManager(frame);
+    double t0 = NowUs();
+    HWND dockWindow = QBR_CreateDock(manager, frame, DOCK_TOP);
+    spent[kDock] += NowUs() - t0;
+    UINT ids[10];
+    // As the apply does: the dock is packed once, after its last toolbar.
+    std::optional<DeferDockPacking> once;
+    once.emplace();
+    for (UINT t = 0; t < toolbars; ++t) {
+        for (UINT i = 0; i < 10; ++i)
+            ids[i] = kFirstId + (t * 10 + i) % kCatalog;
+        char title[32];
+        wsprintfA(title, "Toolbar %u", t);
+        t0 = NowUs();
+        HWND pane = CreateToolbarWindows(dockWindow, title);
+        double t1 = NowUs();
+        spent[kWindows] += t1 - t0;
+        ToolbarRecord *record = RecordOfWindow(pane);
+        record->flags = TBF_VISIBLE | TBF_DOCKED;
+        SetToolbarItems(record, ids, 10);
+        t0 = NowUs();
+        spent[kItems] += t0 - t1;
+        RECT r = {100, 100, 300, 140};
+        MoveToolbarWindow(pane, ROLE_FLOATING, &r);
+        t1 = NowUs();
+        spent[kMove] += t1 - t0;
+        InsertToolbarBefore(FindDockRecord(dockWindow), nullptr, record);
+        t0 = NowUs();
+        spent[kInsert] += t0 - t1;
+        QBR_SetToolbarFlags(pane, record->flags);
+        t1 = NowUs();
+        spent[kFlags] += t1 - t0;
+    }
+    once.reset();
+    t0 = NowUs();
+    RelayoutDock(dockWindow);
+    spent[kPack] += NowUs() - t0;
+    t0 = NowUs();
+    Pump();
+    spent[kPump] += NowUs() - t0;
+    double total = 0;
+    for (double x : spent)
+        total += x;
+    printf("\n### Where an apply of %u toolbars spends its time (one run)\n\n", toolbars);
+    printf("| %-34s | %10s | %6s |\n|%s|%s|%s|\n", "phase", "time", "share", std::string(36, '-').c_str(),
+           std::string(12, '-').c_str(), std::string(8, '-').c_str());
+    for (int i = 0; i < kPhases; ++i)
+        printf("| %-34s | %10s | %5.1f%% |\n", names[i], Fmt(spent[i]).c_str(), 100 * spent[i] / total);
+    printf("| %-34s | %10s | %5.1f%% |\n", "total", Fmt(total).c_str(), 100.0);
+    t0 = NowUs();
+    QBR_DestroyManager(manager);
+    const double dm = NowUs() - t0;
+    // The frame's end, taken apart: its owned floating frames, then the frame
+    // with its children (docks and panes).
+    t0 = NowUs();
+    std::vector<HWND> popups;
+    EnumThreadWindows(
+        GetCurrentThreadId(),
+        [](HWND w, LPARAM list) -> BOOL {
+            reinterpret_cast<std::vector<HWND> *>(list)->push_back(w);
+            return TRUE;
+        },
+        reinterpret_cast<LPARAM>(&popups));
+    UINT owned = 0;
+    for (HWND w : popups)
+        if (GetWindow(w, GW_OWNER) == frame) {
+            DestroyWindow(w);
+            ++owned;
+        }
+    const double popupsUs = NowUs() - t0;
+    t0 = NowUs();
+    DestroyWindow(frame);
+    const double frameUs = NowUs() - t0;
+    t0 = NowUs();
+    Pump();
+    const double pumpUs = NowUs() - t0;
+    printf("\nClose of the same frame: QBR_DestroyManager %s; DestroyWindow of its %u owned floating frames %s;\n"
+           "DestroyWindow of the frame (dock and %u panes) %s; queue drained after %s.\n",
+           Fmt(dm).c_str(), owned, Fmt(popupsUs).c_str(), toolbars, Fmt(frameUs).c_str(), Fmt(pumpUs).c_str());
+    fflush(stdout);
+}
+
+// One toolbar of 10, 100 and 1,000 buttons. The catalog holds 1,000
+// buttons, so the largest toolbar shows each once.
+void BenchGrowth() {
+    const UINT sizes[] = {10, 100, 1000};
+    struct Line {
+        const char *name;
+        Stats q[3], c[3];
+    };
+    Line lines[] = {{"state change + repaint", {}, {}},       {"full repaint", {}, {}},
+                    {"hit test, last button", {}, {}},        {"WM_MOUSEMOVE, last button", {}, {}},
+                    {"insertion index, after last", {}, {}},  {"button text on+off", {}, {}},
+                    {"item added (refit + relayout)", {}, {}}};
+    for (int k = 0; k < 3; ++k) {
+        const UINT items = sizes[k];
+        Scene s = MakeScene(1, items, false);
+        // A top dock does not wrap a toolbar: both controls get one row.
+        NativeScene n = MakeNativeScene(1, items, false, false);
+        HWND pane = s.panes[0], bar = n.bars[0];
+        UINT on = 0, check = 0;
+        lines[0].q[k] = Measure([&] {
+            on ^= BS_ON;
+            QBR_SetButtonState(s.manager, kFirstId + items - 1, on);
+            UpdateWindow(pane);
+        });
+        lines[0].c[k] = Measure([&] {
+            check ^= 1;
+            SendMessageA(bar, TB_CHECKBUTTON, kFirstId + items - 1, MAKELPARAM(check, 0));
+            UpdateWindow(bar);
+        });
+        lines[1].q[k] = Measure([&] {
+            InvalidateRect(pane, nullptr, TRUE);
+            UpdateWindow(pane);
+        });
+        lines[1].c[k] = Measure([&] {
+            InvalidateRect(bar, nullptr, TRUE);
+            UpdateWindow(bar);
+        });
+        POINT pq = ItemCentre(pane, items - 1);
+        lines[2].q[k] = Measure([&] { HitTestToolbar(pane, pq.x, pq.y, nullptr, nullptr); });
+        RECT rc = {};
+        SendMessageA(bar, TB_GETITEMRECT, items - 1, reinterpret_cast<LPARAM>(&rc));
+        POINT pc = {(rc.left + rc.right) / 2, (rc.top + rc.bottom) / 2};
+        lines[2].c[k] = Measure([&] { SendMessageA(bar, TB_HITTEST, 0, reinterpret_cast<LPARAM>(&pc)); });
+
+        POINT screen = pq;
+        ClientToScreen(pane, &screen);
+        SetCursorPos(screen.x, screen.y);
+        QBR_SetQuickHelp(1);
+        const LPARAM at = MAKELPARAM(pq.x, pq.y);
+        lines[3].q[k] = Measure([&] { SendMessageA(pane, WM_MOUSEMOVE, 0, at); });
+        QBR_SetQuickHelp(0);
+        screen = pc;
+        ClientToScreen(bar, &screen);
+        SetCursorPos(screen.x, screen.y);
+        const LPARAM atc = MAKELPARAM(pc.x, pc.y);
+        lines[3].c[k] = Measure([&] { SendMessageA(bar, WM_MOUSEMOVE, 0, atc); });
+        SetCursorPos(1200, 900);
+        Pump();
+
+        RECT r = {};
+        ToolbarRecord *record = RecordOfWindow(pane);
+        GetItemRect(record, items - 1, &r);
+        lines[4].q[k] = Measure([&] {
+            UINT index = 0;
+            InsertionIndexAtPoint(record, r.right + 3, r.top + 2, &index);
+        });
+
+        lines[5].q[k] = Measure([&] {
+            QBR_SetButtonText(1);
+            Pump();
+            UpdateWindow(pane);
+            QBR_SetButtonText(0);
+            Pump();
+            UpdateWindow(pane);
+        });
+        lines[5].c[k] = Measure([&] {
+            SendMessageA(bar, TB_SETBUTTONSIZE, 0, MAKELPARAM(52, 40));
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+            Pump();
+            UpdateWindow(bar);
+            SendMessageA(bar, TB_SETBUTTONSIZE, 0, MAKELPARAM(24, 22));
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+            Pump();
+            UpdateWindow(bar);
+        });
+
+        // An item put on the toolbar and taken off again, through the chain
+        // every edit runs (list edit, refit of both windows, dock relayout).
+        ToolbarItem *item = ItemAt(record, 0);
+        lines[6].q[k] = Measure([&] {
+            InsertItemAt(record, 0, item);
+            RefitToolbar(pane, ROLE_BOTH);
+            RelayoutDock(s.dock);
+            RemoveItem(record, ItemAt(record, 0));
+            RefitToolbar(pane, ROLE_BOTH);
+            RelayoutDock(s.dock);
+            UpdateWindow(pane);
+        });
+        TBBUTTON extra = {};
+        extra.iBitmap = 0;
+        extra.idCommand = 99999;
+        extra.fsState = TBSTATE_ENABLED;
+        extra.fsStyle = BTNS_BUTTON;
+        lines[6].c[k] = Measure([&] {
+            SendMessageA(bar, TB_INSERTBUTTONA, 0, reinterpret_cast<LPARAM>(&extra));
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+            SendMessageA(bar, TB_DELETEBUTTON, 0, 0);
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+            UpdateWindow(bar);
+        });
+        DestroyNativeScene(n);
+        DestroyScene(s);
+    }
+
+    printf("\n### Growth: one toolbar of 10, 100 and 1,000 buttons (Quaybar / comctl32 / ratio)\n\n");
+    printf("| %-32s | %-30s | %-30s | %-30s |\n", "operation", "10 items", "100 items", "1,000 items");
+    printf("|%s|%s|%s|%s|\n", std::string(34, '-').c_str(), std::string(32, '-').c_str(), std::string(32, '-').c_str(),
+           std::string(32, '-').c_str());
+    for (const Line &line : lines) {
+        printf("| %-32s |", line.name);
+        for (int k = 0; k < 3; ++k) {
+            std::string cell = Fmt(line.q[k].median);
+            if (line.c[k].median > 0) {
+                char ratio[32];
+                snprintf(ratio, sizeof ratio, " (%.1fx)", line.q[k].median / line.c[k].median);
+                cell += " / " + Fmt(line.c[k].median) + ratio;
+            }
+            printf(" %-30s |", cell.c_str());
+        }
+        printf("\n");
+    }
+    fflush(stdout);
+}
+
+} // namespace
+
+int main(int argc, char **argv) {
+    bool quick = false;
+    std::string only; // a section name: state, text, drop, layout, growth, profile
+    for (int i = 1; i < argc; ++i) {
+        if (lstrcmpA(argv[i], "--quick") == 0)
+            quick = true;
+        else
+            only = argv[i];
+    }
+    if (quick) {
+        repetitions = 3;
+        stormRepetitions = 1;
+        batchMs = 10;
+    }
+    auto wanted = [&](const char *name) { return only.empty() || only == name; };
+    SetThreadAffinityMask(GetCurrentThread(), 1);
+    moduleInstance = GetModuleHandleA(nullptr);
+    INITCOMMONCONTROLSEX icc = {sizeof icc, ICC_BAR_CLASSES};
+    InitCommonControlsEx(&icc);
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = FrameProc;
+    wc.hInstance = moduleInstance;
+    wc.hCursor = LoadCursorA(nullptr, MAKEINTRESOURCEA(32512));
+    wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
+    wc.lpszClassName = "QBR_BenchFrame";
+    RegisterClassA(&wc);
+    if (!QBR_Initialize(moduleInstance, BenchHelpText)) {
+        fprintf(stderr, "QBR_Initialize failed\n");
+        return 1;
+    }
+    QBR_SetNotifyMessages(WM_APP + 1, WM_APP + 2);
+
+    printf("Quaybar benchmarks: median time of one operation, spread = lowest/highest batch against the median,\n"
+           "%d repetitions after a warm-up; ratio = Quaybar / comctl32 ToolbarWindow32.\n",
+           repetitions);
+    if (wanted("state")) BenchStateChanges();
+    if (wanted("text")) BenchButtonText();
+    if (wanted("drop")) BenchDrop();
+    if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 200} : std::vector<UINT>{4, 200, 1000});
+    if (wanted("growth")) BenchGrowth();
+    if (wanted("profile")) {
+        ProfileApply(200);
+        if (!quick) ProfileApply(1000);
+    }
+    QBR_Terminate();
+    return 0;
+}
