@@ -11,8 +11,9 @@
 //
 // Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|profile]
 //   --quick: fewer repetitions; a section name runs that section alone.
-#include <commctrl.h>
 #include <windows.h>
+// after windows.h, which it needs
+#include <commctrl.h>
 
 #include <algorithm>
 #include <cstdio>
