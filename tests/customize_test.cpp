@@ -75,13 +75,7 @@ class CustomizeTest : public FrameTest {
         ModalSteps::Stop();
         FrameTest::TearDown();
     }
-    std::vector<UINT> Ids(HWND pane) {
-        std::vector<UINT> out;
-        ToolbarRecord *record = RecordOfWindow(pane);
-        for (UINT i = 0; i < PointerListCount(record->items); ++i)
-            out.push_back(ItemAt(record, i)->id);
-        return out;
-    }
+    std::vector<UINT> Ids(HWND pane) { return ToolbarIds(pane); }
     HWND FrameOf(HWND pane) { return ResolveRoleWindow(pane, ROLE_FLOATING); }
     // Runs the menu of a press on `pressed` (0: on a dock), owned by Alpha,
     // with the steps given, then lets its command arrive.

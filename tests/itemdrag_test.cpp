@@ -56,13 +56,7 @@ class ItemDragTest : public FrameTest {
         return pane;
     }
     ToolbarItem *Item(UINT id) { return ItemFindById(manager->items, id); }
-    static Ids Read(HWND pane) {
-        Ids out;
-        ToolbarRecord *record = RecordOfWindow(pane);
-        for (UINT i = 0; i < PointerListCount(record->items); ++i)
-            out.push_back(ItemAt(record, i)->id);
-        return out;
-    }
+    static Ids Read(HWND pane) { return ToolbarIds(pane); }
     // The width of the item area a list needs in one row: neighbours share a
     // column, and an empty toolbar keeps one button's room.
     int AreaWidth(const Ids &ids) const {

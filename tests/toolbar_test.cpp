@@ -30,13 +30,7 @@ class ToolbarTest : public FrameTest {
         return pane;
     }
     ToolbarItem *Item(UINT id) { return ItemFindById(manager->items, id); }
-    std::vector<UINT> Ids(HWND pane) {
-        std::vector<UINT> out;
-        ToolbarRecord *record = RecordOfWindow(pane);
-        for (UINT i = 0; i < PointerListCount(record->items); ++i)
-            out.push_back(ItemAt(record, i)->id);
-        return out;
-    }
+    std::vector<UINT> Ids(HWND pane) { return ToolbarIds(pane); }
     // Gives the window of `role` a client area whose item area has this right
     // edge, without a refit (the library's own sizes bring no WM_SIZE).
     void SetAreaRight(HWND pane, int role, int right, int clientHeight = 200) {

@@ -4,6 +4,7 @@
 #include <sstream>
 
 #include "quaybar.h"
+#include "toolbar/toolbar.h"
 
 void Pump() {
     MSG msg;
@@ -176,6 +177,14 @@ Pixels ReadWindowPixels(HWND window) {
     HDC source = GetDC(window);
     Pixels out = ReadPixelsFrom(source, 0, 0, client.right, client.bottom);
     ReleaseDC(window, source);
+    return out;
+}
+
+std::vector<UINT> ToolbarIds(HWND pane) {
+    std::vector<UINT> out;
+    ToolbarRecord *record = RecordOfWindow(pane);
+    for (UINT i = 0; ToolbarItem *item = record ? ItemAt(record, i) : nullptr; ++i)
+        out.push_back(item->id);
     return out;
 }
 

@@ -56,6 +56,10 @@ class FrameTest : public ClientTest {
     ToolbarManager *manager = nullptr;
 };
 
+// The ids of a toolbar's items in list order, separators as 0; empty for a
+// window that is no toolbar.
+std::vector<UINT> ToolbarIds(HWND pane);
+
 // The outer rectangle of a window in its parent's client coordinates (for a
 // child) or in screen coordinates (for a top-level window).
 RECT WindowRectInParent(HWND window);
