@@ -166,17 +166,21 @@ UINT PaintToolbarItems(HWND pane) {
     return 1;
 }
 
+// Item rectangles as a user sees them: a separator's rectangle reaches down
+// as far as the tallest item so far in its row, and a wrapping one starts the
+// new row that tall.
+struct ItemRectVisitor : FlowVisitor {
+    void AfterRowHeight(ToolbarItem *, bool separator, int &h, int rowHeight) override {
+        if (separator) h = rowHeight;
+    }
+};
+
 UINT GetItemRect(const ToolbarRecord *record, UINT index, RECT *outRect) {
     if (!record) return 0;
-    struct Finder : FlowVisitor {
+    struct Finder : ItemRectVisitor {
         UINT index;
         RECT *out;
         bool found = false;
-        // A separator's rectangle reaches down as far as the tallest item so
-        // far in its row, and a wrapping one starts the new row that tall.
-        void AfterRowHeight(ToolbarItem *, bool separator, int &h, int rowHeight) override {
-            if (separator) h = rowHeight;
-        }
         bool Place(UINT i, ToolbarItem *, bool, const RECT &rect, int) override {
             if (i != index) return false;
             *out = rect;
@@ -359,23 +363,30 @@ HWND FindToolbarAtPoint(ToolbarManager *manager, int x, int y) {
     return best;
 }
 
+// One walk, not one per item: the index in front of the button under the
+// point, behind a separator under it, or of the first item placed below the
+// point's line; past the end if none.
 UINT InsertionIndexAtPoint(const ToolbarRecord *record, int x, int y, UINT *outIndex) {
-    UINT count = PointerListCount(record->items);
-    for (UINT i = 0; i < count; ++i) {
-        ToolbarItem *item = ListAt<ToolbarItem>(record->items, i);
-        if (!item) return 0;
-        RECT rect;
-        if (!GetItemRect(record, i, &rect)) continue; // skipped or dropped
-        if (PointInRectInclusive(&rect, x, y)) {
-            // In front of a button, wherever in it; behind a separator.
-            *outIndex = item->kind == ITEM_SEPARATOR ? i + 1 : i;
-            return 1;
+    if (!record || !outIndex) return 0;
+    struct Seeker : ItemRectVisitor {
+        int x, y;
+        UINT index;
+        bool Place(UINT i, ToolbarItem *, bool separator, const RECT &rect, int) override {
+            if (PointInRectInclusive(&rect, x, y)) {
+                index = separator ? i + 1 : i;
+                return true;
+            }
+            if (rect.top > y) { // the walk has gone past the point
+                index = i;
+                return true;
+            }
+            return false;
         }
-        if (rect.top > y) { // the walk has gone past the point
-            *outIndex = i;
-            return 1;
-        }
-    }
-    *outIndex = count;
+    } seeker;
+    seeker.x = x;
+    seeker.y = y;
+    seeker.index = PointerListCount(record->items);
+    WalkActiveWindow(record, seeker);
+    *outIndex = seeker.index;
     return 1;
 }
