@@ -34,6 +34,7 @@ extern "C" ToolbarManager *QBR_CreateManager(HWND frame) {
         QBR_DestroyManager(manager);
         return nullptr;
     }
+    WatchHostActivation();
     return manager;
 }
 
@@ -65,7 +66,7 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     manager->items = nullptr;
     if (manager->imageStrip) GdiDelete(manager->imageStrip);
     if (manager->categories) MemoryBlockFree(manager->categories);
-    PointerListRemove(client->managers, ListValue(manager));
+    if (PointerListRemove(client->managers, ListValue(manager))) UnwatchHostActivation();
     MemoryBlockFree(manager);
 }
 

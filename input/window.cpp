@@ -54,6 +54,22 @@ static void ActivateHostFrame(HWND window) {
     KeepFloatingFramesAbove(manager);
 }
 
+// A toolbar window is never the active window, yet the window system may hand
+// the activation to a floating frame, as when another top-level window closes
+// and the frame is next in line: the keys would then go to the toolbar, not to
+// the host's menu. The activation goes on to the host frame once the current
+// one has finished. A disabled host (a modal dialog is up) is left alone.
+constexpr UINT kPassActivation = WM_USER + 1;
+
+static void OnActivate(HWND window, WPARAM wParam) {
+    if (LOWORD(wParam) != WA_INACTIVE && IsFloatingFrame(window)) PostMessageA(window, kPassActivation, 0, 0);
+}
+
+static void PassActivationToHost(HWND window) {
+    ToolbarManager *manager = ManagerOfToolbar(window);
+    if (manager && GetActiveWindow() == window && IsWindowEnabled(manager->frame)) ActivateHostFrame(window);
+}
+
 // The library moves and sizes its own windows all the time, and none of those
 // changes may come back as a refit: the WM_SIZE that DefWindowProc would make
 // of WM_WINDOWPOSCHANGED is let through only after the user pressed a border.
@@ -115,6 +131,12 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
     case WM_MOUSEACTIVATE:
         ActivateHostFrame(window);
         return MA_NOACTIVATE;
+    case WM_ACTIVATE:
+        OnActivate(window, wParam);
+        return 0;
+    case kPassActivation:
+        PassActivationToHost(window);
+        return 0;
     case WM_GETMINMAXINFO:
         reinterpret_cast<MINMAXINFO *>(lParam)->ptMinTrackSize = POINT{0, 0};
         return 0;

@@ -6,6 +6,7 @@
 #include "core/core.h"
 #include "dock/dock.h"
 #include "harness.h"
+#include "modal.h"
 #include "paint/paint.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
@@ -538,6 +539,35 @@ TEST_F(ToolbarTest, FloatingFramesStayAboveTheirHost) {
     QBR_DestroyManager(hostManager);
     DestroyWindow(host);
     Pump();
+}
+
+// The floating frames are never left below their host, and never keep the
+// activation, when the user moves between top-level windows: a click on the
+// host's caption while another window is active, and the close of that other
+// window (the window system may hand the activation to a floating frame).
+TEST_F(ToolbarTest, FloatingFramesStayAboveWhenTheUserSwitchesWindows) {
+    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_FLOATING, nullptr, 420, 330);
+    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+    HWND other = CreateWindowExA(0, "QbrTestFrame", "Other", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 700, 480, 300, 250,
+                                 nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
+    PumpFor(300);
+    ASSERT_EQ(other, GetActiveWindow());
+    RECT outer;
+    GetWindowRect(frame, &outer);
+    PlaceCursor(POINT{outer.left + 200, outer.top + 10}); // on the caption
+    SendButton(MOUSEEVENTF_LEFTDOWN);
+    SendButton(MOUSEEVENTF_LEFTUP);
+    PumpFor(1000);
+    EXPECT_EQ(frame, GetActiveWindow());
+    EXPECT_TRUE(Above(floating, frame)) << "after a click on the host's caption";
+
+    SetActiveWindow(other);
+    SetWindowPos(other, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE); // the floating frame is next in line
+    PumpFor(300);
+    DestroyWindow(other);
+    PumpFor(1000);
+    EXPECT_EQ(frame, GetActiveWindow()) << "after the other window closed";
+    EXPECT_TRUE(Above(floating, frame)) << "after the other window closed";
 }
 
 } // namespace

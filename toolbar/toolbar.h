@@ -88,6 +88,10 @@ constexpr UINT kRestackPeriod = 250;
 void OnRestackTimer(HWND frame, UINT_PTR timer);
 // Puts the manager's shown floating frames back above their owner.
 void KeepFloatingFramesAbove(ToolbarManager *manager);
+// Watches the activation of the host frames of this thread, which may bury
+// their floating frames; one call for each manager made and destroyed.
+void WatchHostActivation();
+void UnwatchHostActivation();
 UINT SwitchToFloating(HWND window);
 UINT SwitchToDocked(HWND window);
 UINT RewrapAllManagers(int newWidth, int newHeight);

@@ -317,6 +317,45 @@ void OnRestackTimer(HWND frame, UINT_PTR timer) {
     if (IsWindowVisible(frame)) SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
 }
 
+// A host frame activated by a click on its caption or border, while another
+// window was active, can be raised over its floating frames by the window
+// system itself (Wine does so as the move loop starts), again with no message
+// to the frames. Windows keeps owned windows above their owner, so there this
+// costs one harmless restack. A thread hook sees every activation before it
+// happens; when the window is a host frame of this client, its shown floating
+// frames go back on top once the activation has settled. One hook serves all
+// managers of the thread; it lives as long as one of them.
+static HHOOK activationHook = nullptr;
+static UINT activationWatchers = 0;
+
+static void OnWindowActivating(HWND window) {
+    ToolbarClient *client = CurrentClient();
+    if (!client) return;
+    for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i) {
+        if (manager->frame != window) continue;
+        for (UINT t = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, t); ++t) {
+            HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
+            if (frame && IsWindowVisible(frame)) SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
+        }
+    }
+}
+
+static LRESULT CALLBACK ActivationHookProc(int code, WPARAM wParam, LPARAM lParam) {
+    if (code == HCBT_ACTIVATE) OnWindowActivating(reinterpret_cast<HWND>(wParam));
+    return CallNextHookEx(activationHook, code, wParam, lParam);
+}
+
+void WatchHostActivation() {
+    if (activationWatchers++ == 0)
+        activationHook = SetWindowsHookExA(WH_CBT, ActivationHookProc, nullptr, GetCurrentThreadId());
+}
+
+void UnwatchHostActivation() {
+    if (activationWatchers == 0 || --activationWatchers != 0) return;
+    if (activationHook) UnhookWindowsHookEx(activationHook);
+    activationHook = nullptr;
+}
+
 UINT ShowToolbarWindow(HWND window, UINT show) {
     HWND target = ResolveRoleWindow(window, ROLE_ACTIVE);
     if (!target) return 0;
