@@ -448,6 +448,25 @@ TEST_F(ToolbarTest, ButtonTextKeepsEveryToolbarsRows) {
     }
 }
 
+// The switch packs every dock once, the top dock first: the side docks start
+// below it, whatever the order of the toolbars. The frame hears of each dock
+// that changed once.
+TEST_F(ToolbarTest, ButtonTextPacksEachDockOnceTopFirst) {
+    HWND left = MakeDock(DOCK_LEFT);
+    Make({1, 2}, TBF_VISIBLE | TBF_DOCKED, left); // first in the manager's list
+    for (int i = 0; i < 3; ++i)
+        Make({3, 4, 5});
+    for (UINT on : {1u, 0u}) {
+        ClearFrameLog();
+        QBR_SetButtonText(on);
+        Pump();
+        EXPECT_EQ(2, CountHeard(WM_SIZE)) << "button text " << on;
+        RECT topClient;
+        GetClientRect(top, &topClient);
+        EXPECT_EQ(topClient.bottom, WindowRectInParent(left).top) << "button text " << on;
+    }
+}
+
 TEST_F(ToolbarTest, StaleHandlesAndForeignWindowsGiveZero) {
     HWND pane = Make({1});
     HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);

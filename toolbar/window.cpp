@@ -398,15 +398,24 @@ UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight)
     return 1;
 }
 
+// Every dock is packed once, after all toolbars are refitted: packing it again
+// for each of its toolbars would move and paint its panes once per toolbar (a
+// dock of 40 took 40 packs), and only the last packing would stay on the
+// screen. The top dock goes first, since the side docks start below it.
 UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     if (!manager) return 0;
-    for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
-        HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
-        RefitToolbar(pane, ROLE_BOTH);
-        ComputeRowBreaks(pane, ROLE_FLOATING);
-        ComputeRowBreaks(pane, ROLE_DOCKED);
-        if (ResolveRoleWindow(pane, ROLE_ACTIVE) == pane) RelayoutDock(DockOfToolbar(pane));
+    {
+        DeferDockPacking deferred;
+        for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
+            HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
+            RefitToolbar(pane, ROLE_BOTH);
+            ComputeRowBreaks(pane, ROLE_FLOATING);
+            ComputeRowBreaks(pane, ROLE_DOCKED);
+        }
     }
+    for (bool top : {true, false})
+        for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
+            if ((dock->side == DOCK_TOP) == top) PackDock(dock);
     return 1;
 }
 
