@@ -219,6 +219,7 @@ UINT RelayoutDock(HWND window) {
 static UINT packingDeferred = 0;
 DeferDockPacking::DeferDockPacking() { ++packingDeferred; }
 DeferDockPacking::~DeferDockPacking() { --packingDeferred; }
+bool DeferDockPacking::Active() { return packingDeferred != 0; }
 
 UINT PackDock(DockArea *dock) {
     if (!dock) return 0;

@@ -29,6 +29,9 @@ class DeferDockPacking {
     ~DeferDockPacking();
     DeferDockPacking(const DeferDockPacking &) = delete;
     DeferDockPacking &operator=(const DeferDockPacking &) = delete;
+    // Whether one lives now: a docked pane refitted meanwhile is painted by
+    // the packing that follows, not once more on its own.
+    static bool Active();
 };
 void PlaceDock(HWND window, RECT *rect);
 void ApplyDockSideRule(HWND window, RECT *rect);

@@ -1,5 +1,6 @@
 // Dock areas: placing empty docks, the side rules, hit testing of dock windows,
 // the WM_SIZE notices to the frame, packing of real panes and drop indexes.
+#include <utility>
 #include <vector>
 
 #include "core/core.h"
@@ -379,6 +380,23 @@ TEST_F(DockPackTest, SurfaceIsButtonFaceClosedByAWindowFrameLine) {
     ASSERT_GT(px.height, 2);
     EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(x, client.bottom - 1));
     EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(x, client.bottom - 2));
+}
+
+// Panes that the packing moves are painted at their new place, and the dock
+// surface they left is painted again: no border line is left behind.
+TEST_F(DockPackTest, MovedPanesLeaveNoTrace) {
+    HWND t1 = Toolbar(1, 5);
+    HWND t2 = Toolbar(6, 3);
+    if (WindowRectInParent(t2).left < WindowRectInParent(t1).left) std::swap(t1, t2); // t1 stands first
+    const RECT before = WindowRectInParent(t2);
+    const int y = (before.top + before.bottom) / 2;
+    ASSERT_EQ(GetSysColor(COLOR_WINDOWFRAME), ReadWindowPixels(dock).At(before.right - 1, y));
+    QBR_SetToolbarFlags(t1, TBF_HIDDEN); // t2 moves to the front
+    const RECT after = WindowRectInParent(t2);
+    ASSERT_LT(after.right, before.right);
+    const Pixels px = ReadWindowPixels(dock);
+    EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(before.right - 1, y)) << "the old right border is gone";
+    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(after.right - 1, y)) << "the right border at the new place";
 }
 
 TEST_F(DockPackTest, ADockThatHoldsToolbarsIsNotDestroyed) {

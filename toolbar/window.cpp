@@ -181,12 +181,29 @@ static int Height(const RECT &r) { return r.bottom - r.top; }
 
 // SetWindowPos for the library's own moves: never activating, never touching
 // the z-order, and only with the parts that change.
+//
+// A shown pane is placed without the window system's own redraw, which erases
+// and paints the border at once, inside the call, for every pane a packing
+// moves. The same parts are marked instead (the pane with its border, and the
+// dock surface it left) and painted together by the next update: the dock's,
+// at the end of the packing, or the pane's own after a refit.
 static void PlaceWindow(HWND window, const RECT &target, bool moved, bool sized) {
     UINT flags = SWP_NOZORDER | SWP_NOACTIVATE;
     if (!moved) flags |= SWP_NOMOVE;
     if (!sized) flags |= SWP_NOSIZE;
+    const bool quiet = IsToolbarPane(window) && IsWindowVisible(window);
+    RECT left = {};
+    if (quiet) {
+        flags |= SWP_NOREDRAW;
+        GetWindowRect(window, &left);
+        ScreenRectToClient(GetParent(window), &left);
+    }
     SetWindowPos(window, nullptr, moved ? target.left : 0, moved ? target.top : 0, sized ? Width(target) : 0,
                  sized ? Height(target) : 0, flags);
+    if (quiet) {
+        InvalidateRect(GetParent(window), &left, TRUE);
+        RedrawWindow(window, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE | RDW_FRAME);
+    }
 }
 
 void MoveToolbarWindow(HWND window, int role, const RECT *rect) {
@@ -220,6 +237,7 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
     InvalidateRect(target, rect, FALSE);
+    if (role == ROLE_DOCKED && DeferDockPacking::Active()) return;
     UpdateWindow(target);
 }
 
