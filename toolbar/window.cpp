@@ -314,15 +314,17 @@ static void ShowWithoutActivating(HWND window) {
 // some window systems that happens again a moment later, without a message,
 // when it is exposed. The shown floating frames go back on top at once and
 // once more when that has settled.
-void KeepFloatingFramesAbove(ToolbarManager *manager) {
+static void RestackFloatingFrames(ToolbarManager *manager, bool now) {
     if (!manager) return;
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
         HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
         if (!frame || !IsWindowVisible(frame)) continue;
-        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+        if (now) SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
         SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
     }
 }
+
+void KeepFloatingFramesAbove(ToolbarManager *manager) { RestackFloatingFrames(manager, true); }
 
 void OnRestackTimer(HWND frame, UINT_PTR timer) {
     KillTimer(frame, timer);
@@ -341,21 +343,17 @@ void OnRestackTimer(HWND frame, UINT_PTR timer) {
 // to the frames. Windows keeps owned windows above their owner, so there this
 // costs one harmless restack. A thread hook sees every activation before it
 // happens; when the window is a host frame of this client, its shown floating
-// frames go back on top once the activation has settled. One hook serves all
-// managers of the thread; it lives as long as one of them.
+// frames go back on top once the activation has settled (not at once: the
+// activation is still under way). One hook serves all managers of the thread;
+// it lives as long as one of them.
 static HHOOK activationHook = nullptr;
 static UINT activationWatchers = 0;
 
 static void OnWindowActivating(HWND window) {
     ToolbarClient *client = CurrentClient();
     if (!client) return;
-    for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i) {
-        if (manager->frame != window) continue;
-        for (UINT t = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, t); ++t) {
-            HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
-            if (frame && IsWindowVisible(frame)) SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
-        }
-    }
+    for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i)
+        if (manager->frame == window) RestackFloatingFrames(manager, false);
 }
 
 static LRESULT CALLBACK ActivationHookProc(int code, WPARAM wParam, LPARAM lParam) {
