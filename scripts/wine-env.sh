@@ -26,8 +26,10 @@ log="$state/log.txt"
 
 export WINEPREFIX="$build/wineprefix"
 export WINEDEBUG=-all
-# WinHelp with a missing file would wait on a modal message box.
-export WINEDLLOVERRIDES="winhlp32.exe=d;mscoree=d;mshtml=d"
+# WinHelp with a missing file would wait on a modal message box, and a
+# program that crashes would wait in Wine's debugger until a timeout: with the
+# debugger off it ends at once with the exception's code.
+export WINEDLLOVERRIDES="winhlp32.exe=d;winedbg.exe=d;mscoree=d;mshtml=d"
 export WINEARCH=win64
 
 alive() { # pid: a live process that is not a zombie
