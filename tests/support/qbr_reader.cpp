@@ -3,7 +3,8 @@
 // the program that owns the named top-level window, then IAccessible calls.
 //
 //   qbr_reader list TITLE            every shown toolbar and its items
-//   qbr_reader focus TITLE           "Toolbar: Name" of the focused button, or "none"
+//   qbr_reader focus TITLE           "Toolbar: Name" of the focused button, or "none";
+//                                    "Toolbar: Name [Frame]" in another frame
 //   qbr_reader do TITLE TOOLBAR N    the default action of item N of a toolbar
 //
 // Item lines read: "  N role "Name" state,state "Action"". The exit code is 0
@@ -155,7 +156,12 @@ int Focus(HWND main) {
         VariantInit(&focus);
         if (object->get_accFocus(&focus) == S_OK && focus.vt == VT_I4 && focus.lVal > 0 &&
             (StateBits(object, focus.lVal) & STATE_SYSTEM_FOCUSED)) {
-            std::printf("%s: %s\n", Name(object, CHILDID_SELF).c_str(), Name(object, focus.lVal).c_str());
+            // A frame other than the named one is told: each frame has its own toolbars.
+            char frame[128] = "";
+            HWND root = GetAncestor(window, GA_ROOTOWNER);
+            if (root != main) GetWindowTextA(root, frame, sizeof frame);
+            std::printf("%s: %s%s%s%s\n", Name(object, CHILDID_SELF).c_str(), Name(object, focus.lVal).c_str(),
+                        *frame ? " [" : "", frame, *frame ? "]" : "");
             object->Release();
             return 0;
         }
