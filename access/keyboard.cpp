@@ -312,6 +312,7 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
     case WM_KEYDOWN:
     case WM_KEYUP:
     case WM_SYSKEYDOWN:
+    case WM_SYSKEYUP:
         break;
     default:
         return 0; // paints, timers and the rest belong to their windows
@@ -341,6 +342,9 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
         }
         if (key != VK_SHIFT) LeaveKeyboard(false);
         return 0;
+    case WM_SYSKEYUP:
+        // The release of Shift+F10 would open the frame's menu bar.
+        return key == VK_F10 ? 1 : 0;
     }
     return 0;
 }

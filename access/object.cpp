@@ -413,6 +413,12 @@ LRESULT AccessGetObject(HWND window, WPARAM wParam, LPARAM lParam) {
     auto *object = new (std::nothrow) ToolbarAccessible(window);
     if (!object) return 0;
     LRESULT result = LresultFromObject(IID_IAccessible, wParam, object);
+    // Handing the object to another process marshals it, which needs COM on
+    // this thread. A host that never started COM gets an apartment here, once,
+    // for the life of the thread, rather than a reader that finds nothing.
+    if (static_cast<HRESULT>(result) == CO_E_NOTINITIALIZED &&
+        SUCCEEDED(CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED)))
+        result = LresultFromObject(IID_IAccessible, wParam, object);
     object->Release(); // LresultFromObject holds its own reference
     return result;
 }
