@@ -295,8 +295,12 @@ TEST_F(AccessTest, StatesFollowTheButtonAndItsToolbar) {
 TEST_F(AccessTest, LocationsHitTestsAndNavigationAgreeWithTheItems) {
     HWND docked = Make("Docked", {1, 0, 2, 3});
     HWND floating = Make("Floating", {4, 5, 0, 6}, TBF_VISIBLE | TBF_FLOATING);
-    for (HWND pane : {docked, floating}) {
-        SCOPED_TRACE(pane == docked ? "docked" : "floating");
+    for (int pass = 0; pass < 4; ++pass) {
+        // Docked and floating, with and without button text.
+        HWND pane = pass % 2 ? floating : docked;
+        QBR_SetButtonText(pass >= 2 ? 1 : 0);
+        Pump();
+        SCOPED_TRACE(std::string(pane == docked ? "docked" : "floating") + (pass >= 2 ? ", button text" : ""));
         Reader reader(ResolveRoleWindow(pane, ROLE_ACTIVE));
         ASSERT_NE(nullptr, reader.object);
         RECT window;
@@ -442,6 +446,38 @@ TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     EXPECT_EQ(expected, trail);
     EXPECT_EQ(frame, GetFocus()) << "the keyboard went back to the host's window";
     EXPECT_EQ(frame, GetActiveWindow()) << "no toolbar took the activation";
+}
+
+TEST_F(AccessTest, EachFrameWalksItsOwnToolbars) {
+    Make("Main", {1, 2});
+    HWND view = CreateRecordingFrame(120, 120, 400, 300);
+    ToolbarManager *viewManager = QBR_CreateManager(view);
+    ASSERT_NE(nullptr, viewManager);
+    std::vector<UINT> ids = {5, 6};
+    QBR_AddButtons(viewManager, ids.data(), 2);
+    QBR_SetImageStrip(viewManager, "TESTSTRIP");
+    HWND viewPane = QBR_CreateToolbar("View", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0,
+                                      QBR_CreateDock(viewManager, view, DOCK_TOP), ids.data(), 2);
+    SetForegroundWindow(view);
+    SetFocus(view);
+    PumpHost(50);
+    Key("F6");
+    Key("Right");
+    UINT index = 9;
+    EXPECT_EQ(1u, AccessFocusedIndex(viewPane, &index));
+    EXPECT_EQ(1u, index);
+    EXPECT_EQ("host", Focus()) << "the main frame's toolbars stay as they were";
+    // The other frame activated: the keyboard goes back there, and F6 walks
+    // that frame's toolbars.
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    PumpHost(50);
+    EXPECT_EQ(0u, AccessFocusedIndex(viewPane, &index));
+    Key("F6");
+    EXPECT_EQ("Main 0", Focus());
+    QBR_DestroyManager(viewManager);
+    DestroyWindow(view);
+    PumpHost(50);
 }
 
 TEST_F(AccessTest, UpAndDownGoToTheNearestButtonInTheNextRow) {
