@@ -15,6 +15,7 @@
 //
 // Toolbars are taken in one order: the top dock, the left, the right, each in
 // its packing order, then the floating toolbars in the manager's order.
+#include <cstdlib>
 #include <vector>
 
 #include "access/access.h"

@@ -115,97 +115,62 @@ class ToolbarAccessible final : public IAccessible {
         return S_OK;
     }
     HRESULT STDMETHODCALLTYPE get_accChild(VARIANT child, IDispatch **out) override {
-        if (!out) return E_POINTER;
-        *out = nullptr;
-        const ToolbarRecord *record = nullptr;
-        HRESULT hr = Resolve(child, &record, nullptr);
         // The items are simple elements of this object, not objects of their own.
-        return FAILED(hr) ? hr : S_FALSE;
+        return Property(child, out, [](const ToolbarRecord *, LONG, IDispatch **) { return S_FALSE; });
     }
 
     // ---- IAccessible: descriptive properties
     HRESULT STDMETHODCALLTYPE get_accName(VARIANT child, BSTR *name) override {
-        if (!name) return E_POINTER;
-        *name = nullptr;
-        const ToolbarRecord *record = nullptr;
-        LONG id = 0;
-        HRESULT hr = Resolve(child, &record, &id);
-        if (FAILED(hr)) return hr;
-        char text[kTextBuffer] = "";
-        if (id == CHILDID_SELF)
-            QBR_GetToolbarTitle(record->paneWindow, text, kTextBuffer);
-        else
-            ButtonText(ItemOf(record, id), HELP_QUICK, text);
-        return TextResult(text, name);
+        return Property(child, name, [](const ToolbarRecord *record, LONG id, BSTR *out) {
+            char text[kTextBuffer] = "";
+            if (id == CHILDID_SELF)
+                QBR_GetToolbarTitle(record->paneWindow, text, kTextBuffer);
+            else
+                ButtonText(ItemOf(record, id), HELP_QUICK, text);
+            return TextResult(text, out);
+        });
     }
     HRESULT STDMETHODCALLTYPE get_accDescription(VARIANT child, BSTR *description) override {
-        if (!description) return E_POINTER;
-        *description = nullptr;
-        const ToolbarRecord *record = nullptr;
-        LONG id = 0;
-        HRESULT hr = Resolve(child, &record, &id);
-        if (FAILED(hr)) return hr;
-        char text[kTextBuffer] = "";
-        if (id != CHILDID_SELF) ButtonText(ItemOf(record, id), HELP_DESCRIPTION, text);
-        return TextResult(text, description);
+        return Property(child, description, [](const ToolbarRecord *record, LONG id, BSTR *out) {
+            char text[kTextBuffer] = "";
+            if (id != CHILDID_SELF) ButtonText(ItemOf(record, id), HELP_DESCRIPTION, text);
+            return TextResult(text, out);
+        });
     }
     HRESULT STDMETHODCALLTYPE get_accValue(VARIANT child, BSTR *value) override {
-        if (!value) return E_POINTER;
-        *value = nullptr;
-        HRESULT hr = Resolve(child, nullptr, nullptr);
-        return FAILED(hr) ? hr : DISP_E_MEMBERNOTFOUND;
+        return Property(child, value, [](const ToolbarRecord *, LONG, BSTR *) { return DISP_E_MEMBERNOTFOUND; });
     }
     HRESULT STDMETHODCALLTYPE get_accRole(VARIANT child, VARIANT *role) override {
-        if (!role) return E_POINTER;
-        VariantInit(role);
-        const ToolbarRecord *record = nullptr;
-        LONG id = 0;
-        HRESULT hr = Resolve(child, &record, &id);
-        if (FAILED(hr)) return hr;
-        SetChild(role, RoleOf(record, id));
-        return S_OK;
+        return Property(child, role, [](const ToolbarRecord *record, LONG id, VARIANT *out) {
+            SetChild(out, RoleOf(record, id));
+            return S_OK;
+        });
     }
     HRESULT STDMETHODCALLTYPE get_accState(VARIANT child, VARIANT *state) override {
-        if (!state) return E_POINTER;
-        VariantInit(state);
-        const ToolbarRecord *record = nullptr;
-        LONG id = 0;
-        HRESULT hr = Resolve(child, &record, &id);
-        if (FAILED(hr)) return hr;
-        SetChild(state, static_cast<LONG>(StateOf(record, id)));
-        return S_OK;
+        return Property(child, state, [this](const ToolbarRecord *record, LONG id, VARIANT *out) {
+            SetChild(out, static_cast<LONG>(StateOf(record, id)));
+            return S_OK;
+        });
     }
     HRESULT STDMETHODCALLTYPE get_accHelp(VARIANT child, BSTR *help) override {
-        if (!help) return E_POINTER;
-        *help = nullptr;
-        HRESULT hr = Resolve(child, nullptr, nullptr);
-        return FAILED(hr) ? hr : S_FALSE;
+        return Property(child, help, [](const ToolbarRecord *, LONG, BSTR *) { return S_FALSE; });
     }
     HRESULT STDMETHODCALLTYPE get_accHelpTopic(BSTR *file, VARIANT child, LONG *topic) override {
-        if (file) *file = nullptr;
         if (topic) *topic = 0;
-        HRESULT hr = Resolve(child, nullptr, nullptr);
-        return FAILED(hr) ? hr : S_FALSE;
+        return Property(child, file, [](const ToolbarRecord *, LONG, BSTR *) { return S_FALSE; });
     }
     HRESULT STDMETHODCALLTYPE get_accKeyboardShortcut(VARIANT child, BSTR *shortcut) override {
-        if (!shortcut) return E_POINTER;
-        *shortcut = nullptr;
-        HRESULT hr = Resolve(child, nullptr, nullptr);
-        return FAILED(hr) ? hr : S_FALSE;
+        return Property(child, shortcut, [](const ToolbarRecord *, LONG, BSTR *) { return S_FALSE; });
     }
     HRESULT STDMETHODCALLTYPE get_accDefaultAction(VARIANT child, BSTR *action) override {
-        if (!action) return E_POINTER;
-        *action = nullptr;
-        const ToolbarRecord *record = nullptr;
-        LONG id = 0;
-        HRESULT hr = Resolve(child, &record, &id);
-        if (FAILED(hr)) return hr;
-        const ButtonData *data = DataOf(ItemOf(record, id));
-        if (!data) return S_FALSE;
-        UINT text = kActionPressText;
-        if (ButtonGetBehaviour(data) & BTN_CHECK)
-            text = ButtonGetState(data) == 1 ? kActionUncheckText : kActionCheckText;
-        return TextResult(LoadLibraryText(text), action);
+        return Property(child, action, [](const ToolbarRecord *record, LONG id, BSTR *out) {
+            const ButtonData *data = DataOf(ItemOf(record, id));
+            if (!data) return S_FALSE;
+            UINT text = kActionPressText;
+            if (ButtonGetBehaviour(data) & BTN_CHECK)
+                text = ButtonGetState(data) == 1 ? kActionUncheckText : kActionCheckText;
+            return TextResult(LoadLibraryText(text), out);
+        });
     }
 
     // ---- IAccessible: focus and selection
@@ -340,6 +305,20 @@ class ToolbarAccessible final : public IAccessible {
         if (record) *record = found;
         if (id) *id = child.lVal;
         return S_OK;
+    }
+
+    // The shape every property read shares: the out-parameter cleared, the
+    // toolbar and the child looked up, then the property itself.
+    static void Clear(BSTR *out) { *out = nullptr; }
+    static void Clear(VARIANT *out) { VariantInit(out); }
+    static void Clear(IDispatch **out) { *out = nullptr; }
+    template <typename Out, typename Read> HRESULT Property(const VARIANT &child, Out *out, Read read) const {
+        if (!out) return E_POINTER;
+        Clear(out);
+        const ToolbarRecord *record = nullptr;
+        LONG id = 0;
+        HRESULT hr = Resolve(child, &record, &id);
+        return FAILED(hr) ? hr : read(record, id, out);
     }
 
     static void ButtonText(const ToolbarItem *item, UINT kind, char (&text)[kTextBuffer]) {
