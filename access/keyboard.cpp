@@ -175,6 +175,8 @@ void MoveToToolbar(int step) {
 }
 
 bool EnterKeyboard(HWND root) {
+    // The mouse holds the toolbars while it presses or drags.
+    if (mouseTrack.pressActive || mouseTrack.dragActive || mouseTrack.closePressActive) return false;
     for (ToolbarRecord *record : ShownToolbars(ManagerOfFrame(root))) {
         UINT index;
         if (!FirstEnabled(record, &index)) continue;

@@ -230,6 +230,9 @@ TEST_F(AccessTest, ReadsTheToolbarAndEveryItemInListOrder) {
     Reader reader(pane);
     ASSERT_NE(nullptr, reader.object);
     EXPECT_EQ(ROLE_SYSTEM_TOOLBAR, reader.Role(CHILDID_SELF));
+    IDispatch *parent = nullptr;
+    EXPECT_EQ(S_OK, reader.object->get_accParent(&parent)) << "the window's own object";
+    if (parent) parent->Release();
     EXPECT_EQ("Tools", reader.Name(CHILDID_SELF));
     ASSERT_EQ(4, reader.Count());
     struct Row {
@@ -617,6 +620,16 @@ TEST_F(AccessTest, AMousePressOrAnotherActiveWindowGivesTheKeyboardBack) {
     DestroyWindow(other);
     SetForegroundWindow(frame);
     PumpHost(50);
+
+    // While the mouse holds a button down, F6 is not the toolbars'.
+    const RECT item = ScreenItem(QBR_GetToolbar(manager, 0), 1);
+    const POINT centre = {(item.left + item.right) / 2, (item.top + item.bottom) / 2};
+    ClearFrameLog();
+    SendMouse(WM_LBUTTONDOWN, centre, MK_LBUTTON);
+    Key("F6");
+    EXPECT_EQ("host", Focus());
+    SendMouse(WM_LBUTTONUP, centre, 0);
+    EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
 }
 
 TEST_F(AccessTest, ShiftF10AndTheMenuKeyOpenTheToolbarMenu) {
