@@ -804,4 +804,68 @@ TEST_F(SurfaceTest, TheCloseBoxDashNeedsABandOfFivePixels) {
     captionHeight = saved;
 }
 
+// The relief of a raised and of a sunken button, pixel by pixel: f frame ring,
+// H light edge, S dark edge, F face, '.' corner left alone, '?' the image.
+// Raised: one light pixel left and top, two dark ones right and bottom.
+// Sunken: one dark pixel left and top, and the image one pixel further in.
+TEST_F(PaintTest, RaisedAndSunkenEdgesToThePixel) {
+    std::vector<std::string> raised = {".ffffffffffffffffffffff.", "fHHHHHHHHHHHHHHHHHHHHHSf",
+                                       "fHFFFFFFFFFFFFFFFFFFFSSf"};
+    for (int y = 3; y <= 17; ++y)
+        raised.push_back("fHF????????????????FFSSf");
+    raised.push_back("fHFFFFFFFFFFFFFFFFFFFSSf");
+    raised.push_back("fHSSSSSSSSSSSSSSSSSSSSSf");
+    raised.push_back("fSSSSSSSSSSSSSSSSSSSSSSf");
+    raised.push_back(".ffffffffffffffffffffff.");
+    std::vector<std::string> sunken = {".ffffffffffffffffffffff.", "fSSSSSSSSSSSSSSSSSSSSSSf",
+                                       "fSFFFFFFFFFFFFFFFFFFFFFf", "fSFFFFFFFFFFFFFFFFFFFFFf"};
+    for (int y = 4; y <= 18; ++y)
+        sunken.push_back("fSFF????????????????FFFf");
+    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
+    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
+    sunken.push_back(".ffffffffffffffffffffff.");
+    Canvas canvas(24, 22);
+    for (int pressed = 0; pressed < 2; ++pressed) {
+        const std::vector<std::string> &picture = pressed ? sunken : raised;
+        ASSERT_EQ(22u, picture.size());
+        SetBits(4, pressed ? BS_PRESSED : 0);
+        canvas.Clear();
+        PaintOne(canvas, 4, 0, 0);
+        for (int y = 0; y < 22; ++y) {
+            ASSERT_EQ(24u, picture[y].size()) << y;
+            for (int x = 0; x < 24; ++x) {
+                const char c = picture[y][x];
+                if (c == '?') continue;
+                const COLORREF want = c == 'f'   ? colors.frame
+                                      : c == 'H' ? colors.highlight
+                                      : c == 'S' ? colors.shadow
+                                      : c == 'F' ? colors.face
+                                                 : kUntouched;
+                EXPECT_EQ(Hex(want), Hex(canvas.At(x, y))) << (pressed ? "sunken" : "raised") << " at " << x << "," << y;
+            }
+        }
+    }
+}
+
+// In text mode the image stands 5 pixels below the frame ring's inside (6 when
+// pressed): the red square of the test cell (1..2, 1..2) starts at row 7.
+TEST_F(PaintTest, TextModeImageStandsFivePixelsDown) {
+    QBR_SetButtonText(1);
+    int bw = 0, bh = 0;
+    GetButtonSizes(&bw, &bh, nullptr, nullptr);
+    Canvas canvas(bw, bh);
+    const int imageX = 1 + ((bw - 2 - kCellW - 1) >> 1);
+    for (int pressed = 0; pressed < 2; ++pressed) {
+        SetBits(7, pressed ? BS_PRESSED : 0);
+        canvas.Clear();
+        PaintOne(canvas, 7, 0, 0);
+        const int top = 1 + 5 + pressed;
+        for (int y = top - 1; y <= top + 3; ++y) {
+            const bool red = y >= top + 1 && y <= top + 2;
+            EXPECT_EQ(red, canvas.At(imageX + pressed + 1, y) == kRed) << "row " << y << (pressed ? ", pressed" : "");
+        }
+    }
+    QBR_SetButtonText(0);
+}
+
 } // namespace
