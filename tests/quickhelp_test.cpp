@@ -373,8 +373,13 @@ TEST_F(QuickHelpTest, ThePollTicksEveryTwoHundredMilliseconds) {
 // tip comes one period after the last move. Nothing is pumped between the
 // moves, so no tick of an earlier wait can run in between; were the wait not
 // restarted, the first pump after the last move would find the first timer due.
+// The button is the one whose tip showed last (a hidden tip keeps its item),
+// so that only the rule of the hidden tip restarts the wait, not a change of item.
 TEST_F(QuickHelpTest, EveryMoveWhileWaitingStartsTheWaitAgain) {
     HWND window = ResolveRoleWindow(pane, ROLE_ACTIVE);
+    ShowTip(pane, 0);
+    Leave();
+    ASSERT_EQ(Item(1), helpItem);
     Hover(pane, At(pane, 0));
     DWORD last = GetTickCount();
     for (int move = 0; move < 3; ++move) {
