@@ -780,7 +780,7 @@ TEST_F(SurfaceTest, TheTitleStandsCentredOnePixelAboveTheClientArea) {
 
 // The close box gets its dash from a band of 5 pixels on: its black outline
 // has its top left pixel at (2, ((height - 1) >> 1) - 1); below 5 the box is
-// edge and face only.
+// edge and face only, with no pixel of a dash however small.
 TEST_F(SurfaceTest, TheCloseBoxDashNeedsABandOfFivePixels) {
     HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
     const int saved = captionHeight;
@@ -799,6 +799,13 @@ TEST_F(SurfaceTest, TheCloseBoxDashNeedsABandOfFivePixels) {
         const int t = (k.height - 1) >> 1;
         EXPECT_EQ(Hex(k.dash ? kBlack : colors.face), Hex(canvas.At(2, t - 1))) << "band " << k.height;
         EXPECT_EQ(k.dash, black > 0) << "band " << k.height;
+        if (!k.dash) { // the inside of the box is face, every pixel of it
+            int face = 0;
+            for (int y = 0; y < k.height - 1; ++y)
+                for (int x = 0; x < k.height; ++x)
+                    face += canvas.At(x, y) == colors.face;
+            EXPECT_EQ(k.height * (k.height - 1), face) << "band " << k.height;
+        }
         EXPECT_EQ(Hex(line), Hex(canvas.At(k.height, 0))) << "band " << k.height << ": right edge";
     }
     captionHeight = saved;
