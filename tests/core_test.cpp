@@ -5,7 +5,10 @@
 
 #include "core/core.h"
 #include "harness.h"
+#include "paint/paint.h"
 #include "quaybar.h"
+#include "quickhelp/quickhelp.h"
+#include "toolbar/toolbar.h"
 
 extern "C" int CApiRoundTrip(void);
 
@@ -383,3 +386,228 @@ TEST(LeakTest, ManagersAndClientsReleaseEveryBlock) {
 }
 
 TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CApiRoundTrip()); }
+
+// ---- Bounds of the token readers ----------------------------------------------------------
+
+// White space is exactly space, tab, line feed, vertical tab, form feed and
+// carriage return; one sign at most; digits are '0' to '9'.
+TEST(TokenTest, WhiteSpaceSignAndDigitsHaveExactBounds) {
+    struct Case {
+        const char *input;
+        int value;
+        const char *rest;
+    };
+    const Case cases[] = {
+        {"\v7,1", 7, "1"},      {"\f8,1", 8, "1"},      {"\r9,1", 9, "1"}, {"\n\t 6,1", 6, "1"},
+        {"\x01" "5,2", 0, "2"}, {"\x1f" "5,2", 0, "2"}, {"3:4,5", 3, "5"}, {"3/4,5", 3, "5"},
+        {"--5,6", 0, "6"},      {"+-5,6", 0, "6"},      {"-+5,6", 0, "6"}, {"09,1", 9, "1"},
+    };
+    for (const Case &k : cases) {
+        char buffer[64];
+        std::strcpy(buffer, k.input);
+        EXPECT_EQ(k.value, ReadTokenInt(buffer)) << static_cast<int>(k.input[0]) << " " << k.input;
+        EXPECT_STREQ(k.rest, buffer) << k.input;
+    }
+}
+
+// ---- Starts, ends and the module instance ------------------------------------------------
+
+// What the shared objects were when the tip window was made, and when it was
+// hidden by the end.
+struct OrderSeen {
+    int created = 0, hidden = 0;
+    bool paintAndCaptionBeforeTip = false;
+    bool paintAndCaptionGoneBeforeTip = false;
+} orderSeen;
+
+bool IsHelpWindow(HWND window) {
+    char name[32] = "";
+    GetClassNameA(window, name, sizeof(name));
+    return std::strcmp(name, "QBR_HelpWindow") == 0;
+}
+
+LRESULT CALLBACK WatchCreation(int code, WPARAM wParam, LPARAM lParam) {
+    if (code == HCBT_CREATEWND && IsHelpWindow(reinterpret_cast<HWND>(wParam))) {
+        ++orderSeen.created;
+        orderSeen.paintAndCaptionBeforeTip = buttonFont && ditherBrush && captionFont;
+    }
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+
+LRESULT CALLBACK WatchHide(int code, WPARAM wParam, LPARAM lParam) {
+    const CWPSTRUCT *sent = reinterpret_cast<const CWPSTRUCT *>(lParam);
+    if (code == HC_ACTION && sent->message == WM_SHOWWINDOW && !sent->wParam && IsHelpWindow(sent->hwnd)) {
+        ++orderSeen.hidden;
+        orderSeen.paintAndCaptionGoneBeforeTip = !buttonFont && !ditherBrush && !captionFont && helpFont;
+    }
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+
+// The three starts run in one order, painting, caption, quick help, and the
+// ends in the same order: the tip window is made once the paint objects and
+// the caption font exist, and hidden by the end once they are gone while its
+// own font is still there.
+TEST(ClientRegistryTest, StartsAndEndsRunInTheSameOrder) {
+    moduleInstance = GetModuleHandleA(nullptr);
+    orderSeen = OrderSeen();
+    HHOOK cbt = SetWindowsHookExA(WH_CBT, WatchCreation, nullptr, GetCurrentThreadId());
+    ASSERT_NE(nullptr, cbt);
+    const UINT started = QBR_Initialize(GetModuleHandleA(nullptr), nullptr);
+    UnhookWindowsHookEx(cbt);
+    ASSERT_EQ(1u, started);
+    EXPECT_EQ(1, orderSeen.created);
+    EXPECT_TRUE(orderSeen.paintAndCaptionBeforeTip);
+
+    ShowWindow(CurrentClient()->helpWindow, SW_SHOWNA);
+    HHOOK sent = SetWindowsHookExA(WH_CALLWNDPROC, WatchHide, nullptr, GetCurrentThreadId());
+    ASSERT_NE(nullptr, sent);
+    QBR_Terminate();
+    UnhookWindowsHookEx(sent);
+    EXPECT_EQ(1, orderSeen.hidden);
+    EXPECT_TRUE(orderSeen.paintAndCaptionGoneBeforeTip);
+    EXPECT_EQ(nullptr, helpFont);
+}
+
+// A manager adopts its frame's instance as the module instance only when none
+// is set and only while one client exists.
+TEST(ClientRegistryTest, AManagerAdoptsTheFramesInstanceOnlyForOneClientAndOnlyOnce) {
+    moduleInstance = GetModuleHandleA(nullptr);
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+    HWND frame = CreateRecordingFrame();
+    const HINSTANCE frameInstance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
+    const HINSTANCE other = GetModuleHandleA("kernel32.dll");
+    ASSERT_NE(frameInstance, other);
+    const struct {
+        const char *what;
+        HINSTANCE before;
+        bool second;
+        HINSTANCE after;
+    } cases[] = {
+        {"one client, none set", nullptr, false, frameInstance},
+        {"one client, one set", other, false, other},
+        {"two clients, none set", nullptr, true, nullptr},
+    };
+    for (const auto &k : cases) {
+        if (k.second) ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
+        moduleInstance = k.before;
+        ToolbarManager *manager = QBR_CreateManager(frame);
+        EXPECT_EQ(k.after, moduleInstance) << k.what;
+        QBR_DestroyManager(manager);
+        moduleInstance = GetModuleHandleA(nullptr);
+        if (k.second) {
+            // Torn down by hand, as its thread key finds the first client.
+            ToolbarClient *second = ListAt<ToolbarClient>(clientTable, 1);
+            PointerListDestroy(second->managers);
+            UnregisterClient(second);
+        }
+    }
+    DestroyWindow(frame);
+    QBR_Terminate();
+}
+
+// ---- Repaints of the setters ----------------------------------------------------------------
+
+// Counts the WM_PAINT messages of windows it subclasses.
+class PaintCounter {
+  public:
+    explicit PaintCounter(HWND window) : window_(window) {
+        counter_ = this;
+        old_ = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(window, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(Proc)));
+    }
+    ~PaintCounter() {
+        SetWindowLongPtrA(window_, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(old_));
+        counter_ = nullptr;
+    }
+    PaintCounter(const PaintCounter &) = delete;
+    PaintCounter &operator=(const PaintCounter &) = delete;
+    // The paints since the last call, the queue drained first.
+    int Take() {
+        Pump();
+        const int n = paints_;
+        paints_ = 0;
+        return n;
+    }
+
+  private:
+    static LRESULT CALLBACK Proc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+        if (message == WM_PAINT) ++counter_->paints_;
+        return CallWindowProcA(counter_->old_, window, message, wParam, lParam);
+    }
+    static PaintCounter *counter_;
+    HWND window_;
+    WNDPROC old_ = nullptr;
+    int paints_ = 0;
+};
+PaintCounter *PaintCounter::counter_ = nullptr;
+
+class SetterPaintTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(1, 3);
+        const UINT ids[] = {1, 2, 3};
+        pane = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, MakeDock(DOCK_TOP), ids, 3);
+        ASSERT_NE(nullptr, pane);
+        Pump();
+    }
+    HWND pane = nullptr;
+};
+
+// Every state setter compares first: a value that reads as the present one
+// paints nothing, a real change paints the button once. The image setter
+// always repaints; the behaviour setter never does.
+TEST_F(SetterPaintTest, ButtonSettersPaintOnlyARealChange) {
+    using Setter = UINT (*)(ToolbarManager *, UINT, UINT);
+    const struct {
+        const char *what;
+        Setter set;
+        UINT argument;
+        int paints;
+    } steps[] = {
+        {"on", QBR_SetButtonState, 1, 1},
+        {"on again", QBR_SetButtonState, 1, 0},
+        {"3 reads off", QBR_SetButtonState, 3, 1},
+        {"3 again", QBR_SetButtonState, 3, 0},
+        {"mixed", QBR_SetButtonState, 2, 1},
+        {"disable", QBR_SetButtonEnabled, 0, 1},
+        {"disable again", QBR_SetButtonEnabled, 0, 0},
+        {"enable with 2", QBR_SetButtonEnabled, 2, 1},
+        {"enable with 2 again", QBR_SetButtonEnabled, 2, 0},
+        {"press", QBR_SetButtonPressed, 1, 1},
+        {"press again", QBR_SetButtonPressed, 1, 0},
+        {"release", QBR_SetButtonPressed, 0, 1},
+        {"release again", QBR_SetButtonPressed, 0, 0},
+        {"image", QBR_SetButtonImage, 2, 1},
+        {"the same image", QBR_SetButtonImage, 2, 1},
+        {"behaviour", QBR_SetButtonBehaviour, BTN_CHECK, 0},
+    };
+    PaintCounter counter(pane);
+    ASSERT_EQ(0, counter.Take());
+    for (const auto &step : steps) {
+        EXPECT_EQ(1u, step.set(manager, 2, step.argument)) << step.what;
+        EXPECT_EQ(step.paints, counter.Take()) << step.what;
+    }
+}
+
+// Button text set to the value it has still walks every toolbar and refits
+// it, which repaints it.
+TEST_F(SetterPaintTest, ButtonTextWithThePresentValueStillRefits) {
+    PaintCounter counter(pane);
+    ASSERT_EQ(0, counter.Take());
+    ASSERT_EQ(0u, QBR_GetButtonText());
+    QBR_SetButtonText(0);
+    EXPECT_GE(counter.Take(), 1);
+}
+
+// A radio range reaches its last id, whichever id is on.
+TEST_F(ManagerTest, RadioRangesReachTheirLastId) {
+    const UINT ids[] = {301, 302, 303};
+    QBR_AddButtons(manager, ids, 3);
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 301, 303, 303));
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 303));
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 301, 303, 301));
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 303));
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 301));
+    EXPECT_EQ(1u, QBR_SetRadioRange(manager, 302, 302, 302)) << "a range of one";
+    EXPECT_EQ(1u, QBR_GetButtonState(manager, 302));
+}

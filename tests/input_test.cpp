@@ -3,6 +3,7 @@
 // look at what the host frame heard, button states and looks, where toolbars
 // went, and the drag frame on the screen itself.
 #include <algorithm>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -558,6 +559,120 @@ TEST_F(InputTest, AMissedCloseBoxReleaseServesTheNextOneFirst) {
     EXPECT_EQ(TBF_VISIBLE | TBF_FLOATING, Place(floatingPane));
     EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, Place(pane));
     InvalidateRect(pane, nullptr, TRUE); // the close box tracking drew on it
+}
+
+// ---- The drag frame to the pixel ------------------------------------------------------
+
+// The frame is four 2-pixel strips along the inside of its rectangle that meet
+// without overlap, inverted through a checker of single pixels whose rows are
+// 0xAA, 0x55, ... from the screen's own origin: a pixel of the band is inverted
+// exactly where its screen x + y is even; nothing else changes.
+void ExpectExactFrame(const Pixels &before, const RECT &area, const RECT &frame, const char *what) {
+    const Pixels now = ReadScreenPixels(area);
+    RECT inside = frame;
+    InflateRect(&inside, -2, -2);
+    int wrong = 0;
+    for (int y = 0; y < now.height; ++y)
+        for (int x = 0; x < now.width; ++x) {
+            const POINT s = {area.left + x, area.top + y};
+            const bool band = PtInRect(&frame, s) && !PtInRect(&inside, s);
+            const bool inverted = band && (s.x + s.y) % 2 == 0;
+            const COLORREF want = inverted ? before.At(x, y) ^ 0xFFFFFF : before.At(x, y);
+            if (now.At(x, y) != want && ++wrong <= 5)
+                ADD_FAILURE() << what << ": " << s.x << "," << s.y << (band ? " in the band" : " outside the band")
+                              << (inverted ? ", should be inverted" : ", should be kept");
+        }
+    EXPECT_EQ(0, wrong) << what;
+}
+
+TEST_F(InputTest, TheDragFrameIsAnExactCheckerOfFourStrips) {
+    // Rectangles of both parities of corner, width and height, down to the
+    // smallest with a left strip.
+    const RECT frames[] = {Rect(300, 200, 340, 230), Rect(301, 201, 338, 227), Rect(310, 211, 315, 216),
+                           Rect(320, 221, 324, 226)};
+    for (const RECT &f : frames) {
+        const RECT area = {f.left - 4, f.top - 4, f.right + 4, f.bottom + 4};
+        const Pixels before = ReadScreenPixels(area);
+        DrawDragFrame(&f);
+        ExpectExactFrame(before, area, f, "drawn");
+        DrawDragFrame(&f);
+        EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors) << "drawn twice";
+    }
+    // A real drag: the frame at the toolbar's outer rectangle, then where a
+    // move by an odd distance takes it.
+    HWND pane = Make({1, 2, 3});
+    RECT outer;
+    GetWindowRect(pane, &outer);
+    const RECT area = {outer.left - 10, outer.top - 10, outer.right + 50, outer.bottom + 50};
+    const POINT from = Empty(pane);
+    const Pixels before = ReadScreenPixels(area);
+    Down(from);
+    ExpectExactFrame(before, area, outer, "at the press");
+    Move(Offset(from, 21, 13));
+    RECT moved = outer;
+    OffsetRect(&moved, 21, 13);
+    ExpectExactFrame(before, area, moved, "moved");
+    Move(Offset(from, 20, 13));
+    OffsetRect(&moved, -1, 0);
+    ExpectExactFrame(before, area, moved, "moved back one pixel");
+    Move(from);
+    EXPECT_EQ(outer, mouseTrack.dragFrame) << "back at the start";
+    Up(from);
+    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
+}
+
+// ---- The pressed look before the press message --------------------------------------------
+
+// What a window shows now, read from its device context without a repaint
+// (0x00RRGGBB words as the DIB holds them, for comparing with each other).
+std::vector<COLORREF> Shown(HWND window, const RECT &r) {
+    HDC dc = GetDC(window);
+    HDC memory = CreateCompatibleDC(dc);
+    BITMAPINFO info = {};
+    info.bmiHeader = {sizeof(BITMAPINFOHEADER), r.right - r.left, -(r.bottom - r.top), 1, 32, BI_RGB, 0, 0, 0, 0, 0};
+    void *bits = nullptr;
+    HBITMAP bitmap = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
+    HGDIOBJ old = SelectObject(memory, bitmap);
+    BitBlt(memory, 0, 0, r.right - r.left, r.bottom - r.top, dc, r.left, r.top, SRCCOPY);
+    GdiFlush();
+    std::vector<COLORREF> out(static_cast<const DWORD *>(bits),
+                              static_cast<const DWORD *>(bits) + (r.right - r.left) * (r.bottom - r.top));
+    SelectObject(memory, old);
+    DeleteObject(bitmap);
+    DeleteDC(memory);
+    ReleaseDC(window, dc);
+    return out;
+}
+
+std::function<void()> atPress;
+WNDPROC hostProc = nullptr;
+LRESULT CALLBACK PressWatcher(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == kPressMessage && atPress) atPress();
+    return CallWindowProcA(hostProc, window, message, wParam, lParam);
+}
+
+// When the host hears of a press, the button already shows its pressed look
+// in the window: painted, not only invalidated.
+TEST_F(InputTest, ThePressedLookIsShownBeforeTheHostHearsThePress) {
+    HWND pane = Make({1, 2, 3});
+    const RECT r = ItemRect(pane, 1);
+    Look(pane, 1); // everything painted
+    const std::vector<COLORREF> up = Shown(Active(pane), r);
+    QBR_SetButtonPressed(manager, 2, 1);
+    Look(pane, 1);
+    const std::vector<COLORREF> down = Shown(Active(pane), r);
+    QBR_SetButtonPressed(manager, 2, 0);
+    Look(pane, 1);
+    ASSERT_NE(up, down);
+    std::vector<COLORREF> heard;
+    atPress = [&] { heard = Shown(Active(pane), r); };
+    hostProc = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PressWatcher)));
+    Down(Button(pane, 1));
+    SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(hostProc));
+    atPress = nullptr;
+    Up(Button(pane, 1));
+    EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
+    EXPECT_TRUE(heard == down) << (heard == up ? "the host heard the press before the look was shown" : "no look read");
 }
 
 } // namespace

@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "core/core.h"
@@ -628,6 +629,250 @@ TEST(PaintLifetime, StartsAndEndsLeaveNothingBehind) {
         EXPECT_EQ(gdi, LiveGdiObjects()) << "round " << round;
         EXPECT_EQ(blocks, LiveMemoryBlocks()) << "round " << round;
     }
+}
+
+// ---- Exact places and colours of the moment -------------------------------------------
+
+// Changes system colours for the length of a scope, and puts them back.
+class SchemeChange {
+  public:
+    SchemeChange(std::vector<int> elements, std::vector<COLORREF> colours) : elements_(std::move(elements)) {
+        for (int e : elements_)
+            saved_.push_back(GetSysColor(e));
+        ok_ = SetSysColors(static_cast<int>(elements_.size()), elements_.data(), colours.data()) != 0;
+        Pump();
+    }
+    ~SchemeChange() {
+        SetSysColors(static_cast<int>(elements_.size()), elements_.data(), saved_.data());
+        Pump();
+    }
+    bool Ok() const { return ok_; }
+
+  private:
+    std::vector<int> elements_;
+    std::vector<COLORREF> saved_;
+    bool ok_ = false;
+};
+
+// Button texts a test chooses; an empty one is no label.
+std::string labelText;
+int CALLBACK LabelText(UINT, UINT kind, LPSTR buffer, int size) {
+    if (kind != HELP_BUTTON_TEXT) return 0;
+    lstrcpynA(buffer, labelText.c_str(), size);
+    return lstrlenA(buffer);
+}
+
+// The label's place, to the pixel: x + ((w - width - 1) >> 1) and
+// y + h - height - 3 inside the frame ring, one further down right when
+// pressed. The same button painted without a label, and the text drawn by hand
+// at that place, give the same pixels. Widths of both parities are among the
+// texts, so that half a pixel of centring shows; the last one overhangs.
+TEST_F(PaintTest, TheLabelStandsExactlyWhereItsFormulaPutsIt) {
+    QBR_SetButtonText(1);
+    CurrentClient()->helpTextProc = LabelText;
+    int bw = 0, bh = 0;
+    GetButtonSizes(&bw, &bh, nullptr, nullptr);
+    const int w = bw - 2, h = bh - 2;
+    Canvas painted(bw + 4, bh + 4), expected(bw + 4, bh + 4);
+    const COLORREF ink = RGB(200, 0, 100);
+    bool parity[2] = {false, false};
+    for (const char *text : {"B7", "Open", "Save all", "i", "WW", "Mm", "A label much wider than its button"}) {
+        const int length = lstrlenA(text);
+        SIZE extent = {};
+        {
+            SelectScope font(expected.Dc(), buttonFont);
+            GetTextExtentPointA(expected.Dc(), text, length, &extent);
+        }
+        parity[(w - extent.cx) & 1] = true;
+        for (int pressed = 0; pressed < 2; ++pressed) {
+            SetBits(7, pressed ? BS_PRESSED : 0);
+            labelText = text;
+            painted.Clear();
+            SetTextColor(painted.Dc(), ink);
+            PaintOne(painted, 7, 0, 0);
+            labelText.clear();
+            expected.Clear();
+            PaintOne(expected, 7, 0, 0);
+            {
+                SelectScope font(expected.Dc(), buttonFont);
+                const int oldMode = SetBkMode(expected.Dc(), TRANSPARENT);
+                SetTextColor(expected.Dc(), ink);
+                ExtTextOutA(expected.Dc(), 1 + pressed + ((w - extent.cx - 1) >> 1), 1 + pressed + h - extent.cy - 3, 0,
+                            nullptr, text, static_cast<UINT>(length), nullptr);
+                SetBkMode(expected.Dc(), oldMode);
+            }
+            EXPECT_TRUE(painted.All() == expected.All()) << text << (pressed ? ", pressed" : "");
+        }
+    }
+    EXPECT_TRUE(parity[0] && parity[1]) << "the texts should have widths of both parities";
+    QBR_SetButtonText(0);
+}
+
+// A key is a whole colour-table entry, its reserved byte included: light grey
+// with a reserved byte of 1 (spare column 68) stays light grey, while the light
+// grey key becomes the face colour (an unusual one, so that the two differ on
+// every scheme).
+TEST_F(PaintTest, AnEntryWithAReservedByteIsNoKey) {
+    SchemeChange scheme({COLOR_BTNFACE}, {RGB(70, 80, 90)});
+    ASSERT_TRUE(scheme.Ok());
+    HBITMAP strip = LoadImageStrip(GetModuleHandleA(nullptr), TestStrip());
+    ASSERT_NE(nullptr, strip);
+    const BitmapPixels px(strip);
+    EXPECT_EQ(Hex(RGB(70, 80, 90)), Hex(px.At(0, 0))) << "the light grey key";
+    for (int y = 0; y < px.height; ++y)
+        EXPECT_EQ(Hex(RGB(192, 192, 192)), Hex(px.At(68, y))) << "row " << y;
+    GdiDelete(strip);
+}
+
+// The surface reads the face colour at every paint; the buttons keep the
+// colours of the library's start.
+TEST_F(SurfaceTest, TheSurfaceTakesTheFaceColourOfEachPaint) {
+    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
+    const COLORREF now = RGB(70, 80, 90);
+    SchemeChange scheme({COLOR_BTNFACE}, {now});
+    ASSERT_TRUE(scheme.Ok());
+    InvalidateRect(pane, nullptr, TRUE);
+    const Pixels px = ReadWindowPixels(pane);
+    EXPECT_EQ(Hex(now), Hex(px.At(2, 1)));
+    EXPECT_EQ(Hex(now), Hex(px.At(px.width - 2, px.height - 2)));
+    EXPECT_EQ(Hex(colors.face), Hex(px.At(kAreaLeft + 2, kPaneAreaTop + 10))) << "a button's face";
+}
+
+// The title, to the pixel: in the caption font and colour, from
+// x = (client width + 1 - text width) >> 1 (centred over the band and the line's
+// right side beyond it) and y = -1, under the close box. A frame with the title,
+// and a frame of the same size without one with the text drawn by hand and the
+// box over it again, show the same band. Widths of both parities are among the
+// titles, so that half a pixel of centring shows.
+TEST_F(SurfaceTest, TheTitleStandsCentredOnePixelAboveTheClientArea) {
+    HWND blank = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING, ""), ROLE_FLOATING);
+    ASSERT_TRUE(IsWindowVisible(blank));
+    RECT client;
+    GetClientRect(blank, &client);
+    const int ch = captionHeight;
+    Canvas painted(client.right + 2, ch + 4), expected(client.right + 2, ch + 4);
+    bool parity[2] = {false, false};
+    for (const char *title : {"Tools", "Edit", "Format", "ii", "W", "Ab"}) {
+        HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING, title), ROLE_FLOATING);
+        ASSERT_EQ(client, ClientRectOf(frame)) << title;
+        painted.Clear();
+        PaintFloatingCaption(frame, painted.Dc());
+        expected.Clear();
+        PaintFloatingCaption(blank, expected.Dc());
+        const int length = lstrlenA(title);
+        {
+            SelectScope font(expected.Dc(), captionFont);
+            SIZE extent = {};
+            GetTextExtentPointA(expected.Dc(), title, length, &extent);
+            parity[(client.right + 1 - extent.cx) & 1] = true;
+            const int oldMode = SetBkMode(expected.Dc(), TRANSPARENT);
+            SetTextColor(expected.Dc(), GetSysColor(COLOR_CAPTIONTEXT));
+            ExtTextOutA(expected.Dc(), (client.right + 1 - extent.cx) >> 1, -1, 0, nullptr, title,
+                        static_cast<UINT>(length), nullptr);
+            SetBkMode(expected.Dc(), oldMode);
+        }
+        PaintCloseBox(blank, expected.Dc());
+        EXPECT_TRUE(painted.All() == expected.All()) << title;
+        QBR_DestroyToolbar(ResolveRoleWindow(frame, ROLE_DOCKED));
+    }
+    EXPECT_TRUE(parity[0] && parity[1]) << "the titles should have widths of both parities";
+}
+
+// The close box gets its dash from a band of 5 pixels on: its black outline
+// has its top left pixel at (2, ((height - 1) >> 1) - 1); below 5 the box is
+// edge and face only, with no pixel of a dash however small.
+TEST_F(SurfaceTest, TheCloseBoxDashNeedsABandOfFivePixels) {
+    HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
+    const int saved = captionHeight;
+    const struct {
+        int height;
+        bool dash;
+    } cases[] = {{3, false}, {4, false}, {5, true}, {6, true}, {9, true}};
+    for (const auto &k : cases) {
+        captionHeight = k.height;
+        Canvas canvas(16, 16);
+        PaintCloseBox(frame, canvas.Dc());
+        int black = 0;
+        for (int y = 0; y < k.height; ++y)
+            for (int x = 0; x <= k.height; ++x)
+                black += canvas.At(x, y) == kBlack;
+        const int t = (k.height - 1) >> 1;
+        EXPECT_EQ(Hex(k.dash ? kBlack : colors.face), Hex(canvas.At(2, t - 1))) << "band " << k.height;
+        EXPECT_EQ(k.dash, black > 0) << "band " << k.height;
+        if (!k.dash) { // the inside of the box is face, every pixel of it
+            int face = 0;
+            for (int y = 0; y < k.height - 1; ++y)
+                for (int x = 0; x < k.height; ++x)
+                    face += canvas.At(x, y) == colors.face;
+            EXPECT_EQ(k.height * (k.height - 1), face) << "band " << k.height;
+        }
+        EXPECT_EQ(Hex(line), Hex(canvas.At(k.height, 0))) << "band " << k.height << ": right edge";
+    }
+    captionHeight = saved;
+}
+
+// The relief of a raised and of a sunken button, pixel by pixel: f frame ring,
+// H light edge, S dark edge, F face, '.' corner left alone, '?' the image.
+// Raised: one light pixel left and top, two dark ones right and bottom.
+// Sunken: one dark pixel left and top, and the image one pixel further in.
+TEST_F(PaintTest, RaisedAndSunkenEdgesToThePixel) {
+    std::vector<std::string> raised = {".ffffffffffffffffffffff.", "fHHHHHHHHHHHHHHHHHHHHHSf",
+                                       "fHFFFFFFFFFFFFFFFFFFFSSf"};
+    for (int y = 3; y <= 17; ++y)
+        raised.push_back("fHF????????????????FFSSf");
+    raised.push_back("fHFFFFFFFFFFFFFFFFFFFSSf");
+    raised.push_back("fHSSSSSSSSSSSSSSSSSSSSSf");
+    raised.push_back("fSSSSSSSSSSSSSSSSSSSSSSf");
+    raised.push_back(".ffffffffffffffffffffff.");
+    std::vector<std::string> sunken = {".ffffffffffffffffffffff.", "fSSSSSSSSSSSSSSSSSSSSSSf",
+                                       "fSFFFFFFFFFFFFFFFFFFFFFf", "fSFFFFFFFFFFFFFFFFFFFFFf"};
+    for (int y = 4; y <= 18; ++y)
+        sunken.push_back("fSFF????????????????FFFf");
+    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
+    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
+    sunken.push_back(".ffffffffffffffffffffff.");
+    Canvas canvas(24, 22);
+    for (int pressed = 0; pressed < 2; ++pressed) {
+        const std::vector<std::string> &picture = pressed ? sunken : raised;
+        ASSERT_EQ(22u, picture.size());
+        SetBits(4, pressed ? BS_PRESSED : 0);
+        canvas.Clear();
+        PaintOne(canvas, 4, 0, 0);
+        for (int y = 0; y < 22; ++y) {
+            ASSERT_EQ(24u, picture[y].size()) << y;
+            for (int x = 0; x < 24; ++x) {
+                const char c = picture[y][x];
+                if (c == '?') continue;
+                const COLORREF want = c == 'f'   ? colors.frame
+                                      : c == 'H' ? colors.highlight
+                                      : c == 'S' ? colors.shadow
+                                      : c == 'F' ? colors.face
+                                                 : kUntouched;
+                EXPECT_EQ(Hex(want), Hex(canvas.At(x, y))) << (pressed ? "sunken" : "raised") << " at " << x << "," << y;
+            }
+        }
+    }
+}
+
+// In text mode the image stands 5 pixels below the frame ring's inside (6 when
+// pressed): the red square of the test cell (1..2, 1..2) starts at row 7.
+TEST_F(PaintTest, TextModeImageStandsFivePixelsDown) {
+    QBR_SetButtonText(1);
+    int bw = 0, bh = 0;
+    GetButtonSizes(&bw, &bh, nullptr, nullptr);
+    Canvas canvas(bw, bh);
+    const int imageX = 1 + ((bw - 2 - kCellW - 1) >> 1);
+    for (int pressed = 0; pressed < 2; ++pressed) {
+        SetBits(7, pressed ? BS_PRESSED : 0);
+        canvas.Clear();
+        PaintOne(canvas, 7, 0, 0);
+        const int top = 1 + 5 + pressed;
+        for (int y = top - 1; y <= top + 3; ++y) {
+            const bool red = y >= top + 1 && y <= top + 2;
+            EXPECT_EQ(red, canvas.At(imageX + pressed + 1, y) == kRed) << "row " << y << (pressed ? ", pressed" : "");
+        }
+    }
+    QBR_SetButtonText(0);
 }
 
 } // namespace

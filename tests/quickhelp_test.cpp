@@ -22,10 +22,12 @@ constexpr COLORREF kTipYellow = 0x0080FFFF;
 // Quick help texts the tests choose per id; an id missing here has none.
 std::map<UINT, std::string> texts;
 std::vector<UINT> asked; // ids of every HELP_QUICK request
+std::vector<DWORD> askedAt; // GetTickCount at each of them
 
 int CALLBACK QuickTexts(UINT id, UINT kind, LPSTR buffer, int size) {
     if (kind != HELP_QUICK) return 0;
     asked.push_back(id);
+    askedAt.push_back(GetTickCount());
     auto found = texts.find(id);
     if (found == texts.end()) return 0;
     lstrcpynA(buffer, found->second.c_str(), size);
@@ -75,6 +77,7 @@ class QuickHelpTest : public FrameTest {
         CurrentClient()->helpTextProc = QuickTexts;
         texts = {{1, "Q1"}, {2, "Open a file"}, {4, "Save everything you have"}, {5, "Q5"}};
         asked.clear();
+        askedAt.clear();
         AddButtons(1, 6);
         const UINT docked[] = {1, 2, 0, 3}, floating[] = {4, 5};
         pane = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, MakeDock(DOCK_TOP), docked, 4);
@@ -338,6 +341,121 @@ TEST_F(QuickHelpTest, TipForgetsADestroyedManagersItemsAndFreesItsObjects) {
     EXPECT_FALSE(IsWindowVisible(help));
     ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
     EXPECT_NE(nullptr, helpFont);
+}
+
+// The period, read from the poll itself: over a button without a text the
+// timer keeps running and asks for the text once at every tick. A tick never
+// comes before its time: tick n is at least n periods after the move that set
+// the timer, less 16 ms (GetTickCount advances in steps of up to 15.6 ms on
+// Windows). Load only delays ticks, so the upper bound is on the mean over
+// eight of them: a poll of 300 ms or more can never reach it, and eight ticks
+// would have to be late by 400 ms for a 200 ms poll to miss it.
+TEST_F(QuickHelpTest, ThePollTicksEveryTwoHundredMilliseconds) {
+    const POINT p = At(pane, 3); // button 3 has no text
+    appActive = 0;
+    MoveCursor(p.x, p.y);
+    appActive = 1;
+    asked.clear();
+    askedAt.clear();
+    const DWORD start = GetTickCount();
+    SendMessageA(ResolveRoleWindow(pane, ROLE_ACTIVE), WM_MOUSEMOVE, 0, 0);
+    ASSERT_NE(0u, helpTimer);
+    ASSERT_TRUE(PumpUntil([&] { return askedAt.size() >= 8; })) << askedAt.size() << " ticks";
+    EXPECT_FALSE(Shown());
+    for (size_t n = 0; n < 8; ++n) {
+        EXPECT_EQ(3u, asked[n]);
+        EXPECT_GE(static_cast<long>(askedAt[n] - start), static_cast<long>(200 * (n + 1)) - 16) << "tick " << n;
+    }
+    EXPECT_LT((askedAt[7] - start) / 8, 250u) << "mean period over eight ticks";
+}
+
+// While no tip shows, every move over the button starts the wait again: the
+// tip comes one period after the last move. Nothing is pumped between the
+// moves, so no tick of an earlier wait can run in between; were the wait not
+// restarted, the first pump after the last move would find the first timer due.
+// The button is the one whose tip showed last (a hidden tip keeps its item),
+// so that only the rule of the hidden tip restarts the wait, not a change of item.
+TEST_F(QuickHelpTest, EveryMoveWhileWaitingStartsTheWaitAgain) {
+    HWND window = ResolveRoleWindow(pane, ROLE_ACTIVE);
+    ShowTip(pane, 0);
+    Leave();
+    ASSERT_EQ(Item(1), helpItem);
+    Hover(pane, At(pane, 0));
+    DWORD last = GetTickCount();
+    for (int move = 0; move < 3; ++move) {
+        Sleep(120);
+        last = GetTickCount();
+        SendMessageA(window, WM_MOUSEMOVE, 0, 0);
+    }
+    EXPECT_FALSE(Shown());
+    ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
+    // Less 16 ms: the step of GetTickCount on Windows.
+    EXPECT_GE(static_cast<long>(GetTickCount() - last), 200L - 16);
+}
+
+// A right press stops the poll like a left one. Customising is off, so that
+// the press over a button starts no item drag.
+TEST_F(QuickHelpTest, ARightPressStopsThePoll) {
+    QBR_SetCustomize(0);
+    ShowTip(pane, 0);
+    SendButton(MOUSEEVENTF_RIGHTDOWN);
+    EXPECT_TRUE(PumpUntil([&] { return !Shown() && helpTimer == 0; }));
+    SendButton(MOUSEEVENTF_RIGHTUP);
+    Pump();
+    EXPECT_FALSE(Shown());
+}
+
+// While the tip shows on one button, the poll leaves it alone: no hide, no
+// new text request, no repaint.
+TEST_F(QuickHelpTest, ATipOnTheSameButtonIsLeftAlone) {
+    ShowTip(pane, 1);
+    asked.clear();
+    bool hidden = false;
+    observe = [&] { hidden |= !Shown(); };
+    PumpFor(700); // three polls and more
+    observe = nullptr;
+    EXPECT_FALSE(hidden);
+    EXPECT_TRUE(Shown());
+    EXPECT_TRUE(asked.empty()) << asked.size() << " requests";
+}
+
+// The tip's font is 8 points of "MS Sans Serif", variable pitch, Swiss; its
+// client area is the light yellow ground with the text drawn from (2, 1) in
+// that font, black: drawn again by hand on the tip itself, the same pixels.
+TEST_F(QuickHelpTest, TheTipIsItsTextAtTwoOneInMsSansSerif) {
+    LOGFONTA font = {};
+    ASSERT_EQ(static_cast<int>(sizeof(font)), GetObjectA(helpFont, sizeof(font), &font));
+    EXPECT_STREQ("MS Sans Serif", font.lfFaceName);
+    {
+        ScreenDC screen;
+        EXPECT_EQ(-MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72), font.lfHeight);
+    }
+    EXPECT_EQ(400, font.lfWeight);
+    EXPECT_EQ(VARIABLE_PITCH | FF_SWISS, font.lfPitchAndFamily);
+
+    ShowTip(pane, 1);
+    const Pixels tip = ReadWindowPixels(Help());
+    const char text[] = "Open a file";
+    {
+        WindowDC dc(Help());
+        RECT client;
+        GetClientRect(Help(), &client);
+        SolidBrush ground(kTipYellow);
+        FillRect(dc, &client, ground);
+        SelectScope select(dc, helpFont);
+        SetBkMode(dc, TRANSPARENT);
+        SetTextColor(dc, RGB(0, 0, 0));
+        ExtTextOutA(dc, 2, 1, 0, nullptr, text, lstrlenA(text), nullptr);
+    }
+    const Pixels drawn = ReadWindowPixels(Help());
+    ASSERT_EQ(drawn.width, tip.width);
+    ASSERT_EQ(drawn.height, tip.height);
+    int differ = 0;
+    for (int y = 0; y < tip.height; ++y)
+        for (int x = 0; x < tip.width; ++x)
+            differ += tip.At(x, y) != drawn.At(x, y);
+    EXPECT_EQ(0, differ);
+    InvalidateRect(Help(), nullptr, FALSE);
 }
 
 } // namespace

@@ -13,6 +13,9 @@ truncate. Every cell, in cell coordinates from the top left:
     (4..11, 10)     white (key colour of the light edge)
     (4..11, 11)     grey (key colour of the dark edge)
     (n, 13)         pure blue in cell n: tells the cells apart
+
+Spare column 68 is light grey with a non-zero reserved byte in its colour-table
+entry: no key colour, since a key is the whole entry.
 """
 import struct
 import sys
@@ -25,6 +28,10 @@ PALETTE = [
     (0x00, 0x00, 0xFF), (0xFF, 0x00, 0xFF), (0x00, 0xFF, 0xFF), (0xFF, 0xFF, 0xFF),
 ]
 BLACK, DARK_GREEN, LIGHT_GREY, GREY, RED, BLUE, WHITE = 0, 2, 7, 8, 9, 12, 15
+# Entry 13 (unused magenta) becomes light grey with reserved byte 1.
+MARKED_GREY = 13
+RESERVED = {MARKED_GREY: 1}
+PALETTE[MARKED_GREY] = PALETTE[LIGHT_GREY]
 
 CELL_W, CELL_H = 16, 15
 COLUMNS, ROWS = 4, 2
@@ -47,6 +54,8 @@ def cell_pixel(n, x, y):
 
 
 def pixel(x, y):
+    if x == COLUMNS * CELL_W + 4:
+        return MARKED_GREY
     if x >= COLUMNS * CELL_W:
         return DARK_GREEN
     column, row = x // CELL_W, y // CELL_H
@@ -63,7 +72,7 @@ def main():
         packed = bytes((values[i] << 4) | values[i + 1] for i in range(0, WIDTH, 2))
         rows.append(packed.ljust(stride, b"\0"))
     bits = b"".join(rows)
-    table = b"".join(struct.pack("<BBBB", b, g, r, 0) for (r, g, b) in PALETTE)
+    table = b"".join(struct.pack("<BBBB", b, g, r, RESERVED.get(i, 0)) for i, (r, g, b) in enumerate(PALETTE))
     info = struct.pack("<IiiHHIIiiII", 40, WIDTH, HEIGHT, 1, 4, 0, len(bits), 0, 0, 0, 0)
     offset = 14 + len(info) + len(table)
     header = struct.pack("<2sIHHI", b"BM", offset + len(bits), 0, 0, offset)
