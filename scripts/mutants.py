@@ -208,7 +208,10 @@ def main():
     open(log, "w").close()
     print("scratch copy: %s (log: %s)" % (scratch, log))
     # The scratch copy follows the working tree, uncommitted changes included.
-    subprocess.check_call(["rsync", "-a", "--delete", "--exclude", ".git", "--exclude", "/build*",
+    # Files are compared by content and a changed one gets the time of the
+    # copy, not its own: an edit older than the scratch build's objects must
+    # still be rebuilt.
+    subprocess.check_call(["rsync", "-rlpc", "--delete", "--exclude", ".git", "--exclude", "/build*",
                            HERE + "/", src + "/"])
     if run(["cmake", "-S", src, "-B", build, "-DQBR_BUILD_BENCH=OFF"], 600, log) != 0:
         sys.exit("configure failed, see %s" % log)

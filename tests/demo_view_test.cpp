@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "core/core.h"
 #include "harness.h"
 #include "modal.h"
 #include "quaybar.h"
@@ -660,6 +661,125 @@ TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
         SendMessageA(f.window, WM_COMMAND, kToolbarsMenuBase + 1, 0); // Style back
         expectEdit("one toolbar docked again");
         EXPECT_TRUE(IsWindowVisible(top));
+    }
+}
+
+// The default toolbars of both kinds of frame, in the order they are made,
+// with their flags and items; the floating ones at their places, "Palette"
+// 100 pixels wide and so wrapped into its four groups of three.
+TEST_F(DemoViewTest, DefaultToolbarsOfBothFramesStandAsTabled) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    const std::vector<UINT> standard = {101, 102, 104, 0, 107, 108, 109, 0, 106, 151};
+    const std::vector<UINT> style = {301, 302, 303, 0, 304, 305, 306, 307};
+    const std::vector<UINT> align = {401, 402, 403, 404};
+    const std::vector<UINT> palette = {201, 202, 203, 0, 204, 205, 206, 0, 207, 208, 209, 0, 210, 211, 212};
+    constexpr UINT kDocked = TBF_VISIBLE | TBF_DOCKED, kFloating = TBF_VISIBLE | TBF_FLOATING;
+    struct Bar {
+        const char *title;
+        UINT flags;
+        std::vector<UINT> ids;
+        POINT frame;     // floating: the frame's top left on the screen
+        SIZE itemArea;   // floating: its item area
+    };
+    struct Frame {
+        const char *what;
+        ToolbarManager *manager;
+        std::vector<Bar> bars;
+    } const frames[] = {
+        {"main window",
+         mainManager,
+         {{"Standard", kDocked, standard, {}, {}},
+          {"Style", kDocked, style, {}, {}},
+          {"Align", kFloating, align, {300, 100}, {24 + 3 * 23, 22}},
+          {"Palette", kFloating, palette, {300, 200}, {24 + 2 * 23, 4 * 22}}}},
+        {"view window", ManagerOfView(view), {{"Standard", kDocked, standard, {}, {}}, {"Style", kDocked, style, {}, {}}}},
+    };
+    for (const Frame &f : frames) {
+        SCOPED_TRACE(f.what);
+        ASSERT_EQ(f.bars.size(), QBR_GetToolbarCount(f.manager));
+        for (UINT i = 0; i < f.bars.size(); ++i) {
+            const Bar &b = f.bars[i];
+            SCOPED_TRACE(b.title);
+            HWND pane = QBR_GetToolbar(f.manager, i);
+            char title[64] = "";
+            QBR_GetToolbarTitle(pane, title, sizeof title);
+            EXPECT_STREQ(b.title, title);
+            EXPECT_EQ(b.flags, QBR_GetToolbarFlags(pane));
+            EXPECT_EQ(b.ids, ToolbarIds(pane));
+            EXPECT_EQ(QBR_GetDock(f.manager, DOCK_TOP), QBR_GetToolbarDock(pane)) << "all in the one top dock";
+            if (b.flags != kFloating) continue;
+            RECT frame, area;
+            GetWindowRect(ResolveRoleWindow(pane, ROLE_FLOATING), &frame);
+            GetItemArea(pane, ROLE_FLOATING, &area);
+            EXPECT_EQ(b.frame.x, frame.left);
+            EXPECT_EQ(b.frame.y, frame.top);
+            EXPECT_EQ(b.itemArea.cx, area.right - area.left);
+            EXPECT_EQ(b.itemArea.cy, area.bottom - area.top);
+        }
+    }
+}
+
+// Each frame's catalog and the categories of its items: the main window's 31
+// buttons and the separator in six categories, Cut in none; a view's 15
+// buttons and the separator in none.
+TEST_F(DemoViewTest, CatalogsAndCategoriesOfBothFrames) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    ToolbarManager *viewManager = ManagerOfView(view);
+    ASSERT_NE(viewManager, nullptr);
+    EXPECT_EQ(32u, PointerListCount(mainManager->items));
+    EXPECT_EQ(16u, PointerListCount(viewManager->items));
+    const struct {
+        UINT category;
+        std::vector<UINT> ids;
+    } categories[] = {
+        {3001, {101, 102, 104, 106}},
+        {3002, {108, 109}},
+        {3003, {201, 202, 203, 204, 205, 206, 207, 208, 209, 210, 211, 212}},
+        {3004, {301, 302, 303, 304, 305, 306, 307}},
+        {3005, {401, 402, 403, 404}},
+        {3006, {151}},
+        {0, {107}},
+    };
+    for (const auto &c : categories) {
+        for (UINT id : c.ids) {
+            SCOPED_TRACE(id);
+            UINT category = 99;
+            EXPECT_EQ(1u, ItemGetCategory(ItemFindById(mainManager->items, id), &category));
+            EXPECT_EQ(c.category, category);
+            if (ToolbarItem *item = ItemFindById(viewManager->items, id)) {
+                category = 99;
+                EXPECT_EQ(1u, ItemGetCategory(item, &category));
+                EXPECT_EQ(0u, category) << "a view sets no categories";
+            }
+        }
+    }
+}
+
+// The texts the program serves the library, by kind: the description under
+// the id, quick help under id + 1000, the label under id + 2000, a category's
+// name under its own id; no text for an unknown kind or a missing string.
+TEST_F(DemoViewTest, HelpTextsComeFromTheStringTableByKind) {
+    struct Case {
+        UINT id, kind;
+        const char *text; // nullptr: none
+    } const cases[] = {
+        {201, HELP_DESCRIPTION, "Select the eraser tool"},
+        {201, HELP_QUICK, "Eraser"},
+        {201, HELP_BUTTON_TEXT, "Erase"},
+        {3003, HELP_CATEGORY, "Palette"},
+        {307, HELP_QUICK, "Justified"},
+        {307, HELP_BUTTON_TEXT, "Justify"},
+        {103, HELP_QUICK, nullptr},
+        {201, 4, nullptr},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(std::to_string(c.id) + " kind " + std::to_string(c.kind));
+        char text[128] = "";
+        const int length = DemoHelpText(c.id, c.kind, text, sizeof text);
+        EXPECT_EQ(c.text ? static_cast<int>(std::string(c.text).size()) : 0, length);
+        if (c.text) EXPECT_STREQ(c.text, text);
     }
 }
 
