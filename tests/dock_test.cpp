@@ -350,6 +350,8 @@ TEST_F(DockPackTest, DockInsertionIndexForPointsAroundThePanes) {
         {"inside T2", r2.left + 5, r2.top + 5, 1},
         {"inside T3", r3.left + 5, r3.top + 5, 2},
         {"right of the last pane of the first row", limit - 2, r1.top + 5, wrapped ? 2u : 3u},
+        {"right of the first row, one line above the second", limit - 2, r3.top - 1, 2},
+        {"right of the first row, on the second row's top line", limit - 2, r3.top, 3},
         {"below everything", 5, r3.bottom + 20, 3},
         {"above all panes", 5, -5, 0},
     };

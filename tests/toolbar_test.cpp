@@ -544,6 +544,50 @@ TEST_F(ToolbarTest, AnUnchangedDockRelayoutPaintsNoPane) {
     SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(originalProc));
 }
 
+// The windows a test watches, and what each received: WM_WINDOWPOSCHANGING
+// comes with every SetWindowPos, whether it changes anything or not.
+std::map<HWND, int> placings;
+std::map<HWND, WNDPROC> watchedProcs;
+LRESULT CALLBACK PlacingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
+    if (m == WM_WINDOWPOSCHANGING) ++placings[w];
+    return CallWindowProcA(watchedProcs[w], w, m, wp, lp);
+}
+void WatchPlacings(HWND w) {
+    watchedProcs[w] = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(w, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PlacingProc)));
+}
+void UnwatchPlacings() {
+    for (auto &watched : watchedProcs)
+        SetWindowLongPtrA(watched.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(watched.second));
+    watchedProcs.clear();
+    placings.clear();
+}
+
+// A refit or a packing that changes nothing places no window at all, on
+// either window of a docked or a floating toolbar.
+TEST_F(ToolbarTest, RefitsAndPackingsThatChangeNothingPlaceNoWindow) {
+    HWND docked = Make({1, 2, 3, S, 4});
+    HWND floating = Make({5, 6, 7}, TBF_VISIBLE | TBF_FLOATING, nullptr, 200, 200);
+    for (HWND pane : {docked, floating}) {
+        WatchPlacings(pane);
+        WatchPlacings(ResolveRoleWindow(pane, ROLE_FLOATING));
+    }
+    for (HWND pane : {docked, floating})
+        EXPECT_EQ(1u, RefitToolbar(pane, ROLE_BOTH));
+    EXPECT_EQ(1u, RelayoutDock(top));
+    Pump();
+    for (HWND pane : {docked, floating}) {
+        EXPECT_EQ(0, placings[pane]) << (pane == docked ? "docked" : "floating") << " pane";
+        EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)]) << (pane == docked ? "docked" : "floating")
+                                                                       << " frame";
+    }
+    // A real change places the windows it changes.
+    ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
+    Pump();
+    EXPECT_GT(placings[docked], 0);
+    EXPECT_GT(placings[ResolveRoleWindow(docked, ROLE_FLOATING)], 0);
+    UnwatchPlacings();
+}
+
 // What reaches a subclassed floating frame as WM_SETTEXT.
 std::vector<Heard> textsHeard;
 WNDPROC textFrameProc = nullptr;
