@@ -270,16 +270,20 @@ TEST_F(CustomizeTest, DeleteAsksAndOnlyYesDeletes) {
     for (const Case c : {Case{IDNO, false}, Case{IDYES, true}}) {
         SCOPED_TRACE(c.answer);
         std::string caption, messageBoxText;
+        std::vector<int> buttons; // the answers the box offers
         ModalSteps::Add([] { ClickMenuEntry(OpenMenu(), "Delete Toolbar..."); });
         ModalSteps::Add([&] {
             HWND box = FindWindowA("#32770", "Toolbar");
             ASSERT_NE(nullptr, box);
             caption = TextOf(box);
             messageBoxText = ChildTexts(box);
+            for (int id : {IDOK, IDCANCEL, IDYES, IDNO})
+                if (GetDlgItem(box, id)) buttons.push_back(id);
             PostMessageA(box, WM_COMMAND, c.answer, 0);
         });
         RunMenu(FrameOf(gamma)); // the press was on the floating frame; the pane owns the menu
         EXPECT_EQ("Toolbar", caption);
+        EXPECT_EQ((std::vector<int>{IDYES, IDNO}), buttons);
         EXPECT_NE(std::string::npos, messageBoxText.find("|Delete the Gamma toolbar?|")) << messageBoxText;
         EXPECT_EQ(c.gone, !IsWindow(gamma));
         EXPECT_EQ(before - (c.gone ? 1 : 0), static_cast<int>(QBR_GetToolbarCount(manager)));

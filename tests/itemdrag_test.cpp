@@ -155,6 +155,9 @@ const Gesture kGestures[] = {
     {"last one into empty",  {1}, kDocked, {}, kDocked, {'A', kOnItem, 1}, {'B', kOnToolbar}, 0, 0, {}, {1}},
     {"onto floating frame",  A0, kDocked, B0, kFloating, {'A', kOnItem, 2}, {'B', kOnItem, 8}, 0, 0, {1, 3, 4, 5}, {7, 2, 8, 9}},
     {"inside floating frame", A0, kFloating, B0, kDocked, {'A', kOnItem, 1}, {'A', kOnItem, 4}, 0, 0, {2, 3, 1, 4, 5}, B0},
+    {"first onto the second", A0, kDocked, B0, kDocked, {'A', kOnItem, 1}, {'A', kOnItem, 2}, 0, 0, A0, B0},
+    {"second onto the third", A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'A', kOnItem, 3}, 0, 0, A0, B0},
+    {"third onto the first", A0, kDocked, B0, kDocked, {'A', kOnItem, 3}, {'A', kOnItem, 1}, 0, 0, {3, 1, 2, 4, 5}, B0},
     // Off every toolbar.
     {"dock surface removes", A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'B', kDockSurface}, 0, 0, {1, 3, 4, 5}, B0},
     {"frame space removes",  A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'A', kFrameSpace}, 0, 0, {1, 3, 4, 5}, B0},
