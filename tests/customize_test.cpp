@@ -117,8 +117,7 @@ TEST(CustomizeTemplates, InsertAndNewToolbarDialogsAreReadBackAsDesigned) {
          {
              {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 5, 50, 69},
              {5003, "list box", "",
-              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL |
-                  WS_TABSTOP,
+              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL | WS_TABSTOP,
               5, 19, 48, 124},
              {-1, "button", "Description", kShown | BS_GROUPBOX, 62, 4, 123, 37},
              {5005, "static", "", kShown | WS_GROUP, 67, 17, 108, 17},

@@ -549,17 +549,14 @@ TEST_F(DemoViewTest, ButtonsStartWithTheirBehavioursAndStatesInEachFrame) {
     };
     constexpr UINT P = BTN_PUSH, C = BTN_CHECK, L = BTN_LATCH, None = ~0u;
     const Row rows[] = {
-        {101, P, 0, 0, true},        {102, P, 0, 0, true},        {104, P, 0, 0, true},
-        {106, P, 0, 0, true},        {107, P, 0, 0, false},       {108, P, 0, 0, true},
-        {109, P, 0, 0, true},        {151, L, 0, 0, true},        {201, C, 0, None, true},
-        {202, C, 0, None, true},     {203, C, 0, None, true},     {204, C, BS_ON, None, true},
-        {205, C, 0, None, true},     {206, C, 0, None, true},     {207, C, 0, None, true},
-        {208, C, 0, None, true},     {209, C, 0, None, true},     {210, C, 0, None, true},
-        {211, C, 0, None, true},     {212, C, 0, None, true},     {301, C, BS_MIXED, 0, true},
-        {302, C, 0, 0, true},        {303, C, 0, 0, true},        {304, C, BS_ON, BS_ON, true},
-        {305, C, 0, 0, true},        {306, C, 0, 0, true},        {307, C, 0, 0, true},
-        {401, P, 0, None, true},     {402, P, 0, None, true},     {403, P, 0, None, true},
-        {404, P, 0, None, true},
+        {101, P, 0, 0, true},        {102, P, 0, 0, true},    {104, P, 0, 0, true},    {106, P, 0, 0, true},
+        {107, P, 0, 0, false},       {108, P, 0, 0, true},    {109, P, 0, 0, true},    {151, L, 0, 0, true},
+        {201, C, 0, None, true},     {202, C, 0, None, true}, {203, C, 0, None, true}, {204, C, BS_ON, None, true},
+        {205, C, 0, None, true},     {206, C, 0, None, true}, {207, C, 0, None, true}, {208, C, 0, None, true},
+        {209, C, 0, None, true},     {210, C, 0, None, true}, {211, C, 0, None, true}, {212, C, 0, None, true},
+        {301, C, BS_MIXED, 0, true}, {302, C, 0, 0, true},    {303, C, 0, 0, true},    {304, C, BS_ON, BS_ON, true},
+        {305, C, 0, 0, true},        {306, C, 0, 0, true},    {307, C, 0, 0, true},    {401, P, 0, None, true},
+        {402, P, 0, None, true},     {403, P, 0, None, true}, {404, P, 0, None, true},
     };
     for (const Row &r : rows) {
         SCOPED_TRACE(r.id);
@@ -581,8 +578,8 @@ TEST_F(DemoViewTest, PaletteIsOneRadioGroupWithItsMenuChecks) {
         UINT command; // 0: none
         UINT on;
     } const steps[] = {
-        {"at the start", 0, 204},   {"Eraser, the first", 201, 201}, {"Oval, the last", 212, 212},
-        {"Magnify", 209, 209},      {"Magnify again", 209, 209},     {"Pen", 202, 202},
+        {"at the start", 0, 204}, {"Eraser, the first", 201, 201}, {"Oval, the last", 212, 212},
+        {"Magnify", 209, 209},    {"Magnify again", 209, 209},     {"Pen", 202, 202},
     };
     for (const Step &s : steps) {
         SCOPED_TRACE(s.what);
@@ -648,8 +645,7 @@ TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
             // The space the dock takes: its height less the line it shares.
             const int topSpace = IsWindowVisible(top) ? Height(top) - 1 : 0;
             const int statusHeight = Height(f.statusBar);
-            EXPECT_EQ(Rect(-1, topSpace - 1, client.right, client.bottom - statusHeight),
-                      WindowRectInParent(f.edit));
+            EXPECT_EQ(Rect(-1, topSpace - 1, client.right, client.bottom - statusHeight), WindowRectInParent(f.edit));
         };
         expectEdit("both toolbars docked");
         EXPECT_TRUE(IsWindowVisible(top));
@@ -679,8 +675,8 @@ TEST_F(DemoViewTest, DefaultToolbarsOfBothFramesStandAsTabled) {
         const char *title;
         UINT flags;
         std::vector<UINT> ids;
-        POINT frame;     // floating: the frame's top left on the screen
-        SIZE itemArea;   // floating: its item area
+        POINT frame;   // floating: the frame's top left on the screen
+        SIZE itemArea; // floating: its item area
     };
     struct Frame {
         const char *what;
@@ -693,7 +689,9 @@ TEST_F(DemoViewTest, DefaultToolbarsOfBothFramesStandAsTabled) {
           {"Style", kDocked, style, {}, {}},
           {"Align", kFloating, align, {300, 100}, {24 + 3 * 23, 22}},
           {"Palette", kFloating, palette, {300, 200}, {24 + 2 * 23, 4 * 22}}}},
-        {"view window", ManagerOfView(view), {{"Standard", kDocked, standard, {}, {}}, {"Style", kDocked, style, {}, {}}}},
+        {"view window",
+         ManagerOfView(view),
+         {{"Standard", kDocked, standard, {}, {}}, {"Style", kDocked, style, {}, {}}}},
     };
     for (const Frame &f : frames) {
         SCOPED_TRACE(f.what);

@@ -553,7 +553,8 @@ LRESULT CALLBACK PlacingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
     return CallWindowProcA(watchedProcs[w], w, m, wp, lp);
 }
 void WatchPlacings(HWND w) {
-    watchedProcs[w] = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(w, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PlacingProc)));
+    watchedProcs[w] =
+        reinterpret_cast<WNDPROC>(SetWindowLongPtrA(w, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PlacingProc)));
 }
 void UnwatchPlacings() {
     for (auto &watched : watchedProcs)
@@ -577,8 +578,8 @@ TEST_F(ToolbarTest, RefitsAndPackingsThatChangeNothingPlaceNoWindow) {
     Pump();
     for (HWND pane : {docked, floating}) {
         EXPECT_EQ(0, placings[pane]) << (pane == docked ? "docked" : "floating") << " pane";
-        EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)]) << (pane == docked ? "docked" : "floating")
-                                                                       << " frame";
+        EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)])
+            << (pane == docked ? "docked" : "floating") << " frame";
     }
     // A real change places the windows it changes.
     ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
