@@ -103,7 +103,7 @@ constexpr DWORD kModalBox = WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS
 
 // Both customising dialogs, read back from this program's resources, in
 // dialog units: frame, font and every control in order.
-TEST(CustomizeTemplates, InsertAndNewToolbarDialogsAreReadBackAsDesigned) {
+TEST(CustomizeTemplates, InsertAndNewToolbarTemplatesReadBackExactly) {
     struct Dialog {
         const char *name;
         int cx, cy;

@@ -251,7 +251,7 @@ TEST_F(DemoResources, IconAndAboutBoxArePresent) {
 
 // The About box as stored, in dialog units: its frame, its font and every
 // control in order, with its class, text, styles, place and size.
-TEST_F(DemoResources, AboutBoxTemplateIsReadBackAsDesigned) {
+TEST_F(DemoResources, AboutBoxTemplateReadsBackExactly) {
     const DialogLayout about = ReadDialogTemplate(program, "About");
     EXPECT_EQ(static_cast<DWORD>(WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT),
               about.style);

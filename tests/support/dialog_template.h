@@ -1,6 +1,6 @@
 // Reads a dialog resource back as it is stored (a DLGTEMPLATE and its
 // DLGITEMTEMPLATEs), so that tests compare sizes, positions, styles and texts
-// in dialog units with the values the dialog was designed with.
+// in dialog units with the exact values each dialog is meant to have.
 #pragma once
 
 #include <windows.h>
@@ -96,9 +96,8 @@ inline DialogLayout ReadDialogTemplate(HMODULE module, LPCSTR name) {
     layout.y = head->y;
     layout.cx = head->cx;
     layout.cy = head->cy;
-    dialog_template_detail::Reader r{reinterpret_cast<const WORD *>(head + 1)};
-    // DLGTEMPLATE is 18 bytes; the menu, class and title follow at once.
-    r.at = reinterpret_cast<const WORD *>(static_cast<const BYTE *>(start) + 18);
+    // The stored header is 18 bytes; the menu, class and title follow at once.
+    dialog_template_detail::Reader r{reinterpret_cast<const WORD *>(static_cast<const BYTE *>(start) + 18)};
     r.NameOrOrdinal(); // menu
     r.NameOrOrdinal(); // class
     layout.caption = r.Text();
