@@ -8,6 +8,7 @@
 
 #include "core/core.h"
 #include "customize/customize.h"
+#include "dialog_template.h"
 #include "harness.h"
 #include "input/input.h"
 #include "modal.h"
@@ -94,6 +95,67 @@ class CustomizeTest : public FrameTest {
     static HWND InsertDialog() { return FindWindowA("#32770", "Insert Toolbar Item"); }
     HWND top = nullptr, alpha = nullptr, beta = nullptr, gamma = nullptr, untitled = nullptr;
 };
+
+// ---- The dialog templates, as stored ---------------------------------------------------
+
+constexpr DWORD kShown = WS_CHILD | WS_VISIBLE;
+constexpr DWORD kModalBox = WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT;
+
+// Both customising dialogs, read back from this program's resources, in
+// dialog units: frame, font and every control in order.
+TEST(CustomizeTemplates, InsertAndNewToolbarTemplatesReadBackExactly) {
+    struct Dialog {
+        const char *name;
+        int cx, cy;
+        const char *caption;
+        std::vector<DialogControl> controls;
+    } const dialogs[] = {
+        {"QBR_Insert",
+         243,
+         148,
+         "Insert Toolbar Item",
+         {
+             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 5, 50, 69},
+             {5003, "list box", "",
+              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL | WS_TABSTOP,
+              5, 19, 48, 124},
+             {-1, "button", "Description", kShown | BS_GROUPBOX, 62, 4, 123, 37},
+             {5005, "static", "", kShown | WS_GROUP, 67, 17, 108, 17},
+             {1, "button", "Close", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 6, 44, 14},
+             {5007, "button", "&New...", kShown | WS_TABSTOP, 194, 25, 44, 14},
+             {5002, "static",
+              "At any time, items can be moved or removed from a toolbar by dragging with the right mouse "
+              "button.To remove an item simply drag it off the toolbar.",
+              kShown | WS_GROUP, 62, 89, 127, 43},
+             {5001, "static",
+              "Choose a category, then click on an item to see its description. Insert the item by dragging it "
+              "to the toolbar. Note that an item can exist only once on a given toolbar.",
+              kShown | WS_GROUP, 62, 48, 127, 36},
+         }},
+        {"QBR_NewToolbar",
+         197,
+         44,
+         "New Toolbar",
+         {
+             {-1, "static", "&Enter a title for the new toolbar:", kShown | WS_GROUP, 7, 8, 126, 10},
+             {5006, "edit", "", kShown | ES_AUTOHSCROLL | WS_BORDER | WS_TABSTOP, 6, 18, 121, 13},
+             {1, "button", "OK", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP | WS_DISABLED, 145, 6, 44, 14},
+             {2, "button", "Cancel", kShown | WS_TABSTOP, 145, 23, 44, 14},
+         }},
+    };
+    for (const Dialog &d : dialogs) {
+        SCOPED_TRACE(d.name);
+        const DialogLayout layout = ReadDialogTemplate(GetModuleHandleA(nullptr), d.name);
+        EXPECT_EQ(static_cast<DWORD>(kModalBox), layout.style);
+        EXPECT_EQ((std::vector<int>{0, 0, d.cx, d.cy}), (std::vector<int>{layout.x, layout.y, layout.cx, layout.cy}));
+        EXPECT_EQ(d.caption, layout.caption);
+        EXPECT_EQ(8, layout.points);
+        EXPECT_EQ("MS Sans Serif", layout.face);
+        ASSERT_EQ(d.controls.size(), layout.controls.size());
+        for (size_t i = 0; i < d.controls.size(); ++i)
+            EXPECT_EQ(d.controls[i], layout.controls[i]) << "control " << i;
+    }
+}
 
 // ---- The toolbar menu -------------------------------------------------------------
 
@@ -207,16 +269,20 @@ TEST_F(CustomizeTest, DeleteAsksAndOnlyYesDeletes) {
     for (const Case c : {Case{IDNO, false}, Case{IDYES, true}}) {
         SCOPED_TRACE(c.answer);
         std::string caption, messageBoxText;
+        std::vector<int> buttons; // the answers the box offers
         ModalSteps::Add([] { ClickMenuEntry(OpenMenu(), "Delete Toolbar..."); });
         ModalSteps::Add([&] {
             HWND box = FindWindowA("#32770", "Toolbar");
             ASSERT_NE(nullptr, box);
             caption = TextOf(box);
             messageBoxText = ChildTexts(box);
+            for (int id : {IDOK, IDCANCEL, IDYES, IDNO})
+                if (GetDlgItem(box, id)) buttons.push_back(id);
             PostMessageA(box, WM_COMMAND, c.answer, 0);
         });
         RunMenu(FrameOf(gamma)); // the press was on the floating frame; the pane owns the menu
         EXPECT_EQ("Toolbar", caption);
+        EXPECT_EQ((std::vector<int>{IDYES, IDNO}), buttons);
         EXPECT_NE(std::string::npos, messageBoxText.find("|Delete the Gamma toolbar?|")) << messageBoxText;
         EXPECT_EQ(c.gone, !IsWindow(gamma));
         EXPECT_EQ(before - (c.gone ? 1 : 0), static_cast<int>(QBR_GetToolbarCount(manager)));

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "dialog_template.h"
 #include "harness.h"
 #include "quaybar.h"
 
@@ -52,17 +53,49 @@ struct TextRow {
     const char *buttonText; // nullptr: no such string
 };
 
-// One row for each way the texts go: all three, no short texts at all, a
-// label unlike the tip, and the last id of the table. The rule (id, +1000,
-// +2000) is what is checked; the full list lives in the resource script.
+// Every command's texts: the description under its id, the quick help under
+// id + 1000 and the button text under id + 2000; a command without a button
+// has no short texts.
 const TextRow kTexts[] = {
+    {101, "Create a new document", "New", "New"},
+    {102, "Open an existing document", "Open", "Open"},
     {103, "Close the active document", nullptr, nullptr},
+    {104, "Save the active document", "Save", "Save"},
+    {105, "Save the active document with a new name", nullptr, nullptr},
+    {106, "Print the active document", "Print", "Print"},
+    {107, "Cut the selection and put it on the clipboard", "Cut", "Cut"},
+    {108, "Copy the selection and put it on the clipboard", "Copy", "Copy"},
+    {109, "Insert the clipboard contents", "Paste", "Paste"},
+    {110, "Erase the selection", nullptr, nullptr},
+    {151, "Display program information, version number and copyright", "About", "About"},
+    {152, "Exit the application", nullptr, nullptr},
     {201, "Select the eraser tool", "Eraser", "Erase"},
+    {202, "Select the pen tool", "Pen", "Pen"},
+    {203, "Select the selection tool", "Selection", "Select"},
+    {204, "Select the brush tool", "Brush", "Brush"},
+    {205, "Select the spray tool", "Spray", "Spray"},
+    {206, "Select the paint bucket tool", "Paint", "Paint"},
+    {207, "Select the line tool", "Line", "Line"},
+    {208, "Select the eyedrop tool", "EyeDrop", "EyeDrop"},
+    {209, "Select the magnify tool", "Magnify", "Magnify"},
+    {210, "Select the rectangle tool", "Rect", "Rect"},
+    {211, "Select the round rectangle tool", "Round", "Round"},
+    {212, "Select the oval tool", "Oval", "Oval"},
+    {301, "Makes the selection bold", "Bold", "Bold"},
+    {302, "Makes the selection italic", "Italic", "Italic"},
+    {303, "Makes the selection underlined", "Underline", "Underline"},
+    {304, "Aligns the paragraph at the left indent", "Left", "Left"},
     {305, "Centers the paragraph between the indents", "Centered", "Center"},
+    {306, "Aligns the paragraph at the right indent", "Right", "Right"},
+    {307, "Aligns the paragraph at both the left and right indent", "Justified", "Justify"},
+    {401, "Align object towards the top", "Align top", "Top"},
+    {402, "Align object towards the right", "Align right", "Right"},
+    {403, "Align object towards the bottom", "Align bottom", "Bottom"},
     {404, "Align object towards the left", "Align left", "Left"},
 };
 
 TEST_F(DemoResources, EveryCommandHasItsThreeTextsAndCategoriesTheirNames) {
+    ASSERT_EQ(35u, sizeof(kTexts) / sizeof(kTexts[0]));
     for (const TextRow &row : kTexts) {
         SCOPED_TRACE(row.id);
         EXPECT_EQ(String(row.id), row.description);
@@ -214,6 +247,37 @@ TEST_F(DemoResources, IconAndAboutBoxArePresent) {
         EXPECT_GT(std::strlen(text), 0u);
     }
     DestroyWindow(box);
+}
+
+// The About box as stored, in dialog units: its frame, its font and every
+// control in order, with its class, text, styles, place and size.
+TEST_F(DemoResources, AboutBoxTemplateReadsBackExactly) {
+    const DialogLayout about = ReadDialogTemplate(program, "About");
+    EXPECT_EQ(static_cast<DWORD>(WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT),
+              about.style);
+    EXPECT_EQ((std::vector<int>{0, 0, 209, 120}), (std::vector<int>{about.x, about.y, about.cx, about.cy}));
+    EXPECT_EQ("About QBR", about.caption);
+    EXPECT_EQ(8, about.points);
+    EXPECT_EQ("MS Sans Serif", about.face);
+    constexpr DWORD kShown = WS_CHILD | WS_VISIBLE;
+    const std::vector<DialogControl> expected = {
+        {IDOK, "button", "OK", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 158, 3, 45, 14},
+        {-1, "static", "Quaybar (QBR)", kShown | SS_LEFT | WS_GROUP, 30, 6, 113, 9},
+        {-1, "static", "Demonstration App", kShown | SS_LEFT | WS_GROUP, 30, 17, 74, 9},
+        {-1, "static", "Version 1.5", kShown | SS_LEFT | WS_GROUP, 30, 28, 51, 9},
+        {-1, "static", "Copyright (c) 2026 the Quaybar authors", kShown | SS_LEFT | WS_GROUP, 30, 40, 131, 9},
+        {-1, "static", "", kShown | SS_BLACKRECT, 2, 57, 202, 2},
+        {8001, "static", "Press Help to read more in QBR.HLP, or see QBRDEMO.TXT beside this program.",
+         kShown | SS_CENTER | WS_GROUP, 2, 65, 200, 26},
+        {8002, "static", "Quaybar toolbar library\nQuestions: see README.md", kShown | SS_LEFT | WS_GROUP, 3, 92, 112,
+         26},
+        {8003, "static", "Settings: qbrdemo.INI\nbeside the program", kShown | SS_RIGHT | WS_GROUP, 103, 92, 101, 26},
+        {8004, "button", "&Help", kShown | BS_PUSHBUTTON | WS_TABSTOP, 158, 21, 45, 14},
+        {-1, "static", "APPICON", kShown | SS_ICON, 4, 6, 18, 20},
+    };
+    ASSERT_EQ(expected.size(), about.controls.size());
+    for (size_t i = 0; i < expected.size(); ++i)
+        EXPECT_EQ(expected[i], about.controls[i]) << "control " << i;
 }
 
 // ---- Status bar --------------------------------------------------------------

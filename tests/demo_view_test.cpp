@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "core/core.h"
 #include "harness.h"
 #include "modal.h"
 #include "quaybar.h"
@@ -29,16 +30,33 @@ BOOL CountedDeleteObject(HGDIOBJ object) {
     if (deleted && font) ++fontsDeleted;
     return deleted;
 }
+// The help the program asks for, noted on the way to the platform's viewer.
+struct HelpCall {
+    HWND owner;
+    std::string file;
+    UINT command;
+    ULONG_PTR data;
+    bool operator==(const HelpCall &o) const {
+        return owner == o.owner && file == o.file && command == o.command && data == o.data;
+    }
+};
+std::vector<HelpCall> helpCalls;
+BOOL RecordedWinHelp(HWND owner, LPCSTR file, UINT command, ULONG_PTR data) {
+    helpCalls.push_back(HelpCall{owner, file ? file : "", command, data});
+    return WinHelpA(owner, file, command, data);
+}
 } // namespace
 
 #define CreateFontIndirectA CountedCreateFont
 #define DeleteObject CountedDeleteObject
+#define WinHelpA RecordedWinHelp
 #include "demo/main.cpp"
 #include "demo/settings.cpp"
 #include "demo/statusbar.cpp"
 #include "demo/tables.cpp"
 #undef CreateFontIndirectA
 #undef DeleteObject
+#undef WinHelpA
 
 namespace {
 
@@ -497,6 +515,270 @@ TEST_F(DemoViewTest, HelpOpensThroughWinHelpWithoutHangingAndTheBoxStaysOpen) {
     EXPECT_TRUE(openAfterHelp) << "Help closed the About box";
     EXPECT_TRUE(seen.closed);
     EXPECT_EQ(fontsMade - fontsDeleted, fontsHeld) << "Help or the box left a font behind";
+}
+
+// ---- Start states, the Palette group, help and the edit control -----------------------
+
+// The button of a group that is on, 0 for none, 9999 for more than one.
+UINT GroupOn(ToolbarManager *manager, UINT first, UINT last) {
+    UINT on = 0;
+    for (UINT id = first; id <= last; ++id)
+        if (QBR_GetButtonState(manager, id) & BS_ON) on = on ? 9999 : id;
+    return on;
+}
+UINT MenuGroupOn(HWND frame, UINT first, UINT last) {
+    UINT on = 0;
+    for (UINT id = first; id <= last; ++id)
+        if (MenuChecked(frame, id)) on = on ? 9999 : id;
+    return on;
+}
+
+// Every button of both catalogs as the program starts: its behaviour, its
+// on and mixed bits and whether it is enabled. Cut is disabled and Bold mixed
+// in the main window only; Brush and Left start the radio groups.
+TEST_F(DemoViewTest, ButtonsStartWithTheirBehavioursAndStatesInEachFrame) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    ToolbarManager *viewManager = ManagerOfView(view);
+    ASSERT_NE(viewManager, nullptr);
+    struct Row {
+        UINT id;
+        UINT behaviour;
+        UINT mainState, viewState; // BS_ON and BS_MIXED; viewState ~0u: not in the view's catalog
+        bool mainEnabled;
+    };
+    constexpr UINT P = BTN_PUSH, C = BTN_CHECK, L = BTN_LATCH, None = ~0u;
+    const Row rows[] = {
+        {101, P, 0, 0, true},        {102, P, 0, 0, true},    {104, P, 0, 0, true},    {106, P, 0, 0, true},
+        {107, P, 0, 0, false},       {108, P, 0, 0, true},    {109, P, 0, 0, true},    {151, L, 0, 0, true},
+        {201, C, 0, None, true},     {202, C, 0, None, true}, {203, C, 0, None, true}, {204, C, BS_ON, None, true},
+        {205, C, 0, None, true},     {206, C, 0, None, true}, {207, C, 0, None, true}, {208, C, 0, None, true},
+        {209, C, 0, None, true},     {210, C, 0, None, true}, {211, C, 0, None, true}, {212, C, 0, None, true},
+        {301, C, BS_MIXED, 0, true}, {302, C, 0, 0, true},    {303, C, 0, 0, true},    {304, C, BS_ON, BS_ON, true},
+        {305, C, 0, 0, true},        {306, C, 0, 0, true},    {307, C, 0, 0, true},    {401, P, 0, None, true},
+        {402, P, 0, None, true},     {403, P, 0, None, true}, {404, P, 0, None, true},
+    };
+    for (const Row &r : rows) {
+        SCOPED_TRACE(r.id);
+        EXPECT_EQ(r.behaviour, QBR_GetButtonBehaviour(mainManager, r.id));
+        EXPECT_EQ(r.mainState, QBR_GetButtonState(mainManager, r.id) & (BS_ON | BS_MIXED));
+        EXPECT_EQ(r.mainEnabled, QBR_IsButtonEnabled(mainManager, r.id) != 0);
+        if (r.viewState == None) continue;
+        EXPECT_EQ(r.behaviour, QBR_GetButtonBehaviour(viewManager, r.id));
+        EXPECT_EQ(r.viewState, QBR_GetButtonState(viewManager, r.id) & (BS_ON | BS_MIXED));
+        EXPECT_TRUE(QBR_IsButtonEnabled(viewManager, r.id) != 0) << "every button of a view is enabled";
+    }
+}
+
+// The Palette group of the main window: one tool at a time, on its buttons and
+// in its menu alike, from the first entry to the last.
+TEST_F(DemoViewTest, PaletteIsOneRadioGroupWithItsMenuChecks) {
+    struct Step {
+        const char *what;
+        UINT command; // 0: none
+        UINT on;
+    } const steps[] = {
+        {"at the start", 0, 204}, {"Eraser, the first", 201, 201}, {"Oval, the last", 212, 212},
+        {"Magnify", 209, 209},    {"Magnify again", 209, 209},     {"Pen", 202, 202},
+    };
+    for (const Step &s : steps) {
+        SCOPED_TRACE(s.what);
+        if (s.command) SendMessageA(mainWindow, WM_COMMAND, s.command, 0);
+        Pump();
+        EXPECT_EQ(s.on, GroupOn(mainManager, 201, 212));
+        EXPECT_EQ(s.on, MenuGroupOn(mainWindow, 201, 212));
+        EXPECT_EQ(304u, GroupOn(mainManager, 304, 307)) << "the other group stays";
+    }
+}
+
+// Help is the file "QBR.HLP", without a path, opened at its contents, with
+// the window that asked as the owner: the main window's command and the
+// About box's Help button.
+TEST_F(DemoViewTest, HelpOpensQbrHlpAtItsContentsFromTheMenuAndTheAboutBox) {
+    helpCalls.clear();
+    SendMessageA(mainWindow, WM_COMMAND, kHelpContentsCommand, 0);
+    Pump();
+    EXPECT_EQ((std::vector<HelpCall>{{mainWindow, "QBR.HLP", HELP_CONTENTS, 0}}), helpCalls);
+
+    helpCalls.clear();
+    AboutSeen seen;
+    HWND box = nullptr;
+    ModalSteps::Until([&box] { return (box = AboutBox()) != nullptr; });
+    ModalSteps::Add([] { SendMessageA(AboutBox(), WM_COMMAND, 8004, 0); });
+    ModalSteps::Add([] { PostMessageA(AboutBox(), WM_COMMAND, IDOK, 0); });
+    ModalSteps::Until([&seen] {
+        seen.closed = AboutBox() == nullptr;
+        return seen.closed;
+    });
+    SendMessageA(mainWindow, WM_COMMAND, kAboutCommand, 0);
+    RunUntilClosed(seen);
+    ASSERT_TRUE(seen.closed);
+    EXPECT_EQ((std::vector<HelpCall>{{box, "QBR.HLP", HELP_CONTENTS, 0}}), helpCalls);
+}
+
+// The edit control stands from one pixel left of the client area to its
+// right edge, with its top on the top dock's last line (the line the dock
+// closes with) and its bottom on the status bar, as the dock shows, hides and
+// comes back.
+TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    struct Frame {
+        const char *what;
+        HWND window;
+        ToolbarManager *manager;
+        HWND edit;
+        HWND statusBar;
+    } const frames[] = {
+        {"main window", mainWindow, mainManager, mainEdit, mainStatusBar},
+        {"view window", view, ManagerOfView(view), ViewStateOf(view)->edit, ViewStateOf(view)->statusBar},
+    };
+    for (const Frame &f : frames) {
+        SCOPED_TRACE(f.what);
+        HWND top = QBR_GetDock(f.manager, DOCK_TOP);
+        ASSERT_NE(top, nullptr);
+        auto expectEdit = [&](const char *state) {
+            SCOPED_TRACE(state);
+            Pump();
+            RECT client;
+            GetClientRect(f.window, &client);
+            // The space the dock takes: its height less the line it shares.
+            const int topSpace = IsWindowVisible(top) ? Height(top) - 1 : 0;
+            const int statusHeight = Height(f.statusBar);
+            EXPECT_EQ(Rect(-1, topSpace - 1, client.right, client.bottom - statusHeight), WindowRectInParent(f.edit));
+        };
+        expectEdit("both toolbars docked");
+        EXPECT_TRUE(IsWindowVisible(top));
+        for (UINT entry : {0u, 1u}) // Standard and Style hidden: the dock goes
+            SendMessageA(f.window, WM_COMMAND, kToolbarsMenuBase + entry, 0);
+        Pump();
+        EXPECT_FALSE(IsWindowVisible(top));
+        expectEdit("the dock hidden");
+        SendMessageA(f.window, WM_COMMAND, kToolbarsMenuBase + 1, 0); // Style back
+        expectEdit("one toolbar docked again");
+        EXPECT_TRUE(IsWindowVisible(top));
+    }
+}
+
+// The default toolbars of both kinds of frame, in the order they are made,
+// with their flags and items; the floating ones at their places, "Palette"
+// 100 pixels wide and so wrapped into its four groups of three.
+TEST_F(DemoViewTest, DefaultToolbarsOfBothFramesStandAsTabled) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    const std::vector<UINT> standard = {101, 102, 104, 0, 107, 108, 109, 0, 106, 151};
+    const std::vector<UINT> style = {301, 302, 303, 0, 304, 305, 306, 307};
+    const std::vector<UINT> align = {401, 402, 403, 404};
+    const std::vector<UINT> palette = {201, 202, 203, 0, 204, 205, 206, 0, 207, 208, 209, 0, 210, 211, 212};
+    constexpr UINT kDocked = TBF_VISIBLE | TBF_DOCKED, kFloating = TBF_VISIBLE | TBF_FLOATING;
+    struct Bar {
+        const char *title;
+        UINT flags;
+        std::vector<UINT> ids;
+        POINT frame;   // floating: the frame's top left on the screen
+        SIZE itemArea; // floating: its item area
+    };
+    struct Frame {
+        const char *what;
+        ToolbarManager *manager;
+        std::vector<Bar> bars;
+    } const frames[] = {
+        {"main window",
+         mainManager,
+         {{"Standard", kDocked, standard, {}, {}},
+          {"Style", kDocked, style, {}, {}},
+          {"Align", kFloating, align, {300, 100}, {24 + 3 * 23, 22}},
+          {"Palette", kFloating, palette, {300, 200}, {24 + 2 * 23, 4 * 22}}}},
+        {"view window",
+         ManagerOfView(view),
+         {{"Standard", kDocked, standard, {}, {}}, {"Style", kDocked, style, {}, {}}}},
+    };
+    for (const Frame &f : frames) {
+        SCOPED_TRACE(f.what);
+        ASSERT_EQ(f.bars.size(), QBR_GetToolbarCount(f.manager));
+        for (UINT i = 0; i < f.bars.size(); ++i) {
+            const Bar &b = f.bars[i];
+            SCOPED_TRACE(b.title);
+            HWND pane = QBR_GetToolbar(f.manager, i);
+            char title[64] = "";
+            QBR_GetToolbarTitle(pane, title, sizeof title);
+            EXPECT_STREQ(b.title, title);
+            EXPECT_EQ(b.flags, QBR_GetToolbarFlags(pane));
+            EXPECT_EQ(b.ids, ToolbarIds(pane));
+            EXPECT_EQ(QBR_GetDock(f.manager, DOCK_TOP), QBR_GetToolbarDock(pane)) << "all in the one top dock";
+            if (b.flags != kFloating) continue;
+            RECT frame, area;
+            GetWindowRect(ResolveRoleWindow(pane, ROLE_FLOATING), &frame);
+            GetItemArea(pane, ROLE_FLOATING, &area);
+            EXPECT_EQ(b.frame.x, frame.left);
+            EXPECT_EQ(b.frame.y, frame.top);
+            EXPECT_EQ(b.itemArea.cx, area.right - area.left);
+            EXPECT_EQ(b.itemArea.cy, area.bottom - area.top);
+        }
+    }
+}
+
+// Each frame's catalog and the categories of its items: the main window's 31
+// buttons and the separator in six categories, Cut in none; a view's 15
+// buttons and the separator in none.
+TEST_F(DemoViewTest, CatalogsAndCategoriesOfBothFrames) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    ToolbarManager *viewManager = ManagerOfView(view);
+    ASSERT_NE(viewManager, nullptr);
+    EXPECT_EQ(32u, PointerListCount(mainManager->items));
+    EXPECT_EQ(16u, PointerListCount(viewManager->items));
+    const struct {
+        UINT category;
+        std::vector<UINT> ids;
+    } categories[] = {
+        {3001, {101, 102, 104, 106}},
+        {3002, {108, 109}},
+        {3003, {201, 202, 203, 204, 205, 206, 207, 208, 209, 210, 211, 212}},
+        {3004, {301, 302, 303, 304, 305, 306, 307}},
+        {3005, {401, 402, 403, 404}},
+        {3006, {151}},
+        {0, {107}},
+    };
+    for (const auto &c : categories) {
+        for (UINT id : c.ids) {
+            SCOPED_TRACE(id);
+            UINT category = 99;
+            EXPECT_EQ(1u, ItemGetCategory(ItemFindById(mainManager->items, id), &category));
+            EXPECT_EQ(c.category, category);
+            if (ToolbarItem *item = ItemFindById(viewManager->items, id)) {
+                category = 99;
+                EXPECT_EQ(1u, ItemGetCategory(item, &category));
+                EXPECT_EQ(0u, category) << "a view sets no categories";
+            }
+        }
+    }
+}
+
+// The texts the program serves the library, by kind: the description under
+// the id, quick help under id + 1000, the label under id + 2000, a category's
+// name under its own id; no text for an unknown kind or a missing string.
+TEST_F(DemoViewTest, HelpTextsComeFromTheStringTableByKind) {
+    struct Case {
+        UINT id, kind;
+        const char *text; // nullptr: none
+    } const cases[] = {
+        {201, HELP_DESCRIPTION, "Select the eraser tool"},
+        {201, HELP_QUICK, "Eraser"},
+        {201, HELP_BUTTON_TEXT, "Erase"},
+        {3003, HELP_CATEGORY, "Palette"},
+        {307, HELP_QUICK, "Justified"},
+        {307, HELP_BUTTON_TEXT, "Justify"},
+        {103, HELP_QUICK, nullptr},
+        {201, 4, nullptr},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(std::to_string(c.id) + " kind " + std::to_string(c.kind));
+        char text[128] = "";
+        const int length = DemoHelpText(c.id, c.kind, text, sizeof text);
+        EXPECT_EQ(c.text ? static_cast<int>(std::string(c.text).size()) : 0, length);
+        if (c.text) EXPECT_STREQ(c.text, text);
+    }
 }
 
 // ---- Views whose parts cannot be made ----------------------------------------------------

@@ -156,12 +156,19 @@ class DockPackTest : public FrameTest {
         record = FindDockRecord(dock);
         ASSERT_NE(nullptr, record);
     }
-    // Three toolbars of 30, 12 and 8 buttons: the first two share a row at
-    // the full-screen limit, the third may wrap.
+    // Three toolbars of 10, 6 and 4 buttons: the first two share a row on any
+    // screen, and the third is made one pixel wider than the row leaves, so
+    // that it wraps on any screen too (a pane sized by program is not refitted).
     void ThreeToolbars(HWND t[3]) {
-        t[0] = Toolbar(1, 30);
-        t[1] = Toolbar(31, 12);
-        t[2] = Toolbar(43, 8);
+        t[0] = Toolbar(1, 10);
+        t[1] = Toolbar(11, 6);
+        t[2] = Toolbar(17, 4);
+        const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+        const int rowRight = W(WindowRectInParent(t[0])) - 1 + W(WindowRectInParent(t[1])) - 1;
+        SetWindowPos(t[2], nullptr, 0, 0, limit - rowRight + 1, H(WindowRectInParent(t[2])),
+                     SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+        RelayoutDock(dock);
+        Pump();
     }
     void Float(UINT index, bool floating) {
         ToolbarRecord *r = ListAt<ToolbarRecord>(record->toolbars, index);
@@ -192,11 +199,10 @@ TEST_F(DockPackTest, PacksRowsWithSharedBordersAndWraps) {
     const int w1 = W(r1), w2 = W(r2), w3 = W(r3), h = H(r1);
     ASSERT_EQ(h, H(r2));
     ASSERT_EQ(h, H(r3));
-    // Whether T3 wraps follows from the row test; this set of panes must take
-    // both branches once to be of use.
+    // T2 joins T1; T3 is one pixel too wide for the rest of the row.
     const int rowRight = w1 - 1 + w2 - 1;
     ASSERT_LE(w1 + w2, limit) << "T2 should join T1";
-    if (w3 + rowRight <= limit) GTEST_SKIP() << "panes too narrow to wrap: " << w1 << " " << w2 << " " << w3;
+    ASSERT_EQ(limit + 1, w3 + rowRight);
 
     EXPECT_EQ(Rect(-1, -1, w1 - 1, h - 1), r1);
     EXPECT_EQ(Rect(w1 - 2, -1, w1 - 2 + w2, h - 1), r2);
@@ -218,14 +224,30 @@ TEST_F(DockPackTest, PacksRowsWithSharedBordersAndWraps) {
     EXPECT_EQ(r3, WindowRectInParent(t[2]));
 }
 
+// A first pane as wide as the limit still starts the first row at (-1, -1);
+// one pixel wider, it starts a new row one line lower, at (-1, 0). The pane is
+// sized by program, so the case holds on any screen.
 TEST_F(DockPackTest, APaneWiderThanTheLimitStartsANewRowOneLineLower) {
     const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
-    HWND wide = Toolbar(1, 60);
-    const RECT r = WindowRectInParent(wide);
-    if (W(r) <= limit) GTEST_SKIP() << "pane not wider than the limit: " << W(r);
-    EXPECT_EQ(-1, r.left);
-    EXPECT_EQ(0, r.top);
-    EXPECT_EQ(H(r), H(WindowRectInParent(dock)));
+    HWND wide = Toolbar(1, 6);
+    const int h = H(WindowRectInParent(wide));
+    struct Case {
+        int width;
+        RECT pane;
+        int dockHeight;
+    } const cases[] = {
+        {limit, {-1, -1, limit - 1, h - 1}, h - 1},
+        {limit + 1, {-1, 0, limit, h}, h},
+        {limit + 40, {-1, 0, limit + 39, h}, h},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.width);
+        SetWindowPos(wide, nullptr, 0, 0, c.width, h, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+        ASSERT_EQ(1u, PackDock(record));
+        Pump();
+        EXPECT_EQ(c.pane, WindowRectInParent(wide));
+        EXPECT_EQ(Rect(0, 0, limit, c.dockHeight), WindowRectInParent(dock));
+    }
 }
 
 // The worked example with panes forced to 300x28, 200x28 and 150x28, packed
@@ -328,6 +350,8 @@ TEST_F(DockPackTest, DockInsertionIndexForPointsAroundThePanes) {
         {"inside T2", r2.left + 5, r2.top + 5, 1},
         {"inside T3", r3.left + 5, r3.top + 5, 2},
         {"right of the last pane of the first row", limit - 2, r1.top + 5, wrapped ? 2u : 3u},
+        {"right of the first row, one line above the second", limit - 2, r3.top - 1, 2},
+        {"right of the first row, on the second row's top line", limit - 2, r3.top, 3},
         {"below everything", 5, r3.bottom + 20, 3},
         {"above all panes", 5, -5, 0},
     };

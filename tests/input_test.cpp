@@ -229,6 +229,23 @@ TEST_F(InputTest, ADisabledButtonIsTrackedAndReportedButNeverActs) {
     }
 }
 
+// While the application is inactive, moves over a toolbar do nothing: a press
+// keeps its look off the button until WM_ACTIVATEAPP says the application is
+// active again.
+TEST_F(InputTest, MovesDoNothingWhileTheApplicationIsInactive) {
+    HWND pane = Make({1, 2, 3});
+    Down(Button(pane, 0));
+    ASSERT_TRUE(Pressed(1));
+    EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, FALSE, 0));
+    Move(Empty(pane));
+    EXPECT_TRUE(Pressed(1)) << "a move while inactive";
+    EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, TRUE, 0));
+    Move(Empty(pane));
+    EXPECT_FALSE(Pressed(1)) << "a move once active again";
+    Up(Empty(pane));
+    EXPECT_EQ((std::vector<Heard>{Press(1), Release(1)}), FrameLog()) << Describe(FrameLog());
+}
+
 TEST_F(InputTest, NotificationsCarrySixteenBitsAndCanBeSwitchedOff) {
     AddButtons(0x12345, 1);
     HWND pane = Make({0x12345});

@@ -1,6 +1,7 @@
 // Item dragging with the right button on real toolbar windows and the real
 // cursor: every gesture of the drop table as a press, a move and a release,
 // checked by the item lists and by the widths the toolbars refit to.
+#include <map>
 #include <string>
 #include <vector>
 
@@ -154,6 +155,9 @@ const Gesture kGestures[] = {
     {"last one into empty",  {1}, kDocked, {}, kDocked, {'A', kOnItem, 1}, {'B', kOnToolbar}, 0, 0, {}, {1}},
     {"onto floating frame",  A0, kDocked, B0, kFloating, {'A', kOnItem, 2}, {'B', kOnItem, 8}, 0, 0, {1, 3, 4, 5}, {7, 2, 8, 9}},
     {"inside floating frame", A0, kFloating, B0, kDocked, {'A', kOnItem, 1}, {'A', kOnItem, 4}, 0, 0, {2, 3, 1, 4, 5}, B0},
+    {"first onto the second", A0, kDocked, B0, kDocked, {'A', kOnItem, 1}, {'A', kOnItem, 2}, 0, 0, A0, B0},
+    {"second onto the third", A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'A', kOnItem, 3}, 0, 0, A0, B0},
+    {"third onto the first", A0, kDocked, B0, kDocked, {'A', kOnItem, 3}, {'A', kOnItem, 1}, 0, 0, {3, 1, 2, 4, 5}, B0},
     // Off every toolbar.
     {"dock surface removes", A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'B', kDockSurface}, 0, 0, {1, 3, 4, 5}, B0},
     {"frame space removes",  A0, kDocked, B0, kDocked, {'A', kOnItem, 2}, {'A', kFrameSpace}, 0, 0, {1, 3, 4, 5}, B0},
@@ -263,6 +267,40 @@ TEST_F(ItemDragTest, ARightPressOffTheButtonsOpensTheMenuAtThePress) {
         QBR_DestroyToolbar(a);
         Pump();
     }
+}
+
+// Which windows hear that a menu starts: the owner of a popup menu does.
+std::vector<HWND> menuOwners;
+std::map<HWND, WNDPROC> ownerProcs;
+LRESULT CALLBACK MenuOwnerProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
+    if (m == WM_ENTERMENULOOP) menuOwners.push_back(w);
+    return CallWindowProcA(ownerProcs[w], w, m, wp, lp);
+}
+
+// A right press on the dock's own surface, beside every toolbar, opens the
+// toolbar menu at the press (the message's point, in the dock's client
+// coordinates), owned by the manager's first toolbar.
+TEST_F(ItemDragTest, ARightPressOnTheDockOpensTheMenuThereOwnedByTheFirstToolbar) {
+    HWND a = Make({1, 2}, kDocked, 350), b = Make({3}, kDocked, 150);
+    for (HWND pane : {a, b})
+        ownerProcs[pane] =
+            reinterpret_cast<WNDPROC>(SetWindowLongPtrA(pane, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(MenuOwnerProc)));
+    menuOwners.clear();
+    const POINT inDock = {500, 6};
+    POINT onScreen = inDock;
+    ClientToScreen(top, &onScreen);
+    menuSeen = false;
+    const UINT_PTR timer = SetTimer(nullptr, 0, 10, CloseMenu);
+    SendMessageA(top, WM_RBUTTONDOWN, MK_RBUTTON, MAKELPARAM(inDock.x, inDock.y));
+    KillTimer(nullptr, timer);
+    Pump();
+    EXPECT_TRUE(menuSeen);
+    EXPECT_EQ(onScreen.x, menuRect.left);
+    EXPECT_EQ(onScreen.y, menuRect.top);
+    EXPECT_EQ(std::vector<HWND>{a}, menuOwners);
+    for (auto &owner : ownerProcs)
+        SetWindowLongPtrA(owner.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(owner.second));
+    ownerProcs.clear();
 }
 
 // The frame starts as the item's rectangle on the screen, inverted there, and

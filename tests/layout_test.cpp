@@ -103,6 +103,29 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING | TBF_USER_CREATED), QBR_GetToolbarFlags(restoredFloat));
     EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(restoredFloat, ROLE_FLOATING)));
     EXPECT_EQ(nullptr, QBR_GetDock(otherManager, DOCK_RIGHT)) << "no key, no dock";
+    // The restored dock is packed once its toolbars stand: shown, its first
+    // pane at (-1, -1), as tall as that pane less the line it shares.
+    HWND restoredTop = QBR_GetDock(otherManager, DOCK_TOP);
+    HWND restoredStandard = QBR_GetToolbar(otherManager, 0);
+    EXPECT_TRUE(IsWindowVisible(restoredTop));
+    const RECT pane = WindowRectInParent(restoredStandard);
+    EXPECT_EQ(-1, pane.left);
+    EXPECT_EQ(-1, pane.top);
+    EXPECT_EQ(pane.bottom, ClientRectOf(restoredTop).bottom);
+}
+
+// Two toolbars of one title: each restore looks for the first line of that
+// title, and the first restore uses its value up, so the second toolbar gets
+// the empty value (no items, flags 0) and the second line is never read.
+TEST_F(LayoutTest, TheFirstLineOfATitleServesAndIsUsedUp) {
+    otherManager = SecondManager();
+    Apply(otherManager, other,
+          {{"Top Dock", "Twin,Twin"}, {"Twin", "1,101,17,0,0,0,0"}, {"Twin", "2,102,103,33,300,100,400,160"}});
+    ASSERT_EQ(2u, QBR_GetToolbarCount(otherManager));
+    EXPECT_EQ(std::vector<UINT>{101}, ToolbarIds(QBR_GetToolbar(otherManager, 0)));
+    EXPECT_EQ(17u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 0)));
+    EXPECT_EQ(std::vector<UINT>{}, ToolbarIds(QBR_GetToolbar(otherManager, 1)));
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 1)));
 }
 
 TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
@@ -149,6 +172,19 @@ TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
     UINT keyLength = 7, valueLength = 7;
     EXPECT_EQ(0u, QBR_GetLayoutEntrySize(5, &keyLength, &valueLength));
     EXPECT_EQ(0u, keyLength + valueLength);
+    // The first index past a filled table is past it too.
+    UINT count = 0;
+    ASSERT_EQ(1u, QBR_CaptureLayout(manager, &count));
+    ASSERT_EQ(1u, count);
+    lstrcpyA(key, "x");
+    lstrcpyA(value, "y");
+    EXPECT_EQ(1u, QBR_GetLayoutEntry(1, key, value));
+    EXPECT_STREQ("", key);
+    EXPECT_STREQ("", value);
+    keyLength = valueLength = 7;
+    EXPECT_EQ(0u, QBR_GetLayoutEntrySize(1, &keyLength, &valueLength));
+    EXPECT_EQ(0u, keyLength + valueLength);
+    QBR_FreeLayout();
 }
 
 } // namespace

@@ -485,6 +485,176 @@ TEST_F(ToolbarTest, StaleHandlesAndForeignWindowsGiveZero) {
         << "a window that is no dock";
 }
 
+// The two groups of the flag word: in each, the first bit wins when both are
+// given (visible over hidden, docked over floating), and the show group acts
+// first, on the window that the place the record holds at that moment names.
+// A hidden toolbar stays hidden whatever its place becomes.
+TEST_F(ToolbarTest, FlagGroupsPreferVisibleAndDockedAndShowBeforeThePlace) {
+    constexpr UINT V = TBF_VISIBLE, H = TBF_HIDDEN, D = TBF_DOCKED, F = TBF_FLOATING;
+    struct Case {
+        const char *what;
+        UINT start, set, flags;
+        bool paneShown, frameShown;
+    } const cases[] = {
+        {"both show bits on a hidden toolbar", H | D, V | H, V | D, true, false},
+        {"both show bits on a shown toolbar", V | D, V | H, V | D, true, false},
+        {"both place bits on a floating toolbar", V | F, D | F, V | D, true, false},
+        {"both place bits on a docked toolbar", V | D, D | F, V | D, true, false},
+        {"hidden and floating, docked", H | F, D, H | D, false, false},
+        {"hidden and docked, floated", H | D, F, H | F, false, false},
+        {"a floating toolbar hidden and docked at once", V | F, H | D, H | D, false, false},
+        {"a docked toolbar hidden and floated at once", V | D, H | F, H | F, false, false},
+        {"a hidden docked toolbar shown and floated at once", H | D, V | F, V | F, false, true},
+        {"a hidden floating toolbar shown and docked at once", H | F, V | D, V | D, true, false},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.what);
+        HWND pane = Make({1, 2, 3}, c.start);
+        QBR_SetToolbarFlags(pane, c.set);
+        Pump();
+        EXPECT_EQ(c.flags, QBR_GetToolbarFlags(pane));
+        EXPECT_EQ(c.paneShown, IsWindowVisible(pane) != 0);
+        EXPECT_EQ(c.frameShown, IsWindowVisible(ResolveRoleWindow(pane, ROLE_FLOATING)) != 0);
+        QBR_DestroyToolbar(pane);
+        Pump();
+    }
+}
+
+// A dock relayout that moves nothing paints nothing: no pane, however many.
+// A change repaints the panes it moves.
+TEST_F(ToolbarTest, AnUnchangedDockRelayoutPaintsNoPane) {
+    HWND one = Make({1, 2, 3});
+    HWND two = Make({4, 5, 6});
+    originalProc =
+        reinterpret_cast<WNDPROC>(SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc)));
+    SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(CountingProc));
+    Pump();
+    paints.clear();
+    for (int i = 0; i < 3; ++i)
+        EXPECT_EQ(1u, RelayoutDock(top));
+    Pump();
+    EXPECT_EQ(0, paints[one]);
+    EXPECT_EQ(0, paints[two]);
+    const RECT before = WindowRectInParent(two);
+    ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(one), 3, Item(7)));
+    Pump();
+    EXPECT_EQ(before.left + 23, WindowRectInParent(two).left);
+    EXPECT_EQ(1, paints[two]) << "the moved pane";
+    SetWindowLongPtrA(one, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(originalProc));
+    SetWindowLongPtrA(two, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(originalProc));
+}
+
+// The windows a test watches, and what each received: WM_WINDOWPOSCHANGING
+// comes with every SetWindowPos, whether it changes anything or not.
+std::map<HWND, int> placings;
+std::map<HWND, WNDPROC> watchedProcs;
+LRESULT CALLBACK PlacingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
+    if (m == WM_WINDOWPOSCHANGING) ++placings[w];
+    return CallWindowProcA(watchedProcs[w], w, m, wp, lp);
+}
+void WatchPlacings(HWND w) {
+    watchedProcs[w] =
+        reinterpret_cast<WNDPROC>(SetWindowLongPtrA(w, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PlacingProc)));
+}
+void UnwatchPlacings() {
+    for (auto &watched : watchedProcs)
+        SetWindowLongPtrA(watched.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(watched.second));
+    watchedProcs.clear();
+    placings.clear();
+}
+
+// A refit or a packing that changes nothing places no window at all, on
+// either window of a docked or a floating toolbar.
+TEST_F(ToolbarTest, RefitsAndPackingsThatChangeNothingPlaceNoWindow) {
+    HWND docked = Make({1, 2, 3, S, 4});
+    HWND floating = Make({5, 6, 7}, TBF_VISIBLE | TBF_FLOATING, nullptr, 200, 200);
+    for (HWND pane : {docked, floating}) {
+        WatchPlacings(pane);
+        WatchPlacings(ResolveRoleWindow(pane, ROLE_FLOATING));
+    }
+    for (HWND pane : {docked, floating})
+        EXPECT_EQ(1u, RefitToolbar(pane, ROLE_BOTH));
+    EXPECT_EQ(1u, RelayoutDock(top));
+    Pump();
+    for (HWND pane : {docked, floating}) {
+        EXPECT_EQ(0, placings[pane]) << (pane == docked ? "docked" : "floating") << " pane";
+        EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)])
+            << (pane == docked ? "docked" : "floating") << " frame";
+    }
+    // A real change places the windows it changes.
+    ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
+    Pump();
+    EXPECT_GT(placings[docked], 0);
+    EXPECT_GT(placings[ResolveRoleWindow(docked, ROLE_FLOATING)], 0);
+    UnwatchPlacings();
+}
+
+// What reaches a subclassed floating frame as WM_SETTEXT.
+std::vector<Heard> textsHeard;
+WNDPROC textFrameProc = nullptr;
+LRESULT CALLBACK TextRecordingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
+    if (m == WM_SETTEXT) textsHeard.push_back(Heard{m, wp, lp});
+    return CallWindowProcA(textFrameProc, w, m, wp, lp);
+}
+
+// A text given to the pane goes on to the floating frame, the same message
+// with the same parameters; neither window stores it: titles are given at
+// creation and read from the frame.
+TEST_F(ToolbarTest, ATextForThePaneGoesOnToTheFrameAndIsNotStored) {
+    HWND pane = Make({1, 2});
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    textsHeard.clear();
+    textFrameProc = reinterpret_cast<WNDPROC>(
+        SetWindowLongPtrA(frameWindow, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(TextRecordingProc)));
+    static const char kRenamed[] = "Renamed";
+    const LPARAM text = reinterpret_cast<LPARAM>(kRenamed);
+    EXPECT_EQ(0, SendMessageA(pane, WM_SETTEXT, 0, text));
+    EXPECT_EQ((std::vector<Heard>{Heard{WM_SETTEXT, 0, text}}), textsHeard) << Describe(textsHeard);
+    EXPECT_EQ(0, SendMessageA(frameWindow, WM_SETTEXT, 0, text));
+    EXPECT_EQ(2u, textsHeard.size()) << "the frame passes nothing on";
+    char title[32];
+    QBR_GetToolbarTitle(pane, title, sizeof(title));
+    EXPECT_STREQ("T", title);
+    SetWindowLongPtrA(frameWindow, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(textFrameProc));
+}
+
+// A thread hook that refuses the creation of floating frames.
+LRESULT CALLBACK RefuseFloatingFrames(int code, WPARAM wParam, LPARAM lParam) {
+    if (code == HCBT_CREATEWND) {
+        const CREATESTRUCTA *create = reinterpret_cast<CBT_CREATEWNDA *>(lParam)->lpcs;
+        char name[32] = "";
+        GetClassNameA(reinterpret_cast<HWND>(wParam), name, sizeof(name));
+        if (lstrcmpA(name, "QBR_ToolbarWindow") == 0 && (create->style & WS_POPUP)) return 1;
+    }
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+
+// The pane makes its floating frame and its record while it is created; when
+// either cannot be made, the creation fails and leaves no window behind.
+TEST_F(ToolbarTest, APaneWithoutItsFrameOrRecordIsNotMade) {
+    const UINT ids[] = {1, 2, 3};
+    int windows = CountWindows();
+    HHOOK hook = SetWindowsHookExA(WH_CBT, RefuseFloatingFrames, nullptr, GetCurrentThreadId());
+    ASSERT_NE(nullptr, hook);
+    HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 3);
+    UnhookWindowsHookEx(hook);
+    Pump();
+    EXPECT_EQ(nullptr, pane) << "no frame";
+    EXPECT_EQ(windows, CountWindows());
+    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
+
+    // A pane in a window that is no dock finds no manager to hold its record.
+    HWND notDock = CreateWindowExA(0, "STATIC", "", WS_CHILD | WS_VISIBLE, 0, 0, 50, 20, frame, nullptr,
+                                   GetModuleHandleA(nullptr), nullptr);
+    ASSERT_NE(nullptr, notDock);
+    windows = CountWindows();
+    EXPECT_EQ(nullptr, CreateToolbarWindows(notDock, "T")) << "no record";
+    Pump();
+    EXPECT_EQ(windows, CountWindows()) << "the frame made first is gone again";
+    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
+    DestroyWindow(notDock);
+}
+
 } // namespace
 
 TEST(ToolbarLeakTest, ToolbarsAndManagersReleaseEverything) {
