@@ -44,21 +44,24 @@ namespace {
 
 // ---- Finding the program's windows -------------------------------------------------
 
+struct ClassSearch {
+    const char *name;
+    std::vector<HWND> found;
+};
+
+// A named CALLBACK function: a lambda converts only to the default calling
+// convention, which on 32-bit Windows is not CALLBACK's.
+BOOL CALLBACK CollectWindowOfClass(HWND window, LPARAM data) {
+    auto *s = reinterpret_cast<ClassSearch *>(data);
+    char name[64] = "";
+    GetClassNameA(window, name, sizeof name);
+    if (std::string(name) == s->name) s->found.push_back(window);
+    return TRUE;
+}
+
 std::vector<HWND> WindowsOfClass(const char *className) {
-    struct Search {
-        const char *name;
-        std::vector<HWND> found;
-    } search{className, {}};
-    EnumThreadWindows(
-        GetCurrentThreadId(),
-        [](HWND window, LPARAM data) -> BOOL {
-            auto *s = reinterpret_cast<Search *>(data);
-            char name[64] = "";
-            GetClassNameA(window, name, sizeof name);
-            if (std::string(name) == s->name) s->found.push_back(window);
-            return TRUE;
-        },
-        reinterpret_cast<LPARAM>(&search));
+    ClassSearch search{className, {}};
+    EnumThreadWindows(GetCurrentThreadId(), CollectWindowOfClass, reinterpret_cast<LPARAM>(&search));
     return search.found;
 }
 
