@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Builds the C host in tests/consumer/ one of the ways the README's "Use it in
 # your program" shows, checks what the build did, and runs the host under Wine.
-#   consumer_test.sh BUILD_DIR subdirectory|package|link-line
+#   consumer_test.sh BUILD_DIR subdirectory|package
 # Each way works in BUILD_DIR/consumer/<way>/ and starts from an empty folder.
 set -eu
 build=$(cd "$1" && pwd)
@@ -16,9 +16,14 @@ cd "$work"
 
 fail() { echo "consumer $way: $*" >&2; exit 1; }
 
-# The library's package, installed from the project's own build.
+# The library alone, configured, built and installed as the README shows. No
+# step of its build may call Python (the pictures are committed).
 install_package() {
-    cmake --install "$build" --prefix "$work/prefix" >install.log
+    cmake -S "$source_dir" -B lib-build -DQBR_BUILD_DEMO=OFF -DQBR_BUILD_TESTS=OFF -DQBR_BUILD_BENCH=OFF >lib-configure.log \
+        || { cat lib-configure.log; fail "the library alone does not configure"; }
+    cmake --build lib-build -j2 >lib-build.log || { cat lib-build.log; fail "the library alone does not build"; }
+    cmake --install lib-build --prefix "$work/prefix" >install.log
+    ! grep -rqiI --include='*.make' --include=Makefile python lib-build || fail "the library's build calls Python"
     for f in include/quaybar.h include/qbr_records.h lib/libquaybar.a \
              lib/cmake/Quaybar/QuaybarConfig.cmake lib/cmake/Quaybar/QuaybarConfigVersion.cmake; do
         [ -f "prefix/$f" ] || fail "the install has no $f"
@@ -43,44 +48,43 @@ subdirectory)
     # The library's warning flags are its own business when it is the project.
     ! grep -q -- "-Werror" host/quaybar/CMakeFiles/quaybar.dir/flags.make || fail "-Werror reached the host's build of the library"
     ! grep -qE "WIN32_LEAN_AND_MEAN|NOMINMAX" host/CMakeFiles/host.dir/flags.make || fail "the library trims the host's windows.h"
-    exe=host/host.exe
-    objdump=x86_64-w64-mingw32-objdump
+    hosts=host/host.exe
     ;;
 package)
     install_package
+    prefix=$work/prefix
+    # A CMake host finds the package.
     cmake -S "$here/package" -B host -DCMAKE_TOOLCHAIN_FILE="$toolchain" \
-        -DCMAKE_PREFIX_PATH="$work/prefix" -DHOST_IMAGES_DIR="$source_dir/demo/images" >configure.log \
+        -DCMAKE_PREFIX_PATH="$prefix" -DHOST_IMAGES_DIR="$source_dir/demo/images" >configure.log \
         || { cat configure.log; fail "configure failed"; }
     cmake --build host -j2 >build.log || { cat build.log; fail "build failed"; }
     # A version the package does not offer is refused.
-    if cmake -S "$here/package" -B too-new -DCMAKE_TOOLCHAIN_FILE="$toolchain" -DCMAKE_PREFIX_PATH="$work/prefix" \
+    if cmake -S "$here/package" -B too-new -DCMAKE_TOOLCHAIN_FILE="$toolchain" -DCMAKE_PREFIX_PATH="$prefix" \
         -DHOST_QUAYBAR_VERSION=2.0 >too-new.log 2>&1; then
         fail "find_package(Quaybar 2.0) was accepted"
     fi
-    exe=host/host.exe
-    objdump=x86_64-w64-mingw32-objdump
-    ;;
-link-line)
-    # The README's build without CMake, word for word but for the paths.
-    install_package
-    prefix=$work/prefix
-    x86_64-w64-mingw32-windres -I "$source_dir/demo/images" "$here/host.rc" -O coff -o host-res.o
-    x86_64-w64-mingw32-gcc -mwindows -I "$prefix/include" "$here/host.c" host-res.o "$prefix"/lib/quaybar/*.res \
-        -L "$prefix/lib" -lquaybar -lstdc++ -lgdi32 -luser32 -lshell32 -static -o host.exe
-    exe=host.exe
-    objdump=x86_64-w64-mingw32-objdump
+    # A host built without CMake, by the README's compiler line (plus the
+    # host's own shell32 and the folder of its bitmap).
+    mkdir -p plain
+    x86_64-w64-mingw32-windres -I "$source_dir/demo/images" "$here/host.rc" -O coff -o plain/host-res.o
+    x86_64-w64-mingw32-gcc -mwindows -I "$prefix/include" "$here/host.c" plain/host-res.o "$prefix"/lib/quaybar/*.res \
+        -L "$prefix/lib" -lquaybar -lstdc++ -lgdi32 -luser32 -lshell32 -static -o plain/host.exe
+    hosts="host/host.exe plain/host.exe"
+    # Nor does the project's own build call Python, the demo's included.
+    ! grep -rqiI --include='*.make' python "$build/CMakeFiles" "$build/demo" || fail "the project's build calls Python"
     ;;
 *)
-    fail "unknown way (subdirectory, package or link-line)"
+    fail "unknown way (subdirectory or package)"
     ;;
 esac
 
-# The program needs no DLL of the compiler beside it.
-dlls=$($objdump -p "$exe" | sed -n 's/.*DLL Name: //p' | tr 'A-Z' 'a-z' | tr -d '\r' | sort | xargs)
-case $dlls in
-*libstdc++*|*libgcc*|*libwinpthread*) fail "the program imports the compiler's runtime: $dlls" ;;
-esac
-
-# It starts and works: frame, docked toolbar, the library's strings, a real click.
-"$source_dir/scripts/wine-run.sh" "$build" "$work/$exe" || fail "the host failed (exit code $?)"
-echo "consumer $way: built, imports only $dlls, started and worked"
+for exe in $hosts; do
+    # The program needs no DLL of the compiler beside it.
+    dlls=$(x86_64-w64-mingw32-objdump -p "$exe" | sed -n 's/.*DLL Name: //p' | tr 'A-Z' 'a-z' | sort | xargs)
+    case $dlls in
+    *libstdc++*|*libgcc*|*libwinpthread*) fail "$exe imports the compiler's runtime: $dlls" ;;
+    esac
+    # It starts and works: frame, docked toolbar, the library's strings, a real click.
+    "$source_dir/scripts/wine-run.sh" "$build" "$work/$exe" || fail "$exe failed (exit code $?)"
+    echo "consumer $way: $exe built, imports only $dlls, started and worked"
+done
