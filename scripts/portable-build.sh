@@ -22,7 +22,7 @@ clang)
     # run-time calls MSVC deprecates. Those marks also fall on memcpy and
     # memmove, which MSVC does not deprecate, so they are warnings here and the
     # log is read for the others.
-    flags="-Wshadow -Wshorten-64-to-32 -Wimplicit-int-conversion -Wfloat-conversion"
+    flags="-Wshadow-all -Wshorten-64-to-32 -Wimplicit-int-conversion -Wfloat-conversion"
     flags="$flags -D__MINGW_MSVC_COMPAT_WARNINGS -Wno-error=deprecated-declarations"
     cmake -S "$here" -B "$work" -DCMAKE_TOOLCHAIN_FILE="$here/cmake/clang-mingw-w64-x86_64.cmake" \
         -DQBR_BUILD_TESTS=OFF -DQBR_BUILD_BENCH=OFF -DCMAKE_CXX_FLAGS="$flags" >"$work/configure.log" \
