@@ -88,3 +88,12 @@ for exe in $hosts; do
     "$source_dir/scripts/wine-run.sh" "$build" "$work/$exe" || fail "$exe failed (exit code $?)"
     echo "consumer $way: $exe built, imports only $dlls, started and worked"
 done
+
+if [ "$way" = subdirectory ]; then
+    # The host may ask for the compiler's runtime as DLLs instead.
+    cmake host -DQBR_STATIC_RUNTIME=OFF >>configure.log && cmake --build host -j2 >>build.log ||
+        fail "the build with QBR_STATIC_RUNTIME=OFF failed"
+    x86_64-w64-mingw32-objdump -p host/host.exe | grep -qi "DLL Name: libstdc++" ||
+        fail "with QBR_STATIC_RUNTIME=OFF the host still has the C++ runtime built in"
+    echo "consumer $way: with QBR_STATIC_RUNTIME=OFF the host imports the C++ runtime"
+fi
