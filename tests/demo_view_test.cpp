@@ -167,6 +167,14 @@ class DemoViewTest : public ::testing::Test {
     HWND mainWindow = nullptr;
 };
 
+// The main window shows the text file that sits beside the program (the
+// build copies QBRDEMO.TXT into the folder of the programs, this one's too).
+TEST_F(DemoViewTest, MainWindowShowsTheTextFileBesideTheProgram) {
+    char text[64] = "";
+    GetDlgItemTextA(mainWindow, kEditId, text, sizeof text);
+    EXPECT_EQ(std::string(text).rfind("Welcome to the Quaybar Demo", 0), 0u) << text;
+}
+
 TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
     HWND a = OpenView(), b = OpenView();
     ASSERT_TRUE(a && b);
