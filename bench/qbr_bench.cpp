@@ -131,6 +131,14 @@ int CALLBACK BenchHelpText(UINT id, UINT kind, LPSTR buffer, int size) {
     return wsprintfA(buffer, "%c%u", "QDBC"[kind & 3], id) < size ? lstrlenA(buffer) : 0;
 }
 
+// Adds a window to a std::vector<HWND>. Callbacks are named functions: a
+// lambda converts only to the default calling convention, which on 32-bit
+// Windows is not CALLBACK's.
+BOOL CALLBACK CollectWindow(HWND w, LPARAM list) {
+    reinterpret_cast<std::vector<HWND> *>(list)->push_back(w);
+    return TRUE;
+}
+
 LRESULT CALLBACK FrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
     return DefWindowProcA(window, message, wParam, lParam);
 }
@@ -651,13 +659,7 @@ void ProfileApply(UINT toolbars) {
     // with its children (docks and panes).
     t0 = NowUs();
     std::vector<HWND> popups;
-    EnumThreadWindows(
-        GetCurrentThreadId(),
-        [](HWND w, LPARAM list) -> BOOL {
-            reinterpret_cast<std::vector<HWND> *>(list)->push_back(w);
-            return TRUE;
-        },
-        reinterpret_cast<LPARAM>(&popups));
+    EnumThreadWindows(GetCurrentThreadId(), CollectWindow, reinterpret_cast<LPARAM>(&popups));
     UINT owned = 0;
     for (HWND w : popups)
         if (GetWindow(w, GW_OWNER) == frame) {

@@ -1,6 +1,8 @@
 // The demonstration host: what its pieces share.
 #pragma once
 
+#include <string>
+
 #include "quaybar.h"
 
 // Menu and control ids of the host's own.
@@ -20,6 +22,7 @@ int CALLBACK DemoHelpText(UINT id, UINT kind, LPSTR buffer, int size);
 
 // The settings file and the layout carried to and from it (settings.cpp).
 LPCSTR SettingsPath();
+std::string BesideProgram(LPCSTR fileName);
 void SaveLayout(ToolbarManager *manager, LPCSTR section);
 UINT RestoreLayout(ToolbarManager *manager, HWND frame, LPCSTR section);
 UINT LoadTextFile(HWND edit, LPCSTR path);

@@ -91,11 +91,7 @@ LRESULT OnMainCreate(HWND window) {
     QBR_SetRadioRange(mainManager, 304, 307, 304);
     CheckGlobals(window);
     mainToolbarsMenu = AddToolbarsMenu(window);
-    char program[260], drive[_MAX_DRIVE], directory[_MAX_DIR], text[MAX_PATH + 16];
-    GetModuleFileNameA(nullptr, program, sizeof(program));
-    _splitpath(program, drive, directory, nullptr, nullptr);
-    std::snprintf(text, sizeof(text), "%s%sQBRDEMO.TXT", drive, directory);
-    LoadTextFile(mainEdit, text);
+    LoadTextFile(mainEdit, BesideProgram("QBRDEMO.TXT").c_str());
     SetFocus(mainEdit);
     return 0;
 }

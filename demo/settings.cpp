@@ -1,5 +1,6 @@
 // The settings file beside the program, the layout carried to and from it,
 // and the text file shown in the edit control.
+#include <string>
 #include <vector>
 
 #include "demo.h"
@@ -12,6 +13,21 @@ LPCSTR SettingsPath() {
         if (length >= 3) lstrcpyA(path + length - 3, "INI");
     }
     return path;
+}
+
+std::string BesideProgram(LPCSTR fileName) {
+    // The program's full path, however long: the buffer grows while the path
+    // comes back cut (its length then equals the room given).
+    std::vector<char> path(MAX_PATH);
+    DWORD length = 0;
+    while ((length = GetModuleFileNameA(nullptr, path.data(), static_cast<DWORD>(path.size()))) == path.size() &&
+           path.size() < 32768)
+        path.resize(path.size() * 2);
+    std::string folder(path.data(), length);
+    // Everything up to the last separator is the folder; both kinds of slash
+    // are separators on Windows.
+    folder.erase(folder.find_last_of("\\/") + 1);
+    return folder + fileName;
 }
 
 // A profile string read whole, whatever its length: a frame with many

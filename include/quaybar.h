@@ -15,6 +15,12 @@
 
 #include <windows.h>
 
+/* The version of this interface. A host can test it at compile time, e.g.
+   #if QBR_VERSION >= 0x0105. The build reads its version from these lines. */
+#define QBR_VERSION_MAJOR 1
+#define QBR_VERSION_MINOR 5
+#define QBR_VERSION ((QBR_VERSION_MAJOR << 8) | QBR_VERSION_MINOR)
+
 #ifdef __cplusplus
 extern "C" {
 #endif

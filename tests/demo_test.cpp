@@ -212,6 +212,11 @@ TEST_F(DemoResources, StripsHaveTheirShapeAndTheViewStripReusesTheMainImages) {
                 ASSERT_EQ(PixelColour(main, (m % 23) * 16 + x, (m / 23) * 15 + y), RGB(0xC0, 0xC0, 0xC0)) << m;
 }
 
+// A dialog procedure that handles nothing. Callbacks are named functions, not
+// lambdas: a lambda converts only to the default calling convention, which on
+// 32-bit Windows is not CALLBACK's.
+INT_PTR CALLBACK NoDialogProc(HWND, UINT, WPARAM, LPARAM) { return FALSE; }
+
 TEST_F(DemoResources, IconAndAboutBoxArePresent) {
     EXPECT_NE(Resource("AppIcon", RT_GROUP_ICON), nullptr);
 
@@ -228,8 +233,7 @@ TEST_F(DemoResources, IconAndAboutBoxArePresent) {
     std::vector<BYTE> hidden(bytes, bytes + size);
     auto copy = reinterpret_cast<DLGTEMPLATE *>(hidden.data());
     copy->style &= ~WS_VISIBLE;
-    HWND box = CreateDialogIndirectParamA(
-        GetModuleHandleA(nullptr), copy, nullptr, [](HWND, UINT, WPARAM, LPARAM) -> INT_PTR { return FALSE; }, 0);
+    HWND box = CreateDialogIndirectParamA(GetModuleHandleA(nullptr), copy, nullptr, NoDialogProc, 0);
     ASSERT_NE(box, nullptr);
     char text[128] = "";
     GetWindowTextA(box, text, sizeof text);

@@ -62,21 +62,24 @@ namespace {
 
 // ---- Finding the program's windows -------------------------------------------------
 
+struct ClassSearch {
+    const char *name;
+    std::vector<HWND> found;
+};
+
+// A named CALLBACK function: a lambda converts only to the default calling
+// convention, which on 32-bit Windows is not CALLBACK's.
+BOOL CALLBACK CollectWindowOfClass(HWND window, LPARAM data) {
+    auto *s = reinterpret_cast<ClassSearch *>(data);
+    char name[64] = "";
+    GetClassNameA(window, name, sizeof name);
+    if (std::string(name) == s->name) s->found.push_back(window);
+    return TRUE;
+}
+
 std::vector<HWND> WindowsOfClass(const char *className) {
-    struct Search {
-        const char *name;
-        std::vector<HWND> found;
-    } search{className, {}};
-    EnumThreadWindows(
-        GetCurrentThreadId(),
-        [](HWND window, LPARAM data) -> BOOL {
-            auto *s = reinterpret_cast<Search *>(data);
-            char name[64] = "";
-            GetClassNameA(window, name, sizeof name);
-            if (std::string(name) == s->name) s->found.push_back(window);
-            return TRUE;
-        },
-        reinterpret_cast<LPARAM>(&search));
+    ClassSearch search{className, {}};
+    EnumThreadWindows(GetCurrentThreadId(), CollectWindowOfClass, reinterpret_cast<LPARAM>(&search));
     return search.found;
 }
 
@@ -181,6 +184,14 @@ class DemoViewTest : public ::testing::Test {
     }
     HWND mainWindow = nullptr;
 };
+
+// The main window shows the text file that sits beside the program (the
+// build copies QBRDEMO.TXT into the folder of the programs, this one's too).
+TEST_F(DemoViewTest, MainWindowShowsTheTextFileBesideTheProgram) {
+    char text[64] = "";
+    GetDlgItemTextA(mainWindow, kEditId, text, sizeof text);
+    EXPECT_EQ(std::string(text).rfind("Welcome to the Quaybar Demo", 0), 0u) << text;
+}
 
 TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
     HWND a = OpenView(), b = OpenView();

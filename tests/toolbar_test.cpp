@@ -296,18 +296,20 @@ TEST_F(ToolbarTest, CreationPlacesTheFrameAndShowsTheRightWindow) {
     EXPECT_EQ(0u, QBR_IsToolbarVisible(none));
 }
 
+// Window enumeration callbacks are named functions: a lambda converts only to
+// the default calling convention, which on 32-bit Windows is not CALLBACK's.
+BOOL CALLBACK CountChildWindow(HWND, LPARAM count) { return ++*reinterpret_cast<int *>(count), TRUE; }
+
+BOOL CALLBACK CountWindowAndChildren(HWND w, LPARAM count) {
+    ++*reinterpret_cast<int *>(count);
+    EnumChildWindows(w, CountChildWindow, count);
+    return TRUE;
+}
+
 // Counts the top-level and child windows of this thread.
 int CountWindows() {
     int n = 0;
-    EnumThreadWindows(
-        GetCurrentThreadId(),
-        [](HWND w, LPARAM p) -> BOOL {
-            ++*reinterpret_cast<int *>(p);
-            EnumChildWindows(
-                w, [](HWND, LPARAM q) -> BOOL { return ++*reinterpret_cast<int *>(q), TRUE; }, p);
-            return TRUE;
-        },
-        reinterpret_cast<LPARAM>(&n));
+    EnumThreadWindows(GetCurrentThreadId(), CountWindowAndChildren, reinterpret_cast<LPARAM>(&n));
     return n;
 }
 

@@ -254,7 +254,7 @@ UINT MeasureAfterDrop(HWND pane, int role, ToolbarItem *dropped, RECT *rect) {
         ToolbarItem *dropped;
         bool sideDocked;
         bool armed = false;
-        Drop(const PointerList *items, const RECT *edge) : ExtentVisitor(items, edge, false) {}
+        Drop(const PointerList *list, const RECT *edge) : ExtentVisitor(list, edge, false) {}
         void AfterRowHeight(ToolbarItem *item, bool, int &, int) override {
             if (item == dropped && !sideDocked) armed = true;
         }
@@ -315,7 +315,7 @@ UINT RewrapForMetrics(HWND window, int role, int newWidth, int newHeight, RECT *
         const PointerList *breaks;
         UINT nextBreakIndex = 0;
         int newWidth, newHeight;
-        Rewrap(const PointerList *items, const RECT *edge) : ExtentVisitor(items, edge, true) {}
+        Rewrap(const PointerList *list, const RECT *edge) : ExtentVisitor(list, edge, true) {}
         bool Size(ToolbarItem *item, int *w, int *h) override {
             UINT kind;
             if (ItemGetKind(item, &kind) && kind == ITEM_BUTTON) {
