@@ -16,8 +16,8 @@ lines, `#` starts a comment line:
 
     [quick-help-period]
     file: quickhelp/quickhelp.cpp
-    find: kQuickHelpPeriod = 200
-    replace: kQuickHelpPeriod = 300
+    find: constexpr UINT kHelpPeriod = 200;
+    replace: constexpr UINT kHelpPeriod = 300;
     tests: quickhelp_test
     equivalent: why no test can see the change (optional; the mutant is not run)
 
