@@ -60,12 +60,21 @@ static void PumpFor(DWORD milliseconds) {
 
 static void ClickAt(POINT at) {
     INPUT input[2];
+    int i;
     SetCursorPos(at.x, at.y);
     PumpFor(50);
+    /* The press and release carry the point themselves: a warp of the cursor
+       can be undone by a late pointer event of the window system (seen under
+       Wine), and the click must land on the button all the same. */
     ZeroMemory(input, sizeof(input));
-    input[0].type = input[1].type = INPUT_MOUSE;
-    input[0].mi.dwFlags = MOUSEEVENTF_LEFTDOWN;
-    input[1].mi.dwFlags = MOUSEEVENTF_LEFTUP;
+    for (i = 0; i < 2; ++i) {
+        input[i].type = INPUT_MOUSE;
+        input[i].mi.dx = (at.x * 65536 + GetSystemMetrics(SM_CXSCREEN) - 1) / GetSystemMetrics(SM_CXSCREEN);
+        input[i].mi.dy = (at.y * 65536 + GetSystemMetrics(SM_CYSCREEN) - 1) / GetSystemMetrics(SM_CYSCREEN);
+        input[i].mi.dwFlags = MOUSEEVENTF_MOVE | MOUSEEVENTF_ABSOLUTE;
+    }
+    input[0].mi.dwFlags |= MOUSEEVENTF_LEFTDOWN;
+    input[1].mi.dwFlags |= MOUSEEVENTF_LEFTUP;
     SendInput(2, input, sizeof(INPUT));
 }
 
