@@ -102,9 +102,16 @@ extern "C" UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName) 
     if (!client || !manager) return 0;
     HRSRC resource = FindResourceA(client->instance, resourceName, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
     if (!resource) return 0;
+    // A second call replaces the strip; the bitmap it replaces is the
+    // manager's alone and goes now, or it would stay made for the life of
+    // the process. Toolbars paint from the new one at their next paint.
+    // A failed load keeps the strip the toolbars have.
+    HBITMAP strip = LoadImageStrip(client->instance, resource);
+    if (!strip) return 0;
+    if (manager->imageStrip) GdiDelete(manager->imageStrip);
     manager->imageResource = resource;
-    manager->imageStrip = LoadImageStrip(client->instance, resource);
-    return manager->imageStrip ? 1 : 0;
+    manager->imageStrip = strip;
+    return 1;
 }
 
 extern "C" UINT QBR_GetToolbarCount(ToolbarManager *manager) {
