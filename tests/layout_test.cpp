@@ -127,7 +127,7 @@ TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
     Entries again = Capture(otherManager);
     ASSERT_FALSE(again.empty());
     EXPECT_EQ("Top Dock", again[0].first);
-    EXPECT_EQ("Short,Long,Words,Short", again[0].second);
+    EXPECT_EQ("Short,Long,Words,%%53hort", again[0].second) << "the second \"Short\" gets a key of its own";
     // Toolbars in the order the dock value names them; "Missing" and the
     // empty title have no line, and the second "Short" finds its value used up.
     ASSERT_EQ(6u, QBR_GetToolbarCount(otherManager));
@@ -163,7 +163,7 @@ TEST_F(LayoutTest, CountsAreReadAsTheyStand) {
     EXPECT_TRUE(ToolbarIds(named).empty());
     Entries again = Capture(otherManager);
     ASSERT_FALSE(again.empty());
-    EXPECT_EQ("Twelve,Most,Top Dock", again[0].second) << "a skipped toolbar has no place in its dock";
+    EXPECT_EQ("Twelve,Most,%%54op%20%44ock", again[0].second) << "a skipped toolbar has no place in its dock";
 }
 
 // A value of a megabyte restores as a short one does: a dock value of 100,000
@@ -189,6 +189,42 @@ TEST_F(LayoutTest, AMegabyteLineRestores) {
     RECT frameRect;
     GetWindowRect(ResolveRoleWindow(pane, ROLE_FLOATING), &frameRect);
     EXPECT_EQ(Rect(300, 100, 420, 150), frameRect);
+}
+
+// Titles a settings file could not carry as keys (blanks, '=', a leading ';'
+// or '[', leading and trailing blanks, a comma, a dock's key, a title that
+// differs from another only in case, the same title twice) are stored under
+// escaped keys, in the keys and the dock values alike; a restore gives every
+// title back as it was. Ordinary titles keep their own key.
+TEST_F(LayoutTest, TitlesASettingsFileCannotCarryGetEscapedKeys) {
+    HWND top = MakeDock(DOCK_TOP);
+    const char *titles[] = {"Plain", "   ", "a=b", ";semi", "[brack", " both ", "x,y", "top dock",
+                            "Top Dock", "plain", "Plain", "%41", "50% off"};
+    const UINT ids[] = {101};
+    for (const char *title : titles)
+        QBR_CreateToolbar(title, TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 1);
+    Pump();
+    Entries entries = Capture(manager);
+    ASSERT_EQ(14u, entries.size());
+    const std::vector<std::string> keys = {"Plain",    "%%20%20%20",  "%a%3Db",   "%%3Bsemi", "%%5Bbrack",
+                                           "%%20both%20", "%x%2Cy",   "%top%20dock", "%%54op%20%44ock",
+                                           "%plain",   "%%50lain",    "%%2541",   "50% off"};
+    std::string dockValue;
+    for (size_t i = 0; i < keys.size(); ++i) {
+        EXPECT_EQ(keys[i], entries[i + 1].first) << "title \"" << titles[i] << "\"";
+        dockValue += (i ? "," : "") + keys[i];
+    }
+    EXPECT_EQ(dockValue, entries[0].second);
+    otherManager = SecondManager();
+    Apply(otherManager, other, entries);
+    ASSERT_EQ(13u, QBR_GetToolbarCount(otherManager));
+    for (UINT i = 0; i < 13; ++i) {
+        char title[256] = "";
+        QBR_GetToolbarTitle(QBR_GetToolbar(otherManager, i), title, sizeof title);
+        EXPECT_STREQ(titles[i], title);
+        EXPECT_EQ((std::vector<UINT>{101}), ToolbarIds(QBR_GetToolbar(otherManager, i))) << titles[i];
+    }
+    EXPECT_EQ(entries, Capture(otherManager)) << "the same keys at the next capture";
 }
 
 TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
