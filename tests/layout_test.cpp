@@ -143,12 +143,25 @@ TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
 // skips its toolbar. A dock value naming its own key reads on from itself.
 TEST_F(LayoutTest, CountsAreReadAsTheyStand) {
     otherManager = SecondManager();
-    Apply(otherManager, other,
-          {{"Top Dock", "Twelve,Most,Beyond,Top Dock,Never"},
-           {"Twelve", "12,101,102,0,0,0,0"},
-           {"Most", "3,103,104,105,17,0,0,90,40"},
-           {"Beyond", "65536,101,17,0,0,90,40"},
-           {"Never", "1,106,17,0,0,90,40"}});
+    const Entries entries = {{"Top Dock", "Twelve,Most,Beyond,Top Dock,Never"},
+                             {"Twelve", "12,101,102,0,0,0,0"},
+                             {"Most", "3,103,104,105,17,0,0,90,40,99"},
+                             {"Beyond", "65536,101,17,0,0,90,40"},
+                             {"Never", "1,106,17,0,0,90,40"}};
+    ASSERT_EQ(1u, QBR_BeginLayout());
+    for (const auto &e : entries)
+        ASSERT_EQ(1u, QBR_AddLayoutEntry(e.first.c_str(), e.second.c_str()));
+    EXPECT_EQ(1u, QBR_ApplyLayout(otherManager, other));
+    // What was read is used up, and only that: the table serves one apply.
+    const Entries usedUp = {{"Top Dock", ""}, {"Twelve", ""}, {"Most", "99"}, {"Beyond", "101,17,0,0,90,40"},
+                            {"Never", "1,106,17,0,0,90,40"}};
+    for (UINT i = 0; i < usedUp.size(); ++i) {
+        char key[64] = "", value[64] = "";
+        QBR_GetLayoutEntry(i, key, value);
+        EXPECT_EQ(usedUp[i], (std::pair<std::string, std::string>{key, value}));
+    }
+    QBR_FreeLayout();
+    Pump();
     ASSERT_EQ(4u, QBR_GetToolbarCount(otherManager));
     HWND twelve = QBR_GetToolbar(otherManager, 0);
     EXPECT_EQ((std::vector<UINT>{101, 102, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0}), ToolbarIds(twelve));
