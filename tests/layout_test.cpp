@@ -153,7 +153,10 @@ TEST_F(LayoutTest, CountsAreReadAsTheyStand) {
         ASSERT_EQ(1u, QBR_AddLayoutEntry(e.first.c_str(), e.second.c_str()));
     EXPECT_EQ(1u, QBR_ApplyLayout(otherManager, other));
     // What was read is used up, and only that: the table serves one apply.
-    const Entries usedUp = {{"Top Dock", ""}, {"Twelve", ""}, {"Most", "99"}, {"Beyond", "101,17,0,0,90,40"},
+    const Entries usedUp = {{"Top Dock", ""},
+                            {"Twelve", ""},
+                            {"Most", "99"},
+                            {"Beyond", "101,17,0,0,90,40"},
                             {"Never", "1,106,17,0,0,90,40"}};
     for (UINT i = 0; i < usedUp.size(); ++i) {
         char key[64] = "", value[64] = "";
@@ -211,17 +214,17 @@ TEST_F(LayoutTest, AMegabyteLineRestores) {
 // title back as it was. Ordinary titles keep their own key.
 TEST_F(LayoutTest, TitlesASettingsFileCannotCarryGetEscapedKeys) {
     HWND top = MakeDock(DOCK_TOP);
-    const char *titles[] = {"Plain", "   ", "a=b", ";semi", "[brack", " both ", "x,y", "top dock",
-                            "Top Dock", "plain", "Plain", "%41", "50% off"};
+    const char *titles[] = {"Plain",    "   ",      "a=b",   ";semi", "[brack", " both ", "x,y",
+                            "top dock", "Top Dock", "plain", "Plain", "%41",    "50% off"};
     const UINT ids[] = {101};
     for (const char *title : titles)
         QBR_CreateToolbar(title, TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 1);
     Pump();
     Entries entries = Capture(manager);
     ASSERT_EQ(14u, entries.size());
-    const std::vector<std::string> keys = {"Plain",    "%%20%20%20",  "%a%3Db",   "%%3Bsemi", "%%5Bbrack",
-                                           "%%20both%20", "%x%2Cy",   "%top%20dock", "%%54op%20%44ock",
-                                           "%plain",   "%%50lain",    "%%2541",   "50% off"};
+    const std::vector<std::string> keys = {"Plain",       "%%20%20%20", "%a%3Db",      "%%3Bsemi",        "%%5Bbrack",
+                                           "%%20both%20", "%x%2Cy",     "%top%20dock", "%%54op%20%44ock", "%plain",
+                                           "%%50lain",    "%%2541",     "50% off"};
     std::string dockValue;
     for (size_t i = 0; i < keys.size(); ++i) {
         EXPECT_EQ(keys[i], entries[i + 1].first) << "title \"" << titles[i] << "\"";

@@ -449,8 +449,8 @@ TEST_F(PaintTest, DisabledOnButtonMatchesTheRulesEveryPixel) {
         for (int py = 0; py < 40; ++py)
             for (int px = 0; px < 40; ++px)
                 if (canvas.At(px, py) != want[static_cast<size_t>(py * 40 + px)] && ++wrong <= 5)
-                    ADD_FAILURE() << "image " << id - 1 << " at (" << px - left << ", " << py - top << "): "
-                                  << Hex(canvas.At(px, py)) << ", the rules give "
+                    ADD_FAILURE() << "image " << id - 1 << " at (" << px - left << ", " << py - top
+                                  << "): " << Hex(canvas.At(px, py)) << ", the rules give "
                                   << Hex(want[static_cast<size_t>(py * 40 + px)]);
         EXPECT_EQ(0, wrong) << "image " << id - 1;
     }
