@@ -1,8 +1,6 @@
 // The arrangement of a manager's docks and toolbars as a table of text keys
 // and values. The library never touches the settings file; the host carries
 // the table to and from it.
-#include <set>
-#include <string>
 #include <vector>
 
 #include "core/core.h"
@@ -83,110 +81,6 @@ extern "C" UINT QBR_GetLayoutEntrySize(UINT index, UINT *keyLength, UINT *valueL
     return 1;
 }
 
-// ---- Keys a settings file can carry -----------------------------------------
-// A toolbar's key is its title. A settings store such as a private-profile
-// file trims blanks around a key, ends it at '=', takes a line that starts
-// with ';' or '[' for no key at all and compares keys without regard to case,
-// and a dock's value joins titles with commas. A title that would not come
-// back through such a store unchanged, and alone, is stored under an escaped
-// key instead:
-//
-//   %  then the title, every byte but a lower-case letter, a digit or plain
-//      punctuation written as %XX (two upper-case hex digits),
-//   and %#n behind it for the n-th toolbar whose title gives the same key.
-//
-// "  " is stored as %%20%20, "a=b" as %a%3Db, and of "standard" and
-// "Standard" the later as %%53tandard. The escaped form has no blank, no '=' and no comma, and two
-// of them differ whatever the case. Ordinary titles keep their own key.
-
-static bool IsBlank(unsigned char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
-
-static bool IsOrdinaryTitle(const std::string &title) {
-    if (title.empty()) return false;
-    const unsigned char first = title.front(), last = title.back();
-    if (IsBlank(first) || IsBlank(last) || first == ';' || first == '[' || first == '%' || first == '"' || last == '"')
-        return false;
-    for (unsigned char c : title)
-        if (c < 0x20 || c == 0x7F || c == '=' || c == ',') return false;
-    return true;
-}
-
-static bool StaysInEscapedKey(unsigned char c) {
-    if (c <= 0x20 || c >= 0x7F || (c >= 'A' && c <= 'Z')) return false;
-    for (const char *p = "%=,;[\""; *p; ++p)
-        if (c == static_cast<unsigned char>(*p)) return false;
-    return true;
-}
-
-// The key as the store compares it: without regard to case.
-static std::string Folded(std::string key) {
-    if (!key.empty()) CharUpperBuffA(&key[0], static_cast<DWORD>(key.size()));
-    return key;
-}
-
-// The keys given out by one capture, and the dock keys, which no toolbar may take.
-class LayoutKeys {
-  public:
-    LayoutKeys() {
-        for (UINT side = DOCK_TOP; side <= DOCK_RIGHT; ++side)
-            taken_.insert(Folded(LoadLibraryText(kDockKeyBase + side)));
-    }
-    // Replaces the title in *key by the key it is stored under.
-    UINT Fit(LPSTR *key) {
-        const std::string title = *key;
-        if (IsOrdinaryTitle(title) && taken_.insert(Folded(title)).second) return 1;
-        std::string escaped = "%";
-        for (unsigned char c : title) {
-            if (StaysInEscapedKey(c)) {
-                escaped += static_cast<char>(c);
-            } else {
-                char hex[4];
-                wsprintfA(hex, "%%%02X", c);
-                escaped += hex;
-            }
-        }
-        std::string unique = escaped;
-        for (UINT n = 2; !taken_.insert(Folded(unique)).second; ++n)
-            unique = escaped + "%#" + std::to_string(n);
-        if (unique == title) return 1;
-        LPSTR copy = nullptr;
-        if (!StringDuplicate(&copy, unique.c_str())) return 0;
-        MemoryBlockFree(*key);
-        *key = copy;
-        return 1;
-    }
-
-  private:
-    std::set<std::string> taken_;
-};
-
-static int HexValue(char c) {
-    if (c >= '0' && c <= '9') return c - '0';
-    if (c >= 'A' && c <= 'F') return c - 'A' + 10;
-    if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-    return -1;
-}
-
-// The title a key stands for. A key that does not read as an escaped one is
-// a title of its own, as a hand-written file may hold.
-static std::string TitleOfKey(LPCSTR key) {
-    if (key[0] != '%') return key;
-    std::string title;
-    for (LPCSTR p = key + 1; *p; ++p) {
-        if (*p != '%') {
-            if (!StaysInEscapedKey(static_cast<unsigned char>(*p))) return key;
-            title += *p;
-            continue;
-        }
-        if (p[1] == '#') break; // the number of a repeated title
-        const int high = HexValue(p[1]), low = high < 0 ? -1 : HexValue(p[2]);
-        if (low < 0) return key;
-        title += static_cast<char>(high * 16 + low);
-        p += 2;
-    }
-    return title;
-}
-
 // ---- Capture --------------------------------------------------------------------
 
 UINT FormatToolbarLayout(ToolbarRecord *toolbar, LPSTR *key, LPSTR *value) {
@@ -228,7 +122,7 @@ static void FreeEntries(LPSTR *keys, LPSTR *values, UINT count) {
     MemoryBlockFree(values);
 }
 
-UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count, LayoutKeys *names) {
+UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count) {
     UINT n = PointerListCount(dock->toolbars) + 1;
     *keys = *values = nullptr;
     *count = 0;
@@ -246,8 +140,8 @@ UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count
     }
     for (UINT i = 1; i < n; ++i) {
         ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i - 1);
-        if (!FormatToolbarLayout(toolbar, &(*keys)[i], &(*values)[i]) || (names && !names->Fit(&(*keys)[i])) ||
-            (i > 1 && !StringAppend(&(*values)[0], ",")) || !StringAppend(&(*values)[0], (*keys)[i])) {
+        if (!FormatToolbarLayout(toolbar, &(*keys)[i], &(*values)[i]) || (i > 1 && !StringAppend(&(*values)[0], ",")) ||
+            !StringAppend(&(*values)[0], (*keys)[i])) {
             FreeEntries(*keys, *values, n);
             return 0;
         }
@@ -260,11 +154,10 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
     if (count) *count = 0;
     if (!QBR_BeginLayout()) return 0;
     if (!manager) return 1;
-    LayoutKeys names;
     for (UINT d = 0; d < PointerListCount(manager->docks); ++d) {
         LPSTR *keys, *values;
         UINT n;
-        if (!CaptureDockLayout(ListAt<DockArea>(manager->docks, d), &keys, &values, &n, &names)) {
+        if (!CaptureDockLayout(ListAt<DockArea>(manager->docks, d), &keys, &values, &n)) {
             QBR_FreeLayout();
             return 0;
         }
@@ -364,8 +257,7 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
                 // tidied up below.
                 LPCSTR title = NextToken(&cursors[dockIndex]);
                 UINT index;
-                if (FindLayoutIndex(keys, count, title, &index))
-                    RestoreToolbarAt(dock, TitleOfKey(title).c_str(), &cursors[index]);
+                if (FindLayoutIndex(keys, count, title, &index)) RestoreToolbarAt(dock, title, &cursors[index]);
             }
         }
         RelayoutDock(dock);

@@ -5,11 +5,7 @@
 
 extern UINT layoutCount;
 
-// The keys one capture has given out; with it a toolbar whose title a
-// settings file could not carry gets an escaped key, without it every key is
-// the title as it stands.
-class LayoutKeys;
-UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count, LayoutKeys *names = nullptr);
+UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count);
 UINT FormatToolbarLayout(ToolbarRecord *toolbar, LPSTR *key, LPSTR *value);
 UINT FindLayoutValue(LPSTR *keys, LPSTR *values, UINT count, LPCSTR key, LPSTR *value);
 UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR *values, UINT count);

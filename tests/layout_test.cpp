@@ -127,7 +127,7 @@ TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
     Entries again = Capture(otherManager);
     ASSERT_FALSE(again.empty());
     EXPECT_EQ("Top Dock", again[0].first);
-    EXPECT_EQ("Short,Long,Words,%%53hort", again[0].second) << "the second \"Short\" gets a key of its own";
+    EXPECT_EQ("Short,Long,Words,Short", again[0].second);
     // Toolbars in the order the dock value names them; "Missing" and the
     // empty title have no line, and the second "Short" finds its value used up.
     ASSERT_EQ(6u, QBR_GetToolbarCount(otherManager));
@@ -179,7 +179,7 @@ TEST_F(LayoutTest, CountsAreReadAsTheyStand) {
     EXPECT_TRUE(ToolbarIds(named).empty());
     Entries again = Capture(otherManager);
     ASSERT_FALSE(again.empty());
-    EXPECT_EQ("Twelve,Most,%%54op%20%44ock", again[0].second) << "a skipped toolbar has no place in its dock";
+    EXPECT_EQ("Twelve,Most,Top Dock", again[0].second) << "a skipped toolbar has no place in its dock";
 }
 
 // A value of a megabyte restores as a short one does: a dock value of 100,000
@@ -207,40 +207,67 @@ TEST_F(LayoutTest, AMegabyteLineRestores) {
     EXPECT_EQ(Rect(300, 100, 420, 150), frameRect);
 }
 
-// Titles a settings file could not carry as keys (blanks, '=', a leading ';'
-// or '[', leading and trailing blanks, a comma, a dock's key, a title that
-// differs from another only in case, the same title twice) are stored under
-// escaped keys, in the keys and the dock values alike; a restore gives every
-// title back as it was. Ordinary titles keep their own key.
-TEST_F(LayoutTest, TitlesASettingsFileCannotCarryGetEscapedKeys) {
+// Keys are titles as they stand, whatever a settings file makes of them, and
+// a dock's value joins them with commas. A title with a comma comes back as
+// two titles that name no entry: that toolbar alone is lost. Two toolbars of
+// one title share the first entry of that key, which the first of them uses up.
+TEST_F(LayoutTest, TitlesGoThroughTheTableAsTheyStand) {
     HWND top = MakeDock(DOCK_TOP);
-    const char *titles[] = {"Plain",    "   ",      "a=b",   ";semi", "[brack", " both ", "x,y",
-                            "top dock", "Top Dock", "plain", "Plain", "%41",    "50% off"};
-    const UINT ids[] = {101};
-    for (const char *title : titles)
-        QBR_CreateToolbar(title, TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 1);
+    const char *titles[] = {"Plain", "   ",   "a=b",   ";semi", "[brack", " both ",
+                            "x,y",   "plain", "Twice", "%41",   "Twice"};
+    const UINT one[] = {101}, two[] = {102, 103};
+    for (UINT i = 0; i < 11; ++i)
+        QBR_CreateToolbar(titles[i], TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, i == 10 ? two : one, i == 10 ? 2 : 1);
     Pump();
     Entries entries = Capture(manager);
-    ASSERT_EQ(14u, entries.size());
-    const std::vector<std::string> keys = {"Plain",       "%%20%20%20", "%a%3Db",      "%%3Bsemi",        "%%5Bbrack",
-                                           "%%20both%20", "%x%2Cy",     "%top%20dock", "%%54op%20%44ock", "%plain",
-                                           "%%50lain",    "%%2541",     "50% off"};
-    std::string dockValue;
-    for (size_t i = 0; i < keys.size(); ++i) {
-        EXPECT_EQ(keys[i], entries[i + 1].first) << "title \"" << titles[i] << "\"";
-        dockValue += (i ? "," : "") + keys[i];
-    }
-    EXPECT_EQ(dockValue, entries[0].second);
+    ASSERT_EQ(12u, entries.size());
+    EXPECT_EQ((std::pair<std::string, std::string>{"Top Dock",
+                                                   "Plain,   ,a=b,;semi,[brack, both ,x,y,plain,Twice,%41,Twice"}),
+              entries[0]);
+    for (size_t i = 0; i < 11; ++i)
+        EXPECT_EQ(titles[i], entries[i + 1].first);
+    EXPECT_EQ("2,102,103", entries[11].second.substr(0, 9));
+
     otherManager = SecondManager();
     Apply(otherManager, other, entries);
-    ASSERT_EQ(13u, QBR_GetToolbarCount(otherManager));
-    for (UINT i = 0; i < 13; ++i) {
+    // Every title but "x,y" comes back, in the dock's order; "x" and "y" name nothing.
+    const char *back[] = {"Plain", "   ", "a=b", ";semi", "[brack", " both ", "plain", "Twice", "%41", "Twice"};
+    ASSERT_EQ(10u, QBR_GetToolbarCount(otherManager));
+    for (UINT i = 0; i < 10; ++i) {
+        HWND pane = QBR_GetToolbar(otherManager, i);
         char title[256] = "";
-        QBR_GetToolbarTitle(QBR_GetToolbar(otherManager, i), title, sizeof title);
-        EXPECT_STREQ(titles[i], title);
-        EXPECT_EQ((std::vector<UINT>{101}), ToolbarIds(QBR_GetToolbar(otherManager, i))) << titles[i];
+        QBR_GetToolbarTitle(pane, title, sizeof title);
+        EXPECT_STREQ(back[i], title);
+        if (i == 9) {
+            EXPECT_TRUE(ToolbarIds(pane).empty()) << "the second \"Twice\" finds the first one's value used up";
+            EXPECT_EQ(0u, QBR_GetToolbarFlags(pane));
+        } else {
+            EXPECT_EQ((std::vector<UINT>{101}), ToolbarIds(pane)) << back[i];
+            EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), QBR_GetToolbarFlags(pane)) << back[i];
+        }
     }
-    EXPECT_EQ(entries, Capture(otherManager)) << "the same keys at the next capture";
+}
+
+// In a file two toolbars of one title share one line, the later write wins,
+// and a toolbar titled like a dock key takes that dock's line: applied, such
+// a table brings back no toolbar of that dock, and the toolbar itself finds
+// its value used up.
+TEST_F(LayoutTest, ATitleLikeADockKeyTakesThatDocksLine) {
+    otherManager = SecondManager();
+    Apply(otherManager, other,
+          {{"Top Dock", "1,104,17,0,0,90,40"},
+           {"Standard", "1,101,17,0,0,90,40"},
+           {"Left Dock", "Top Dock,Column"},
+           {"Column", "1,102,17,0,0,90,40"}});
+    ASSERT_NE(nullptr, QBR_GetDock(otherManager, DOCK_TOP)) << "the dock is made from its key";
+    ASSERT_EQ(2u, QBR_GetToolbarCount(otherManager)) << "no toolbar of the top dock";
+    HWND named = QBR_GetToolbar(otherManager, 0);
+    char title[256] = "";
+    QBR_GetToolbarTitle(named, title, sizeof title);
+    EXPECT_STREQ("Top Dock", title);
+    EXPECT_TRUE(ToolbarIds(named).empty());
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(named));
+    EXPECT_EQ((std::vector<UINT>{102}), ToolbarIds(QBR_GetToolbar(otherManager, 1)));
 }
 
 TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
