@@ -594,6 +594,72 @@ void BenchLayout(const std::vector<UINT> &counts) {
     }
 }
 
+// Closing a frame of 200 toolbars (150 docked in two docks, 50 floating):
+// QBR_DestroyManager alone, each dock packed once, empty. And settings lines
+// of a megabyte: a dock value of 100,000 titles that name nothing before one
+// toolbar, and a toolbar value of 60,000 ids that the catalog lacks around
+// its 10 buttons; both are read in time linear in their length.
+void BenchDestroyAndLongLines() {
+    Header("Destroying a manager; settings lines of a megabyte");
+    const int reps = std::max(3, repetitions / 2);
+    Scene s;
+    Stats destroyed = MeasureOnce(
+        [&] {
+            s = MakeScene(100, 10, false);
+            HWND left = QBR_CreateDock(s.manager, s.frame, DOCK_LEFT);
+            std::vector<UINT> ids(10);
+            for (UINT t = 0; t < 100; ++t) {
+                for (UINT i = 0; i < 10; ++i)
+                    ids[i] = kFirstId + (t * 10 + i) % kCatalog;
+                char name[32];
+                wsprintfA(name, "Side %u", t);
+                const UINT flags = t % 2 ? TBF_VISIBLE | TBF_FLOATING : TBF_VISIBLE | TBF_DOCKED;
+                QBR_CreateToolbar(name, flags, 100 + t, 100 + t, 0, 0, left, ids.data(), 10);
+            }
+            Pump();
+        },
+        [&] { QBR_DestroyManager(s.manager); },
+        [&] {
+            DestroyWindow(s.frame);
+            Pump();
+            s = Scene();
+        },
+        reps);
+    Row("QBR_DestroyManager, 200 toolbars in 2 docks", destroyed);
+
+    std::string titles, items = "60000";
+    for (int i = 0; i < 100000; ++i)
+        titles += "Nobody,";
+    titles += "Long";
+    for (int i = 0; i < 60000; ++i) {
+        char id[24];
+        wsprintfA(id, i % 6000 == 3000 ? ",%u" : ",000000000000%u", i % 6000 == 3000 ? kFirstId + i / 6000 : 99999u);
+        items += id;
+    }
+    items += ",33,300,100,500,160";
+    Scene fresh;
+    auto setup = [&](const std::string &dockValue, const std::string &toolbarValue) {
+        return [&, dockValue, toolbarValue] {
+            fresh.frame = MakeFrame();
+            fresh.manager = MakeManager(fresh.frame);
+            QBR_BeginLayout();
+            QBR_AddLayoutEntry("Top Dock", dockValue.c_str());
+            QBR_AddLayoutEntry("Long", toolbarValue.c_str());
+        };
+    };
+    auto apply = [&] { QBR_ApplyLayout(fresh.manager, fresh.frame); };
+    auto teardown = [&] {
+        QBR_FreeLayout();
+        DestroyScene(fresh);
+    };
+    char name[80];
+    snprintf(name, sizeof name, "apply a %u KB dock line", static_cast<UINT>(titles.size() / 1024));
+    Row(name, MeasureOnce(setup(titles, "10,1000,1001,1002,1003,1004,1005,1006,1007,1008,1009,33,300,100,500,160"),
+                          apply, teardown, reps));
+    snprintf(name, sizeof name, "apply a %u KB toolbar line", static_cast<UINT>(items.size() / 1024));
+    Row(name, MeasureOnce(setup("Long", items), apply, teardown, reps));
+}
+
 // Where an apply spends its time: the steps that restoring one toolbar takes,
 // each on its own clock, summed over all toolbars, then the queue drained.
 void ProfileApply(UINT toolbars) {
@@ -817,7 +883,7 @@ void BenchGrowth() {
 
 int main(int argc, char **argv) {
     bool quick = false;
-    std::string only; // a section name: state, text, drop, layout, growth, profile
+    std::string only; // a section name: state, text, drop, layout, growth, close, profile
     for (int i = 1; i < argc; ++i) {
         if (lstrcmpA(argv[i], "--quick") == 0)
             quick = true;
@@ -855,6 +921,7 @@ int main(int argc, char **argv) {
     if (wanted("drop")) BenchDrop();
     if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 200} : std::vector<UINT>{4, 200, 1000});
     if (wanted("growth")) BenchGrowth();
+    if (wanted("close")) BenchDestroyAndLongLines();
     if (wanted("profile")) {
         ProfileApply(200);
         if (!quick) ProfileApply(1000);

@@ -54,6 +54,15 @@ int ReadTokenInt(LPSTR text);
 UINT ReadTokenId(LPSTR text);
 UINT ReadTokenFlags(LPSTR text);
 void ReadTokenText(LPSTR text, LPSTR out);
+// The same tokens read without moving the text: each read moving the rest of
+// a value to its front costs time quadratic in the value's length. NextToken
+// cuts the token at *cursor in place (its comma becomes the terminator) and
+// moves *cursor past it; NextTokenInt parses it as ReadTokenInt does.
+// TakeTokensRead then moves what is left at `cursor` to the front of `text`
+// once, which leaves the text as the moving readers would have.
+LPSTR NextToken(LPSTR *cursor);
+int NextTokenInt(LPSTR *cursor);
+void TakeTokensRead(LPSTR text, LPCSTR cursor);
 
 // ---- Client registry -----------------------------------------------------
 extern PointerList *clientTable;

@@ -1,9 +1,12 @@
 // The toolbar manager of a frame window, its item catalog, the button setters
 // and the library's two sources of text.
+#include <vector>
+
 #include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
 #include "dock/dock.h"
+#include "input/input.h"
 #include "paint/paint.h"
 #include "quickhelp/quickhelp.h"
 #include "toolbar/toolbar.h"
@@ -39,28 +42,47 @@ extern "C" ToolbarManager *QBR_CreateManager(HWND frame) {
     return manager;
 }
 
+// Nothing of the library may keep pointing into this manager once it is
+// freed: not the toolbar lookup cache, not the quick-help tip, not a press,
+// drag or menu under way.
+static void ForgetEverywhere(const ToolbarManager *manager) {
+    ForgetManager(manager);
+    QuickHelpForgetManager(manager);
+    MouseTrackForgetManager(manager);
+}
+
 extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     ToolbarClient *client = CurrentClient();
     if (!client || !manager) return;
-    // Nothing may keep pointing into this manager once it is freed: not the
-    // toolbar lookup cache, not the quick-help tip.
-    ForgetManager(manager);
-    QuickHelpForgetManager(manager);
-    // Everything goes at once: the docks let go of their toolbars first, so
-    // that no dock is laid out again for every toolbar that leaves it (with
-    // many toolbars that alone took minutes).
-    for (UINT i = 0; i < PointerListCount(manager->docks); ++i)
-        if (DockArea *dock = ListAt<DockArea>(manager->docks, i))
-            while (UINT count = PointerListCount(dock->toolbars))
-                PointerListRemoveAt(dock->toolbars, count - 1);
-    while (UINT count = PointerListCount(manager->toolbars))
-        DestroyToolbarRecord(ListAt<ToolbarRecord>(manager->toolbars, count - 1));
+    ForgetEverywhere(manager);
+    // Every toolbar leaves its dock and goes. A dock is packed once, after
+    // the last of its toolbars has left, not once per toolbar as each removal
+    // alone would do (moving every remaining pane each time, which with many
+    // toolbars took minutes). Packed empty, each dock hides and the frame
+    // hears WM_SIZE with both parameters 0, the change the host lays out by;
+    // the top dock goes first, since the side docks start below it.
+    std::vector<DockArea *> emptied;
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i)
+        if (PointerListCount(dock->toolbars)) emptied.push_back(dock);
+    {
+        DeferDockPacking deferred;
+        while (ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, 0))
+            DestroyToolbarRecord(record);
+    }
     PointerListDestroy(manager->toolbars);
     manager->toolbars = nullptr;
+    for (bool top : {true, false})
+        for (DockArea *dock : emptied)
+            if ((dock->side == DOCK_TOP) == top) PackDock(dock);
+    // The dock windows and panes live on until the host destroys its frame;
+    // freeing a dock's record clears the dock window's word, so no message
+    // that reaches them afterwards can find this manager.
     while (DockArea *dock = ListAt<DockArea>(manager->docks, 0))
         FreeDockRecord(dock);
     PointerListDestroy(manager->docks);
     manager->docks = nullptr;
+    // The host's WM_SIZE handler ran while the records still stood.
+    ForgetEverywhere(manager);
     while (ToolbarItem *item = ListAt<ToolbarItem>(manager->items, 0))
         ItemRemove(manager, item);
     PointerListDestroy(manager->items);
@@ -103,9 +125,16 @@ extern "C" UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName) 
     if (!client || !manager) return 0;
     HRSRC resource = FindResourceA(client->instance, resourceName, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
     if (!resource) return 0;
+    // A second call replaces the strip; the bitmap it replaces is the
+    // manager's alone and goes now, or it would stay made for the life of
+    // the process. Toolbars paint from the new one at their next paint.
+    // A failed load keeps the strip the toolbars have.
+    HBITMAP strip = LoadImageStrip(client->instance, resource);
+    if (!strip) return 0;
+    if (manager->imageStrip) GdiDelete(manager->imageStrip);
     manager->imageResource = resource;
-    manager->imageStrip = LoadImageStrip(client->instance, resource);
-    return manager->imageStrip ? 1 : 0;
+    manager->imageStrip = strip;
+    return 1;
 }
 
 extern "C" UINT QBR_GetToolbarCount(ToolbarManager *manager) {

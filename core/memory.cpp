@@ -238,21 +238,36 @@ static int ParseTokenNumber(LPCSTR p) {
     return static_cast<int>(negative ? 0u - value : value);
 }
 
+// The token at *cursor, cut at the first comma; *cursor moves on past the
+// comma, or to the terminator after the last token.
+LPSTR NextToken(LPSTR *cursor) {
+    LPSTR token = *cursor;
+    LPSTR comma = FindCharOrEnd(token, ',');
+    *cursor = comma;
+    if (*comma) {
+        *comma = '\0';
+        *cursor = comma + 1;
+    }
+    return token;
+}
+
+void TakeTokensRead(LPSTR text, LPCSTR cursor) {
+    if (!text || !cursor || cursor == text) return;
+    // The copy runs forward, to lower addresses, so overlapping is safe here.
+    LPSTR d = text;
+    while ((*d++ = *cursor++) != '\0') {
+    }
+}
+
 // Steps 1, 2 and 4 of every token reader: cut the token at the first comma,
 // hand it to `take`, then move what followed the comma to the front.
 template <typename Take> static void ConsumeToken(LPSTR text, Take take) {
-    LPSTR comma = FindCharOrEnd(text, ',');
-    LPSTR rest = comma;
-    if (*comma) {
-        *comma = '\0';
-        rest = comma + 1;
-    }
-    take(static_cast<LPCSTR>(text));
-    // The copy runs forward, to lower addresses, so overlapping is safe here.
-    LPSTR d = text;
-    while ((*d++ = *rest++) != '\0') {
-    }
+    LPSTR rest = text;
+    take(static_cast<LPCSTR>(NextToken(&rest)));
+    TakeTokensRead(text, rest);
 }
+
+int NextTokenInt(LPSTR *cursor) { return ParseTokenNumber(NextToken(cursor)); }
 
 int ReadTokenInt(LPSTR text) {
     int value = 0;

@@ -109,6 +109,10 @@ void FreeDockRecord(DockArea *dock) {
     PointerListDestroy(dock->toolbars);
     dock->toolbars = nullptr;
     if (ToolbarManager *manager = OwnerOfDock(dock)) PointerListRemove(manager->docks, ListValue(dock));
+    // The window outlives its record (a manager's docks die with the frame,
+    // later): its word no longer names a manager, so neither the dock nor the
+    // panes inside it can reach one that may be freed by then.
+    if (DockManager(dock->window)) SetWindowLongPtrA(dock->window, kDockManagerWord, 0);
     MemoryBlockFree(dock);
 }
 

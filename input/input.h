@@ -21,6 +21,9 @@ struct MouseTrack {
 };
 
 extern MouseTrack mouseTrack;
+// A manager is about to be freed: a press, drag or menu that names one of its
+// items or toolbars lets go of it.
+void MouseTrackForgetManager(const ToolbarManager *manager);
 extern UINT appActive;
 extern UINT borderSizing;
 

@@ -12,6 +12,16 @@ UINT borderSizing = 0;
 
 constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
 
+// The flags stay: the release that ends a press or drag still comes, lets go
+// of the capture and, finding no item and no manager, tells no one.
+void MouseTrackForgetManager(const ToolbarManager *manager) {
+    if (!manager) return;
+    if (mouseTrack.hitItem && PointerListFind(manager->items, ListValue(mouseTrack.hitItem), nullptr))
+        mouseTrack.hitItem = nullptr;
+    if (mouseTrack.menuToolbar && PointerListFind(manager->toolbars, ListValue(mouseTrack.menuToolbar), nullptr))
+        mouseTrack.menuToolbar = nullptr;
+}
+
 // The pane makes its floating frame, links the two and makes the record. The
 // frame passes through here too, and does nothing.
 static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {

@@ -179,43 +179,51 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
 
 // ---- Apply ------------------------------------------------------------------------
 
-UINT FindLayoutValue(LPSTR *keys, LPSTR *values, UINT count, LPCSTR key, LPSTR *value) {
+// The index of the first entry with exactly this key.
+static UINT FindLayoutIndex(LPSTR *keys, UINT count, LPCSTR key, UINT *index) {
     for (UINT i = 0; i < count; ++i) {
         if (StringsEqual(keys[i], key)) {
-            *value = values[i];
+            *index = i;
             return 1;
         }
     }
     return 0;
 }
 
-HWND RestoreToolbar(HWND dockWindow, LPCSTR title, LPSTR value) {
+UINT FindLayoutValue(LPSTR *keys, LPSTR *values, UINT count, LPCSTR key, LPSTR *value) {
+    UINT index;
+    if (!FindLayoutIndex(keys, count, key, &index)) return 0;
+    *value = values[index];
+    return 1;
+}
+
+// A count above this is taken as an allocation that failed, which ends that
+// toolbar: no toolbar a user can build comes near it, and a damaged file then
+// costs no more memory and time than any real one. A negative count, read as
+// the unsigned size it would allocate, is one of these.
+constexpr UINT kMostLayoutItems = 65535;
+
+// One toolbar from its value, read at *cursor and moved on past what was read.
+static HWND RestoreToolbarAt(HWND dockWindow, LPCSTR title, LPSTR *cursor) {
     HWND pane = CreateToolbarWindows(dockWindow, title);
     if (!pane) return nullptr;
     ToolbarManager *manager = ManagerOfToolbar(pane);
     ToolbarRecord *record = manager ? FindToolbarRecord(manager->toolbars, pane) : nullptr;
     if (!record) return nullptr;
-    // Values are read as they stand. A count that is negative or larger than
-    // the value could hold is bounded by what the value can hold, so that a
-    // damaged line costs no more than its own toolbar's items.
-    int n = ReadTokenInt(value);
-    UINT most = static_cast<UINT>(lstrlenA(value)) / 2 + 1;
-    UINT count = n < 0 ? 0 : (static_cast<UINT>(n) > most ? most : static_cast<UINT>(n));
-    UINT *ids = nullptr;
-    void *block = nullptr;
-    if (!MemoryBlockAlloc(&block, count * static_cast<UINT>(sizeof(UINT)), 0)) return nullptr;
-    ids = static_cast<UINT *>(block);
+    // Values are read as they stand: a count too large takes flags and
+    // rectangle as ids, and the tail reads 0.
+    const UINT count = static_cast<UINT>(NextTokenInt(cursor));
+    if (count > kMostLayoutItems) return nullptr;
+    std::vector<UINT> ids(count);
     for (UINT i = 0; i < count; ++i)
-        ids[i] = ReadTokenId(value);
-    record->flags = ReadTokenFlags(value);
-    UINT ok = SetToolbarItems(record, ids, count);
-    MemoryBlockFree(ids);
-    if (!ok) return nullptr;
+        ids[i] = static_cast<UINT>(NextTokenInt(cursor));
+    record->flags = static_cast<UINT>(NextTokenInt(cursor));
+    if (!SetToolbarItems(record, ids.data(), count)) return nullptr;
     RECT r;
-    r.left = ReadTokenInt(value);
-    r.top = ReadTokenInt(value);
-    r.right = ReadTokenInt(value);
-    r.bottom = ReadTokenInt(value);
+    r.left = NextTokenInt(cursor);
+    r.top = NextTokenInt(cursor);
+    r.right = NextTokenInt(cursor);
+    r.bottom = NextTokenInt(cursor);
     MoveToolbarWindow(pane, ROLE_FLOATING, &r);
     DockArea *dock = FindDockRecord(dockWindow);
     if (dock) InsertToolbarBefore(dock, nullptr, record);
@@ -223,28 +231,39 @@ HWND RestoreToolbar(HWND dockWindow, LPCSTR title, LPSTR value) {
     return pane;
 }
 
+HWND RestoreToolbar(HWND dockWindow, LPCSTR title, LPSTR value) {
+    LPSTR cursor = value;
+    HWND pane = RestoreToolbarAt(dockWindow, title, &cursor);
+    TakeTokensRead(value, cursor);
+    return pane;
+}
+
 UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR *values, UINT count) {
+    // Every value is read through a cursor of its own, and what was read is
+    // taken off each value once, at the end: a value stands as used up as if
+    // each token read had moved its rest to the front, without the cost of
+    // all those moves (quadratic in a value's length). A title in a dock's
+    // value that names the dock's own key reads on from that same cursor.
+    std::vector<LPSTR> cursors(values, values + count);
     for (UINT side = DOCK_TOP; side <= DOCK_RIGHT; ++side) {
-        LPSTR titles;
-        if (!FindLayoutValue(keys, values, count, LoadLibraryText(kDockKeyBase + side), &titles)) continue;
+        UINT dockIndex;
+        if (!FindLayoutIndex(keys, count, LoadLibraryText(kDockKeyBase + side), &dockIndex)) continue;
         HWND dock = QBR_CreateDock(manager, frame, side);
         if (!dock) continue;
-        // Reading a token moves the rest to the front, so every value read is
-        // used up: the table serves one apply per filling.
-        // The title buffer holds the whole rest, so no title read from a
-        // damaged file can overrun it.
-        std::vector<char> title(static_cast<size_t>(lstrlenA(titles)) + 1);
         {
             DeferDockPacking once;
-            while (*titles) {
-                ReadTokenText(titles, title.data());
-                LPSTR value;
-                if (FindLayoutValue(keys, values, count, title.data(), &value))
-                    RestoreToolbar(dock, title.data(), value);
+            while (*cursors[dockIndex]) {
+                // Cut in place: the title stays readable until the values are
+                // tidied up below.
+                LPCSTR title = NextToken(&cursors[dockIndex]);
+                UINT index;
+                if (FindLayoutIndex(keys, count, title, &index)) RestoreToolbarAt(dock, title, &cursors[index]);
             }
         }
         RelayoutDock(dock);
     }
+    for (UINT i = 0; i < count; ++i)
+        TakeTokensRead(values[i], cursors[i]);
     return 1;
 }
 

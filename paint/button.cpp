@@ -99,6 +99,28 @@ void EndButtonPaint() {
     targetDC = nullptr;
 }
 
+// Ands each bit of the mask (width by height) with its neighbour up and left,
+// as the bits stood before. The neighbours are read from a copy: a block copy
+// of a bitmap onto itself with an offset drops a column under some GDI
+// implementations (Wine, at several widths, among them the 22 of a default
+// mask), where Windows reads the source as it stood. Without room for the copy the mask is eroded
+// in place, which is right wherever overlapping copies are.
+static void ErodeMask(int width, int height) {
+    HDC copyDC = GdiTrackDC(CreateCompatibleDC(maskDC));
+    HBITMAP copy = copyDC ? GdiTrack(CreateBitmap(width, height, 1, 1, nullptr)) : nullptr;
+    {
+        SelectScope select(copyDC, copy);
+        if (select.Selected()) {
+            BitBlt(copyDC, 0, 0, width, height, maskDC, 0, 0, SRCCOPY);
+            BitBlt(maskDC, 1, 1, width - 1, height - 1, copyDC, 0, 0, SRCAND);
+        } else {
+            BitBlt(maskDC, 1, 1, width - 1, height - 1, maskDC, 0, 0, SRCAND);
+        }
+    }
+    GdiDelete(copy);
+    GdiDeleteDC(copyDC);
+}
+
 void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, UINT erode) {
     int bw = 0, bh = 0, iw = 0, ih = 0;
     GetButtonSizes(&bw, &bh, &iw, &ih);
@@ -117,7 +139,7 @@ void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, 
     if (!erode) return;
     // Each bit anded with its neighbour up and left grows the zeros by one
     // pixel to the lower right, over where the light copy of the ink lies.
-    BitBlt(maskDC, 1, 1, bw - 3, bh - 3, maskDC, 0, 0, SRCAND);
+    ErodeMask(bw - 2, bh - 2);
 }
 
 // A raised button in its cell; (x, y) is the first pixel inside the frame

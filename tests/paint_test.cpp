@@ -197,6 +197,24 @@ TEST_F(PaintTest, StripKeysBecomeButtonColoursAndTheResourceStaysAsItWas) {
     EXPECT_EQ(live - 2, LiveGdiObjects());
 }
 
+// A strip set again replaces the one before: the old bitmap is deleted, so the
+// library's live GDI count stays where one strip left it, and a name that
+// finds no resource changes nothing.
+TEST_F(PaintTest, ImageStripSetAgainFreesTheOldBitmap) {
+    LONG blocks = 0, before = 0, after = 0;
+    QBR_GetLiveCounts(&blocks, &before);
+    for (int i = 0; i < 3; ++i)
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
+    QBR_GetLiveCounts(&blocks, &after);
+    EXPECT_EQ(before, after) << "each replaced strip must be deleted";
+    HBITMAP strip = manager->imageStrip;
+    EXPECT_EQ(0u, QBR_SetImageStrip(manager, "NOSUCHSTRIP"));
+    EXPECT_EQ(strip, manager->imageStrip);
+    QBR_GetLiveCounts(&blocks, &after);
+    EXPECT_EQ(before, after);
+    ExpectStripColours(BitmapPixels(manager->imageStrip), colors);
+}
+
 // The colours are taken at load time from the scheme: with a scheme whose
 // button colours are none of the keys, every key shows as its element.
 TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
@@ -349,6 +367,93 @@ TEST_F(PaintTest, DisabledInkIsEmbossed) {
         }
         for (int x = 5; x <= 12; ++x)
             EXPECT_EQ(Hex(colors.highlight), Hex(canvas.At(o + x, o + 9))) << bits << " light below";
+    }
+}
+
+// A disabled button that is on, at the default 22-pixel height, every pixel
+// of its cell against the drawing rules worked out here: face, frame ring,
+// sunken edge, the light and dark copies of the ink, and the checker where the
+// eroded mask (each bit anded with its neighbour up and left, as the bits
+// stood before the erosion) leaves it. The images are scattered ink, light
+// and dark pixels over the whole cell, so that every mask column matters.
+TEST_F(PaintTest, DisabledOnButtonMatchesTheRulesEveryPixel) {
+    int bw = 0, bh = 0, iw = 0, ih = 0;
+    GetButtonSizes(&bw, &bh, &iw, &ih);
+    ASSERT_EQ(22, bh);
+    const int left = 5, top = 4, x = left + 1, y = top + 1, w = bw - 2, h = bh - 2;
+    const COLORREF inks[] = {colors.text, colors.shadow, colors.highlight, kRed};
+    HBITMAP loaded = manager->imageStrip;
+    for (unsigned seed = 1; seed <= 4; ++seed) {
+        // A strip of four cells, drawn here in the loaded strip's colours.
+        HBITMAP strip = nullptr;
+        {
+            ScreenDC screen;
+            strip = CreateCompatibleBitmap(screen, 4 * iw, ih);
+        }
+        ASSERT_NE(nullptr, strip);
+        {
+            HDC dc = CreateCompatibleDC(nullptr);
+            HGDIOBJ old = SelectObject(dc, strip);
+            std::srand(seed);
+            for (int py = 0; py < ih; ++py)
+                for (int px = 0; px < 4 * iw; ++px)
+                    SetPixelV(dc, px, py, std::rand() % 2 ? colors.face : inks[std::rand() % 4]);
+            SelectObject(dc, old);
+            DeleteDC(dc);
+        }
+        manager->imageStrip = strip;
+        const BitmapPixels cells(strip);
+        const UINT id = seed; // image seed - 1: each cell once
+        const int cellX = static_cast<int>(id - 1) * iw;
+        // 1 where the image is face or highlight, and outside the image.
+        auto mask = [&](int mx, int my, int imageX, int imageY) {
+            const int cx = mx - imageX, cy = my - imageY;
+            if (cx < 0 || cy < 0 || cx >= iw || cy >= ih) return 1;
+            const COLORREF c = cells.At(cellX + cx, cy);
+            return (c == colors.face || c == colors.highlight) ? 1 : 0;
+        };
+        const int imageX = ((w - iw - 1) >> 1) + 1, imageY = ((h - ih) >> 1) + 1; // sunken
+        std::vector<COLORREF> want(static_cast<size_t>(40 * 40), kUntouched);
+        auto put = [&](int px, int py, COLORREF c) { want[static_cast<size_t>(py * 40 + px)] = c; };
+        for (int py = y; py < y + h; ++py)
+            for (int px = x; px < x + w; ++px)
+                put(px, py, colors.face);
+        for (int i = 0; i < w; ++i) {
+            put(x + i, y - 1, colors.frame);
+            put(x + i, y + h, colors.frame);
+            put(x + i, y, colors.shadow);
+        }
+        for (int i = 0; i < h; ++i) {
+            put(x - 1, y + i, colors.frame);
+            put(x + w, y + i, colors.frame);
+            put(x, y + i, colors.shadow);
+        }
+        for (int my = 0; my < h; ++my) // light copy one pixel lower right
+            for (int mx = 0; mx < w; ++mx)
+                if (!mask(mx, my, imageX, imageY)) put(x + 1 + mx, y + 1 + my, colors.highlight);
+        for (int my = 0; my < h; ++my) // dark copy over it
+            for (int mx = 0; mx < w; ++mx)
+                if (!mask(mx, my, imageX, imageY)) put(x + mx, y + my, colors.shadow);
+        for (int my = 0; my < h - 1; ++my) // the checker, through the eroded mask
+            for (int mx = 0; mx < w - 1; ++mx) {
+                int bit = mask(mx, my, imageX - 1, imageY - 1);
+                if (mx >= 1 && my >= 1) bit &= mask(mx - 1, my - 1, imageX - 1, imageY - 1);
+                const int px = x + 1 + mx, py = y + 1 + my;
+                if (bit) put(px, py, (px + py) % 2 == 0 ? colors.face : colors.highlight);
+            }
+        SetBits(id, BS_DISABLED | BS_ON);
+        Canvas canvas(40, 40);
+        PaintOne(canvas, id, left, top);
+        manager->imageStrip = loaded;
+        DeleteObject(strip);
+        int wrong = 0;
+        for (int py = 0; py < 40; ++py)
+            for (int px = 0; px < 40; ++px)
+                if (canvas.At(px, py) != want[static_cast<size_t>(py * 40 + px)] && ++wrong <= 5)
+                    ADD_FAILURE() << "image " << id - 1 << " at (" << px - left << ", " << py - top
+                                  << "): " << Hex(canvas.At(px, py)) << ", the rules give "
+                                  << Hex(want[static_cast<size_t>(py * 40 + px)]);
+        EXPECT_EQ(0, wrong) << "image " << id - 1;
     }
 }
 

@@ -6,6 +6,7 @@
 #include "core/core.h"
 #include "dock/dock.h"
 #include "harness.h"
+#include "input/input.h"
 #include "modal.h"
 #include "paint/paint.h"
 #include "quaybar.h"
@@ -759,6 +760,72 @@ TEST_F(ToolbarTest, FloatingFramesStayAboveWhenTheUserSwitchesWindows) {
     PumpFor(1000);
     EXPECT_EQ(frame, GetActiveWindow()) << "after the other window closed";
     EXPECT_TRUE(Above(floating, frame)) << "after the other window closed";
+}
+
+// A host may pump messages between QBR_DestroyManager and the destruction of
+// its frame (a message box, say). The docks empty at once, hide and tell the
+// frame; afterwards no dock window, pane or floating frame names the freed
+// manager, and paints, clicks, timers and the end of a press under way find
+// nothing and tell the frame nothing.
+TEST_F(ToolbarTest, DestroyedManagerLeavesNoWindowOnFreedRecords) {
+    HWND left = MakeDock(DOCK_LEFT);
+    HWND docked = Make({1, 2, S, 3});
+    HWND second = Make({4, 5});
+    HWND column = Make({6, 7}, TBF_VISIBLE | TBF_DOCKED, left);
+    HWND floating = Make({8}, TBF_VISIBLE | TBF_FLOATING, nullptr, 300, 200);
+    ASSERT_TRUE(IsWindowVisible(top) && IsWindowVisible(left));
+    RECT button;
+    ASSERT_EQ(1u, GetItemRect(RecordOfWindow(docked), 0, &button));
+    POINT on = {(button.left + button.right) / 2, (button.top + button.bottom) / 2};
+    ClientToScreen(docked, &on);
+    SendMouse(WM_LBUTTONDOWN, on, MK_LBUTTON); // a press under way
+    ASSERT_EQ(docked, GetCapture());
+
+    ClearFrameLog();
+    QBR_DestroyManager(manager);
+    manager = nullptr;
+    // One change for each dock that held toolbars: it is empty now and hides.
+    const std::vector<Heard> heard = FrameLog();
+    EXPECT_EQ((std::vector<Heard>{{WM_SIZE, 0, 0}, {WM_SIZE, 0, 0}}), heard) << Describe(heard);
+    EXPECT_FALSE(IsWindowVisible(top));
+    EXPECT_FALSE(IsWindowVisible(left));
+    EXPECT_EQ(nullptr, mouseTrack.hitItem) << "the pressed item is freed";
+    const HWND docks[] = {top, left};
+    for (HWND dock : docks)
+        EXPECT_EQ(0, GetWindowLongPtrA(dock, 0)) << "a dock window still names the freed manager";
+    const HWND toolbars[] = {docked,
+                             second,
+                             column,
+                             floating,
+                             ResolveRoleWindow(docked, ROLE_FLOATING),
+                             ResolveRoleWindow(floating, ROLE_FLOATING)};
+    for (HWND window : toolbars) {
+        ASSERT_TRUE(IsWindow(window));
+        EXPECT_EQ(nullptr, ManagerOfToolbar(window));
+        EXPECT_EQ(0u, QBR_GetToolbarFlags(ResolveRoleWindow(window, ROLE_DOCKED)));
+    }
+
+    ClearFrameLog();
+    SendMouse(WM_MOUSEMOVE, POINT{on.x + 1, on.y}, MK_LBUTTON);
+    SendMouse(WM_LBUTTONUP, on, 0);
+    EXPECT_EQ(nullptr, GetCapture()) << "the release still ends the press";
+    for (HWND window : toolbars) {
+        InvalidateRect(window, nullptr, TRUE);
+        UpdateWindow(window);
+        SendMessageA(window, WM_TIMER, kSettleTimer, 0);
+        SendMessageA(window, WM_LBUTTONDBLCLK, 0, MAKELPARAM(3, 3));
+        SendMessageA(window, WM_RBUTTONDOWN, 0, MAKELPARAM(3, 3));
+        SendMessageA(window, WM_RBUTTONUP, 0, MAKELPARAM(3, 3));
+        SendMessageA(window, WM_SIZE, 0, 0);
+    }
+    for (HWND dock : docks) {
+        InvalidateRect(dock, nullptr, TRUE);
+        UpdateWindow(dock);
+        SendMessageA(dock, WM_RBUTTONDOWN, 0, MAKELPARAM(3, 3));
+    }
+    Pump();
+    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
+    EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(floating, ROLE_FLOATING))) << "windows go with the frame";
 }
 
 } // namespace

@@ -132,6 +132,17 @@ damaged non-numeric 'has "$good_top"'
 damaged huge-and-negative 'grep -q "^Align=4,401,402,403,404,33,-60,-30,53,15$" "$out/damaged-$name.txt"'
 { head_lines | sed "s/^Style=.*/Style=8,$(printf '301,%.0s' $(seq 1 6000))/"; } >"$ini"
 damaged very-long-value 'has "$good_top"'
+# A megabyte on one line, read as fast as a short one (the program must
+# answer within start_demo's wait): a dock value of 100,000 titles that name
+# nothing before the real ones, and a toolbar value of 60,000 ids of which
+# all but its own eight are ids the catalog lacks.
+long_line() { printf '%s=%s' "$1" "$2"; yes "$3" | head -n "$4" | tr -d '\n'; printf '%s\n' "$5"; }
+{ head_lines | grep -v '^Top Dock='; long_line 'Top Dock' '' 'Nobody,' 100000 'Standard,Style,Align,Palette'; } >"$ini"
+damaged megabyte-dock-line 'has "$good_top" && [ "$(grep -c . "$out/damaged-$name.txt")" = 5 ]'
+style_line=$(head_lines | grep '^Style=')
+style_tail=$(cut -d, -f10- <<<"$style_line") # flags and rectangle
+{ head_lines | grep -v '^Style='; long_line Style '60000,301,302,303,0,304,305,306,307' ',0000000000009999' 59992 ",$style_tail"; } >"$ini"
+damaged megabyte-toolbar-line 'has "$good_top" && has "$style_line"'
 { head_lines | sed 's/^Standard=.*/Standard=10,101,10/'; } >"$ini"
 damaged truncated-line 'grep -q "^Standard=2,101,10," "$out/damaged-$name.txt" || grep -q "^Standard=" "$out/damaged-$name.txt"'
 { head_lines; printf 'Style=\001\002\377\376,,\033[0m\n'; printf '\000\000garbage\n'; } >"$ini"

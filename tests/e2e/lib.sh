@@ -7,7 +7,12 @@ here=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
 . "$build/wine-env/exports.sh"
 out="$build/e2e"
 mkdir -p "$out"
-ini="$build/bin/qbrdemo.INI"
+# Each script runs the program from a folder of its own, BUILD/e2e/<script>/,
+# so the settings file it reads and writes ($ini) is that folder's and the
+# user's own build/bin/qbrdemo.INI is never touched.
+run="$out/$(basename "$0" .sh)"
+mkdir -p "$run"
+ini="$run/qbrdemo.INI"
 main="Quaybar Demo"
 demo_pid=""
 
@@ -21,7 +26,8 @@ shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1.png"; }
 
 # Starts the program and waits for its main window and its first paint.
 start_demo() {
-    wine "$build/bin/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
+    cp "$build/bin/qbrdemo.exe" "$build/bin/QBRDEMO.TXT" "$run/" || fail "cannot copy the program to $run"
+    wine "$run/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
     demo_pid=$!
     ctl wait "$main" 20000 || fail "the main window did not appear ($1)"
     sleep 1
