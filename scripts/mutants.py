@@ -28,7 +28,7 @@ end-to-end scripts (`demo_start_e2e`), separated by blanks.
 
 --only REGEX   runs the mutants whose name matches
 --file REGEX   runs the mutants whose file matches (say, what a change touched)
---record       writes the score and the survivors to tests/mutants/RESULTS.md
+--record       writes each set's score and survivors to tests/mutants/RESULTS.md (whole sets only)
 --list         prints the mutants and checks that every `find` is there, runs nothing
 """
 import argparse
@@ -163,6 +163,43 @@ def run_tests(tests, src, build, log):
     return ""
 
 
+RESULTS = os.path.join(HERE, "tests", "mutants", "RESULTS.md")
+COLUMNS = "| set | date | mutants | killed | survived | did not build | equivalent (not run) | score | survivors |"
+
+
+def record(mutants, killed, survived, broken):
+    """Writes one row per set that this run covered into RESULTS.md, keeping
+    the rows of the other sets, and a total over all rows."""
+    rows = {}
+    if os.path.exists(RESULTS):
+        with open(RESULTS, encoding="utf-8") as f:
+            for line in f:
+                cells = [c.strip() for c in line.strip().strip("|").split("|")]
+                if len(cells) == 9 and cells[0].startswith("tests/mutants/"):
+                    rows[cells[0]] = cells
+    today = time.strftime("%Y-%m-%d")
+    for origin in sorted({m.origin.split(":")[0] for m in mutants}):
+        mine = [m for m in mutants if m.origin.startswith(origin + ":")]
+        k = sum(m in killed for m in mine)
+        s = [m.name for m in mine if m in survived]
+        b = sum(m in broken for m in mine)
+        e = sum(bool(m.equivalent) for m in mine)
+        score = 100.0 * k / (k + len(s)) if k + len(s) else 100.0
+        rows[origin] = [origin, today, str(len(mine)), str(k), str(len(s)), str(b), str(e),
+                        "%.1f %%" % score, ", ".join(s) or "none"]
+    total = [sum(int(r[i]) for r in rows.values()) for i in range(2, 7)]
+    judged = total[1] + total[2]
+    with open(RESULTS, "w", encoding="utf-8") as f:
+        f.write("# Mutation score\n\n")
+        f.write("Written by `python3 scripts/mutants.py --record`: one row per set, from the last run that\n"
+                "covered the whole set; a run of some sets replaces their rows only.\n\n")
+        f.write(COLUMNS + "\n|" + "---|" * 9 + "\n")
+        for key in sorted(rows):
+            f.write("| " + " | ".join(rows[key]) + " |\n")
+        f.write("| all | | %d | %d | %d | %d | %d | %.1f %% | |\n"
+                % tuple(total + [100.0 * total[1] / judged if judged else 100.0]))
+
+
 def main():
     ap = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     ap.add_argument("sets", nargs="*")
@@ -184,6 +221,8 @@ def main():
         mutants = [m for m in mutants if re.search(args.only, m.name)]
     if args.file:
         mutants = [m for m in mutants if re.search(args.file, m.file)]
+    if args.record and (args.only or args.file):
+        sys.exit("--record takes whole sets: name set files instead of --only or --file")
 
     stale = [(m, check_place(m, HERE)) for m in mutants]
     stale = [(m, why) for m, why in stale if why]
@@ -260,17 +299,7 @@ def main():
         print("  did not build: %s (%s)" % (m.name, m.origin))
 
     if args.record:
-        with open(os.path.join(HERE, "tests", "mutants", "RESULTS.md"), "w") as f:
-            f.write("# Last mutation run\n\n")
-            f.write("%s, `scripts/mutants.py%s`\n\n" % (time.strftime("%Y-%m-%d"),
-                    "".join(" " + a for a in sys.argv[1:] if a != "--record")))
-            f.write("| killed | survived | did not build | equivalent (not run) | score |\n")
-            f.write("|---|---|---|---|---|\n")
-            f.write("| %d | %d | %d | %d | %.1f %% |\n" % (len(killed), len(survived), len(broken), len(equivalent), score))
-            if survived:
-                f.write("\nSurvivors:\n\n")
-                for m in survived:
-                    f.write("- `%s` (%s)\n" % (m.name, m.origin))
+        record(mutants, killed, survived, broken)
     return 0 if not survived and not broken else 1
 
 
