@@ -1,5 +1,6 @@
 // The toolbar manager of a frame window, its item catalog, the button setters
 // and the library's two sources of text.
+#include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
 #include "dock/dock.h"
@@ -368,8 +369,12 @@ void RepaintItem(ToolbarManager *manager, ToolbarItem *item) {
         UINT index;
         RECT rect;
         // Only the first place of an item on a toolbar is repainted; hidden
-        // toolbars take part like visible ones.
-        if (!IndexOfItem(record, item, &index) || !GetItemRect(record, index, &rect)) continue;
+        // toolbars take part like visible ones. Every change of a button's
+        // state, enabled or pressed bit comes through here, so this is where
+        // screen readers hear of it.
+        if (!IndexOfItem(record, item, &index)) continue;
+        AccessItemChanged(record, index);
+        if (!GetItemRect(record, index, &rect)) continue;
         RepaintToolbarWindow(record->paneWindow, ROLE_ACTIVE, &rect);
     }
 }

@@ -405,6 +405,7 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     if (!RegisterMainWindow()) return 0;
     MSG msg = {};
     while (GetMessageA(&msg, nullptr, 0, 0) > 0) {
+        if (QBR_TranslateToolbarKey(&msg)) continue; // the keyboard on the toolbars
         TranslateMessage(&msg);
         DispatchMessageA(&msg);
     }

@@ -69,7 +69,7 @@ typedef struct ToolbarManager ToolbarManager;
 typedef int(CALLBACK *HelpTextProc)(UINT id, UINT kind, LPSTR buffer, int size);
 
 /* Instance that holds the library's resources (window classes, dialog
-   templates, strings 5101 to 5108). The host stores its own instance here
+   templates, strings 5101 to 5111). The host stores its own instance here
    before it creates anything; the resources are linked into the host. */
 extern HINSTANCE moduleInstance;
 
@@ -123,6 +123,14 @@ HWND QBR_GetToolbarDock(HWND pane);
 HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side);
 HWND QBR_GetDock(ToolbarManager *manager, UINT side);
 void QBR_DestroyDock(HWND window);
+
+/* The keyboard. The host passes every message of its loop here first, as to
+   IsDialogMessage; 1 means the toolbars used it, and it must be neither
+   translated nor dispatched. F6 moves the keyboard into the frame's
+   toolbars, F6 or Esc gives it back; arrows, Home, End, Tab, Space, Enter,
+   Shift+F10 and the context-menu key work there. Toolbars never take the
+   activation or the window focus for it. */
+UINT QBR_TranslateToolbarKey(MSG *msg);
 
 /* The layout table: the arrangement of one manager as text keys and values. */
 UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count);

@@ -44,3 +44,10 @@ void StartFrameDrag(HWND window, const RECT *frame, int x, int y);
 void FollowDragFrame(HWND window, int x, int y);
 void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar);
 void OnToolbarCommand(HWND window, UINT id);
+
+// A press that no mouse makes (the keyboard, a screen reader's action) of
+// button `id` on `window`: the pressed look and the press message; then the
+// end that a release on the button gives, or, when `completed` is false, the
+// end of a press that was let go elsewhere.
+void StartKeyPress(HWND window, UINT id);
+void FinishKeyPress(HWND window, UINT id, bool completed);

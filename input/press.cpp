@@ -5,6 +5,7 @@
 // One release ends one state, tested in a fixed order (close box, drag,
 // press), and every flag is cleared before the host's frame hears of the end,
 // so that its handler may run a modal loop or change the toolbars.
+#include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
 #include "input/input.h"
@@ -86,6 +87,11 @@ void ShowPressedLook(HWND window, ButtonData *data, UINT pressed) {
     ButtonSetPressed(data, pressed);
     InvalidateRect(window, &mouseTrack.hitRect, FALSE);
     UpdateWindow(window);
+    // This look bypasses the catalog's repaint, which tells screen readers
+    // of every other change of a button.
+    ToolbarRecord *record = RecordOfWindow(window);
+    UINT index;
+    if (IndexOfItem(record, mouseTrack.hitItem, &index)) AccessItemChanged(record, index);
 }
 
 // The cursor counts as on the button when it is over the same rectangle that
@@ -129,17 +135,19 @@ void ApplyBehaviour(ToolbarManager *manager, ButtonData *data, UINT id) {
     }
 }
 
-void EndButtonPress(HWND window, int x, int y) {
-    ReleaseCapture();
-    mouseTrack.pressActive = 0;
-    const UINT id = mouseTrack.hitItemId;
+// The end of a press of button `id`: a completed press applies the behaviour
+// and the host hears the release and the command; any other end only clears
+// the pressed look and tells of the release. A disabled button is never
+// applied.
+void FinishPress(HWND window, UINT id, bool completed) {
     ToolbarManager *manager = ManagerOfToolbar(window);
-    if (!OnPressedButton(window, x, y)) {
+    if (!completed) {
         QBR_SetButtonPressed(manager, id, 0);
         NotifyRelease(window, id);
         return;
     }
-    ButtonData *data = static_cast<ButtonData *>(ItemGetData(mouseTrack.hitItem));
+    ToolbarItem *item = manager ? ItemFindById(manager->items, id) : nullptr;
+    auto *data = static_cast<ButtonData *>(ItemGetData(item));
     if (!data) return;
     if (!ButtonIsEnabled(data)) {
         NotifyRelease(window, id);
@@ -150,7 +158,25 @@ void EndButtonPress(HWND window, int x, int y) {
     if (manager) SendMessageA(manager->frame, WM_COMMAND, id, 0);
 }
 
+void EndButtonPress(HWND window, int x, int y) {
+    ReleaseCapture();
+    mouseTrack.pressActive = 0;
+    FinishPress(window, mouseTrack.hitItemId, OnPressedButton(window, x, y));
+}
+
 } // namespace
+
+// ---- Presses without the mouse ------------------------------------------------------
+
+void StartKeyPress(HWND window, UINT id) {
+    ToolbarManager *manager = ManagerOfToolbar(window);
+    // As for the mouse: a disabled button never looks pressed, and the look
+    // is on the screen before the host hears of the press.
+    if (QBR_IsButtonEnabled(manager, id)) QBR_SetButtonPressed(manager, id, 1);
+    NotifyPress(window, id);
+}
+
+void FinishKeyPress(HWND window, UINT id, bool completed) { FinishPress(window, id, completed); }
 
 // ---- The handlers ---------------------------------------------------------------
 

@@ -1,5 +1,6 @@
 // The window procedure of both toolbar windows, pane and floating frame, and
 // the mouse state that all toolbars of the process share.
+#include "access/access.h"
 #include "core/core.h"
 #include "input/input.h"
 #include "paint/paint.h"
@@ -74,6 +75,7 @@ static void PassActivationToHost(HWND window) {
 // changes may come back as a refit: the WM_SIZE that DefWindowProc would make
 // of WM_WINDOWPOSCHANGED is let through only after the user pressed a border.
 static LRESULT OnWindowPosChanged(HWND window, WPARAM wParam, LPARAM lParam) {
+    AccessWindowPosChanged(window, reinterpret_cast<const WINDOWPOS *>(lParam));
     if (!borderSizing) return 0;
     borderSizing = 0;
     ActivateHostFrame(window);
@@ -127,6 +129,7 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         return 0;
     case WM_ACTIVATEAPP:
         appActive = static_cast<UINT>(wParam);
+        if (!appActive) AccessLeaveKeyboard();
         return 0;
     case WM_MOUSEACTIVATE:
         ActivateHostFrame(window);
@@ -164,6 +167,14 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         return 0;
     case WM_RBUTTONUP:
         WithCursor(window, wParam, OnToolbarRightUp);
+        return 0;
+    case WM_SHOWWINDOW: // the platform also hides and shows owned frames here
+        AccessShowWindow(window, wParam, lParam);
+        return DefWindowProcA(window, message, wParam, lParam);
+    case WM_GETOBJECT:
+        return AccessGetObject(window, wParam, lParam);
+    case kAccessDefaultAction:
+        AccessDefaultAction(window, wParam, lParam);
         return 0;
     case WM_TIMER:
         if (wParam == kWaitForOwnerTimer || wParam == kSettleTimer) OnRestackTimer(window, wParam);

@@ -243,3 +243,20 @@ void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
         SetBkMode(targetDC, oldMode);
     }
 }
+
+// The focus rectangle stands this far inside the button's cell, clear of
+// the frame ring and the raised edges.
+constexpr int kFocusInset = 3;
+
+void PaintFocusRect(const RECT *rect) {
+    if (!targetDC || !rect) return;
+    RECT focus = *rect;
+    InflateRect(&focus, -kFocusInset, -kFocusInset);
+    // The dots invert what lies under them, black and white being the
+    // colours the platform's own controls draw them with.
+    const COLORREF oldText = SetTextColor(targetDC, RGB(0, 0, 0));
+    const COLORREF oldBack = SetBkColor(targetDC, RGB(255, 255, 255));
+    DrawFocusRect(targetDC, &focus);
+    SetTextColor(targetDC, oldText);
+    SetBkColor(targetDC, oldBack);
+}

@@ -28,6 +28,9 @@ void EndButtonPaint();
 void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState);
 void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, UINT erode);
 void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color);
+// The keyboard's focus on the button just painted at `rect`: a dotted
+// rectangle inside its face.
+void PaintFocusRect(const RECT *rect);
 
 // ---- Surface and caption -----------------------------------------------------
 extern HFONT captionFont;

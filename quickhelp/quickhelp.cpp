@@ -85,8 +85,10 @@ void StopQuickHelp(HWND help) {
     KillHelpTimer();
 }
 
-// Sizes and places the tip for `text` beside the cursor at `cursor` (screen).
-void PlaceTip(HWND help, POINT cursor, const char *text, int length) {
+// Sizes and places the tip for `text` with its left edge at x and its top
+// at `below`; at the bottom of the screen its lower edge stands on `above`
+// instead, at the right edge its right edge on x (all screen coordinates).
+void PlaceTipAt(HWND help, int x, int below, int above, const char *text, int length) {
     WindowDC dc(help);
     SelectScope font(dc, helpFont);
     TEXTMETRICA metrics;
@@ -96,9 +98,34 @@ void PlaceTip(HWND help, POINT cursor, const char *text, int length) {
     GetTextExtentPoint32A(dc, text, length, &extent);
     int height = metrics.tmHeight - metrics.tmInternalLeading + kTipExtraHeight;
     int width = extent.cx + kTipExtraWidth;
-    if (cursor.y - GetSystemMetrics(SM_CYSCREEN) + height + kTipBelowCursor > 0) cursor.y -= height + kTipBelowCursor;
-    if (cursor.x - GetSystemMetrics(SM_CXSCREEN) + width > 0) cursor.x -= width;
-    SetWindowPos(help, nullptr, cursor.x, cursor.y + kTipBelowCursor, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
+    int top = below;
+    if (below + height > GetSystemMetrics(SM_CYSCREEN)) top = above - height;
+    if (x - GetSystemMetrics(SM_CXSCREEN) + width > 0) x -= width;
+    SetWindowPos(help, nullptr, x, top, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+// The tip beside the cursor at `cursor` (screen).
+void PlaceTip(HWND help, POINT cursor, const char *text, int length) {
+    PlaceTipAt(help, cursor.x, cursor.y + kTipBelowCursor, cursor.y, text, length);
+}
+
+// The keyboard's tip waits for its item here; the button's place is taken
+// when the wait began.
+ToolbarItem *keyTipItem = nullptr;
+RECT keyTipRect = {};
+
+void CALLBACK KeyTipTimerProc(HWND, UINT, UINT_PTR, DWORD) {
+    KillHelpTimer();
+    HWND help = HelpWindow();
+    if (!help || !keyTipItem) return;
+    helpItem = keyTipItem;
+    char text[kTextBuffer];
+    int length = QuickHelpText(helpItem, text);
+    if (length <= 0) return;
+    PlaceTipAt(help, keyTipRect.left, keyTipRect.bottom + 1, keyTipRect.top, text, length);
+    ShowWindow(help, SW_SHOWNA);
+    // A tip already on show keeps its old picture otherwise.
+    InvalidateRect(help, nullptr, TRUE);
 }
 
 void QuickHelpPaint(HWND window) {
@@ -154,6 +181,7 @@ void QuickHelpEnd() {
     if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
     KillHelpTimer();
     helpItem = nullptr;
+    keyTipItem = nullptr;
     if (helpFont) GdiDelete(helpFont);
     helpFont = nullptr;
 }
@@ -165,6 +193,17 @@ void QuickHelpForgetManager(const ToolbarManager *manager) {
     // on polling, and the next button it finds counts as a new one.
     if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
     helpItem = nullptr;
+    keyTipItem = nullptr;
+}
+
+void QuickHelpForKey(ToolbarItem *item, const RECT *rect) {
+    // The mouse's poll stops: the keyboard names the button now.
+    KillHelpTimer();
+    if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
+    keyTipItem = rect && IsButtonItem(item) ? item : nullptr;
+    if (!keyTipItem) return;
+    keyTipRect = *rect;
+    if (QBR_GetQuickHelp()) helpTimer = SetTimer(nullptr, 0, kHelpPeriod, KeyTipTimerProc);
 }
 
 void QuickHelpMouseMove(HWND window, int x, int y) {

@@ -11,7 +11,7 @@ int CApiRoundTrip(void) {
     ok = manager != NULL && QBR_AddButtons(manager, ids, 3) == 1 &&
          QBR_SetButtonBehaviour(manager, 12, BTN_CHECK) == 1 && QBR_SetButtonState(manager, 12, 1) == 1 &&
          QBR_GetButtonState(manager, 12) == 1 && QBR_GetDock(manager, DOCK_TOP) == NULL &&
-         QBR_GetToolbarFlags(NULL) == 0;
+         QBR_GetToolbarFlags(NULL) == 0 && QBR_TranslateToolbarKey(NULL) == 0;
     QBR_DestroyManager(manager);
     QBR_Terminate();
     return ok;

@@ -3,6 +3,7 @@
 // No item position is stored anywhere; whoever needs one walks again.
 #include <algorithm>
 
+#include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
 #include "paint/paint.h"
@@ -157,11 +158,15 @@ UINT PaintToolbarItems(HWND pane) {
     ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     if (!record) return 0;
     struct Painter : FlowVisitor {
-        bool Place(UINT, ToolbarItem *item, bool separator, const RECT &rect, int) override {
-            if (!separator) PaintButton(item, &rect, 0);
+        const ToolbarRecord *record;
+        bool Place(UINT index, ToolbarItem *item, bool separator, const RECT &rect, int) override {
+            if (separator) return false;
+            PaintButton(item, &rect, 0);
+            if (AccessIsFocused(record, index)) PaintFocusRect(&rect);
             return false;
         }
     } painter;
+    painter.record = record;
     WalkActiveWindow(record, painter);
     return 1;
 }

@@ -1,5 +1,6 @@
 // Toolbar records, their flag word and their item lists. Every edit of the
 // item list ends in a refit of both windows of the toolbar.
+#include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
 #include "toolbar/toolbar.h"
@@ -48,6 +49,7 @@ UINT CreateToolbarRecord(HWND pane) {
 void DestroyToolbarRecord(ToolbarRecord *record) {
     if (!record) return;
     ToolbarManager *manager = ManagerOfToolbar(record->paneWindow);
+    AccessForgetToolbar(record);
     if (DockArea *dock = FindDockRecord(record->dockWindow)) RemoveToolbarFromDock(dock, record);
     PointerListDestroy(record->items);
     PointerListDestroy(record->floatingBreaks);

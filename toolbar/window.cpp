@@ -3,6 +3,7 @@
 // one and show the other, and every edit refits both.
 #include <initializer_list>
 
+#include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
 #include "input/input.h"
@@ -350,6 +351,7 @@ static HHOOK activationHook = nullptr;
 static UINT activationWatchers = 0;
 
 static void OnWindowActivating(HWND window) {
+    AccessWindowActivating(window); // the keyboard stays with the toolbars only while their frame is active
     ToolbarClient *client = CurrentClient();
     if (!client) return;
     for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i)
