@@ -18,6 +18,7 @@ extern "C" ToolbarManager *QBR_CreateManager(HWND frame) {
     if (!MemoryBlockAllocRecord(&manager)) return nullptr;
     BlockFill(manager, 0, sizeof(ToolbarManager));
     manager->frame = frame;
+    manager->dpi = WindowDpi(frame);
     manager->docks = PointerListCreate(1, 1, 0);
     manager->toolbars = PointerListCreate(1, 1, 0);
     manager->items = PointerListCreate(5, 5, 0);
@@ -217,6 +218,14 @@ UINT ItemGetSize(const ToolbarItem *item, int *width, int *height) {
         return 1;
     }
     return 0;
+}
+
+UINT ItemGetSizeAt(const ToolbarItem *item, UINT dpi, int *width, int *height) {
+    int w = 0, h = 0;
+    if (!ItemGetSize(item, &w, &h)) return 0;
+    if (width) *width = ScaleToDpi(w, dpi);
+    if (height) *height = ScaleToDpi(h, dpi);
+    return 1;
 }
 
 // ---- Button data -----------------------------------------------------------------

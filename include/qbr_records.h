@@ -52,6 +52,7 @@ struct ToolbarManager {
     UINT categoryCount;
     HRSRC imageResource;
     HBITMAP imageStrip;
+    UINT dpi; /* the frame's display scale that sizes are made for; 96 is 100 % */
 };
 
 typedef struct ToolbarItem {

@@ -119,3 +119,6 @@ constexpr int kPaneAreaTop = 3;
 constexpr int kPaneAreaBottom = 4;
 constexpr int kFrameAreaTop = 3; // below the caption band
 constexpr int kFrameAreaBottom = 3;
+// The margins above at the display scale of the toolbar's frame (top, for
+// the floating frame, with the caption band): left, top, right, bottom.
+RECT AreaMargins(HWND window, int role);
