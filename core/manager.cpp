@@ -67,6 +67,7 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     PointerListDestroy(manager->items);
     manager->items = nullptr;
     if (manager->imageStrip) GdiDelete(manager->imageStrip);
+    if (manager->imageName) MemoryBlockFree(manager->imageName);
     if (manager->categories) MemoryBlockFree(manager->categories);
     if (PointerListRemove(client->managers, ListValue(manager))) UnwatchHostActivation();
     MemoryBlockFree(manager);
@@ -105,8 +106,11 @@ extern "C" UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName) 
     HRSRC resource = FindResourceA(client->instance, resourceName, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
     if (!resource) return 0;
     manager->imageResource = resource;
-    manager->imageStrip = LoadImageStrip(client->instance, resource);
-    return manager->imageStrip ? 1 : 0;
+    // Kept for the strips of other display scales, which are found by name.
+    if (manager->imageName) MemoryBlockFree(manager->imageName);
+    manager->imageName = nullptr;
+    if (!IS_INTRESOURCE(resourceName)) StringDuplicate(&manager->imageName, resourceName);
+    return ChooseImageStrip(manager);
 }
 
 extern "C" UINT QBR_GetToolbarCount(ToolbarManager *manager) {

@@ -77,6 +77,9 @@ extern HINSTANCE moduleInstance;
 UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc);
 void QBR_Terminate(void);
 void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage);
+/* Sizes in pixels at 96 DPI (100 %), 0 for the default (24, 22, 16, 15, 48,
+   44). Each frame's toolbars scale them to the frame's DPI with MulDiv: at
+   144 DPI the defaults are 36, 33, 24, 23, 72, 66. */
 void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight, int textButtonWidth,
                           int textButtonHeight);
 void QBR_SetQuickHelp(UINT on);
@@ -92,6 +95,13 @@ void QBR_DestroyManager(ToolbarManager *manager);
 UINT QBR_SetCategories(ToolbarManager *manager, const UINT *ids, UINT count);
 UINT QBR_AddButtons(ToolbarManager *manager, const UINT *ids, UINT count);
 UINT QBR_AssignCategory(ToolbarManager *manager, UINT category, const UINT *ids, UINT count);
+/* The strip is a 16-colour BITMAP resource of the host at 100 % (96 DPI).
+   The same images drawn for larger display scales may be given beside it as
+   resources named resourceName, an underscore and the scale in per cent:
+   "Main" with "Main_150" (144 DPI) and "Main_200" (192 DPI). A frame uses
+   the strip of its own scale, else the nearest smaller one enlarged by the
+   largest whole factor that fits (pixel for pixel, never blurred), its
+   images centred in the buttons. A numbered resource has no such strips. */
 UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName);
 UINT QBR_SetButtonBehaviour(ToolbarManager *manager, UINT id, UINT behaviour);
 UINT QBR_SetButtonState(ToolbarManager *manager, UINT id, UINT state);

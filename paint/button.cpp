@@ -64,8 +64,8 @@ void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color) {
 }
 
 UINT BeginButtonPaint(ToolbarManager *manager, HDC dc) {
-    int bw = 0, bh = 0, iw = 0, ih = 0;
-    if (!manager || !dc || !GetButtonSizes(nullptr, nullptr, &iw, &ih)) return 0;
+    int bw = 0, bh = 0;
+    if (!manager || !dc || !CurrentClient()) return 0;
     passDpi = ManagerDpi(manager);
     GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
     targetDC = dc;
@@ -73,8 +73,7 @@ UINT BeginButtonPaint(ToolbarManager *manager, HDC dc) {
     HBITMAP image = manager->imageStrip;
     savedStripObject = image ? SelectObject(stripDC, image) : nullptr;
     if (!savedStripObject) return 0;
-    cellWidth = iw;
-    cellHeight = ih;
+    StripCellSize(manager, &cellWidth, &cellHeight);
 
     BITMAP strip;
     BlockFill(&strip, 0, sizeof(strip));

@@ -140,3 +140,122 @@ TEST_F(ScaleTest, FloatingFrameItemsStandBelowTheCaptionBand) {
     // The caption font grows with the screen: its band is taller than at 96.
     if (s.dpi > 96) EXPECT_GT(captionHeight, 10);
 }
+
+// ---- Sharp images -------------------------------------------------------------------
+
+namespace {
+
+// Which strip a frame uses and how much it is enlarged: the one drawn for
+// its scale, else the nearest smaller one times a whole factor.
+struct StripCase {
+    const char *name;
+    int dpi;
+    UINT scale, factor;
+    int cellWidth, cellHeight;
+};
+constexpr StripCase kStripCases[] = {
+    {"MAIN", 96, 100, 1, 16, 15},    {"SINGLE", 96, 100, 1, 16, 15},  {"MAIN", 144, 150, 1, 24, 23},
+    {"SINGLE", 144, 100, 1, 16, 15}, {"MAIN", 192, 150, 1, 24, 23}, {"SINGLE", 192, 100, 2, 32, 30},
+};
+
+// Every pixel of a bitmap, top row first.
+Pixels BitmapPixels(HBITMAP bitmap) {
+    BITMAP info = {};
+    GetObjectA(bitmap, sizeof info, &info);
+    Pixels out;
+    out.width = info.bmWidth;
+    out.height = info.bmHeight;
+    BITMAPINFO header = {};
+    header.bmiHeader = {sizeof(BITMAPINFOHEADER), info.bmWidth, -info.bmHeight, 1, 32, BI_RGB, 0, 0, 0, 0, 0};
+    std::vector<DWORD> bits(static_cast<size_t>(info.bmWidth) * info.bmHeight);
+    HDC screen = GetDC(nullptr);
+    GetDIBits(screen, bitmap, 0, info.bmHeight, bits.data(), &header, DIB_RGB_COLORS);
+    ReleaseDC(nullptr, screen);
+    for (DWORD v : bits)
+        out.colors.push_back(RGB((v >> 16) & 0xFF, (v >> 8) & 0xFF, v & 0xFF));
+    return out;
+}
+
+} // namespace
+
+TEST_F(ScaleTest, TheStripForTheFramesScaleOrTheNearestSmallerByAWholeFactor) {
+    for (const StripCase &c : kStripCases) {
+        if (c.dpi != ScreenDpi()) continue;
+        SCOPED_TRACE(c.name);
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, c.name));
+        EXPECT_EQ(c.scale, manager->imageScale);
+        EXPECT_EQ(c.factor, manager->imageFactor);
+        int w = 0, h = 0;
+        StripCellSize(manager, &w, &h);
+        EXPECT_EQ(c.cellWidth, w);
+        EXPECT_EQ(c.cellHeight, h);
+        // The strip in memory is the chosen one times the factor, whole.
+        BITMAP info = {};
+        GetObjectA(manager->imageStrip, sizeof info, &info);
+        EXPECT_EQ(23 * c.cellWidth, info.bmWidth);
+        EXPECT_EQ(2 * c.cellHeight, info.bmHeight);
+    }
+}
+
+// A button at the frame's scale shows its image pixel for pixel from the
+// strip resource, each pixel a whole factor by factor square (so every pixel
+// is a colour of the strip and nothing is blurred), centred in the button as
+// at 96 DPI.
+TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
+    const Scaled &s = Here();
+    for (const char *name : {"MAIN", "SINGLE"}) {
+        SCOPED_TRACE(name);
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, name));
+        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_DOCKED);
+        Pump();
+        RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+        Pixels shown = ReadWindowPixels(pane);
+        // The resource the library chose, recoloured as loaded but not enlarged.
+        char chosen[32];
+        if (manager->imageScale == 150)
+            wsprintfA(chosen, "%s_150", name);
+        else
+            lstrcpyA(chosen, name);
+        HBITMAP source = LoadImageStrip(GetModuleHandleA(nullptr),
+                                        FindResourceA(GetModuleHandleA(nullptr), chosen, MAKEINTRESOURCEA(2)));
+        ASSERT_NE(nullptr, source);
+        Pixels strip = BitmapPixels(source);
+        DeleteObject(source);
+        const int f = static_cast<int>(manager->imageFactor);
+        int cw = 0, ch = 0;
+        StripCellSize(manager, &cw, &ch);
+        const int columns = strip.width / (cw / f);
+        std::vector<RECT> rects = ItemRects(pane);
+        for (UINT index = 0; index < 3; ++index) {
+            UINT image = 0;
+            QBR_GetButtonImage(manager, index + 1, &image);
+            const int sx = static_cast<int>(image % columns) * (cw / f), sy = static_cast<int>(image / columns) * (ch / f);
+            const int w = s.buttonWidth - 2, h = s.buttonHeight - 2;
+            const int ix = rects[index].left + 1 + ((w - cw - 1) >> 1);
+            const int iy = rects[index].top + 1 + ((h - ch) >> 1);
+            int wrong = 0;
+            for (int y = 0; y < ch; ++y)
+                for (int x = 0; x < cw; ++x)
+                    if (shown.At(ix + x, iy + y) != strip.At(sx + x / f, sy + y / f)) ++wrong;
+            EXPECT_EQ(0, wrong) << "button " << index << " at " << ix << "," << iy;
+        }
+        QBR_DestroyToolbar(pane);
+        Pump();
+    }
+}
+
+// At 96 DPI a frame never sees the strips drawn for larger scales.
+TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
+    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case";
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+    HWND frame = CreateRecordingFrame();
+    ToolbarManager *m = QBR_CreateManager(frame);
+    ASSERT_EQ(1u, QBR_SetImageStrip(m, "MAIN"));
+    BITMAP info = {};
+    GetObjectA(m->imageStrip, sizeof info, &info);
+    EXPECT_EQ(368, info.bmWidth);
+    EXPECT_EQ(30, info.bmHeight);
+    QBR_DestroyManager(m);
+    DestroyWindow(frame);
+    QBR_Terminate();
+}
