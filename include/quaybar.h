@@ -83,6 +83,18 @@ void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage);
 void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight, int textButtonWidth,
                           int textButtonHeight);
 void QBR_SetQuickHelp(UINT on);
+
+/* A new display scale for a frame. A per-monitor DPI aware host calls this
+   from the frame's WM_DPICHANGED with the message's parameters, and returns 0:
+       case WM_DPICHANGED: QBR_DpiChanged(window, wParam, lParam); return 0;
+   The frame's toolbars, docks and floating frames are measured again for the
+   new DPI (HIWORD of wParam), each toolbar keeping its items and rows, its
+   strip is chosen again for the scale, and the frame takes the suggested
+   rectangle (lParam; may be null). 0 for a frame without a manager. */
+#ifndef WM_DPICHANGED
+#define WM_DPICHANGED 0x02E0
+#endif
+UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam);
 UINT QBR_GetQuickHelp(void);
 void QBR_SetCustomize(UINT on);
 UINT QBR_GetCustomize(void);

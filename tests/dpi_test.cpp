@@ -259,3 +259,111 @@ TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
     DestroyWindow(frame);
     QBR_Terminate();
 }
+
+// ---- A new scale for a frame ----------------------------------------------------------
+
+namespace {
+
+// A host frame as the README shows it: WM_DPICHANGED goes to the library.
+LRESULT CALLBACK DpiFrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_DPICHANGED) {
+        QBR_DpiChanged(window, wParam, lParam);
+        return 0;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+// The scale each run moves its frame to: another one of the three.
+int OtherDpi(int dpi) { return dpi == 96 ? 144 : dpi == 144 ? 192 : 96; }
+
+const Scaled &At(int dpi) {
+    for (const Scaled &s : kScales)
+        if (s.dpi == dpi) return s;
+    return kScales[0];
+}
+
+std::vector<UINT> BreakIds(const PointerList *breaks) {
+    std::vector<UINT> ids;
+    for (UINT i = 0; i < PointerListCount(breaks); ++i) {
+        UINT id = 0;
+        ItemGetId(ListAt<ToolbarItem>(breaks, i), &id);
+        ids.push_back(id);
+    }
+    return ids;
+}
+
+} // namespace
+
+// WM_DPICHANGED sent to a frame: every toolbar is measured for the new scale
+// with its items and rows, the strip is chosen again, the frame takes the
+// suggested rectangle.
+TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = DpiFrameProc;
+    wc.hInstance = GetModuleHandleA(nullptr);
+    wc.lpszClassName = "QbrDpiFrame";
+    RegisterClassA(&wc);
+    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr,
+                               nullptr, wc.hInstance, nullptr);
+    ToolbarManager *m = QBR_CreateManager(frame);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+    QBR_AddButtons(m, ids, 9);
+    ASSERT_EQ(1u, QBR_SetImageStrip(m, "SINGLE"));
+    HWND top = QBR_CreateDock(m, frame, DOCK_TOP);
+    const UINT docked[] = {1, 2, 0, 3};
+    HWND pane = QBR_CreateToolbar("D", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 4);
+    // Nine buttons floating three to a row.
+    const Scaled &here = Here();
+    const int threeAcross = 3 * here.buttonWidth - 2 + 2 * here.areaLeft + 2 * GetSystemMetrics(SM_CXFRAME);
+    HWND floating = QBR_CreateToolbar("F", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
+    Pump();
+    ToolbarRecord *record = RecordOfWindow(floating);
+    const std::vector<UINT> rows = BreakIds(record->floatingBreaks);
+    ASSERT_EQ((std::vector<UINT>{4, 7}), rows);
+    RECT frameBefore;
+    GetWindowRect(ResolveRoleWindow(floating, ROLE_FLOATING), &frameBefore);
+
+    const Scaled &s = At(OtherDpi(here.dpi));
+    RECT suggested = {60, 50, 60 + 800, 50 + 500};
+    SendMessageA(frame, WM_DPICHANGED, MAKEWPARAM(s.dpi, s.dpi), reinterpret_cast<LPARAM>(&suggested));
+    Pump();
+
+    EXPECT_EQ(static_cast<UINT>(s.dpi), ManagerDpi(m));
+    RECT now;
+    GetWindowRect(frame, &now);
+    EXPECT_EQ(suggested, now);
+    // The docked toolbar: buttons and separator at the new scale.
+    const int l = s.areaLeft, t = s.paneTop, bw = s.buttonWidth, bh = s.buttonHeight;
+    const int three = l + 2 * bw - 2 + s.separator - 1;
+    ToolbarRecord *dockedRecord = RecordOfWindow(pane);
+    std::vector<RECT> rects;
+    for (UINT i = 0; i < 4; ++i) {
+        RECT r = {};
+        GetItemRect(dockedRecord, i, &r);
+        rects.push_back(r);
+    }
+    EXPECT_EQ((std::vector<RECT>{Rect(l, t, l + bw, t + bh), Rect(l + bw - 1, t, l + 2 * bw - 1, t + bh),
+                                 Rect(l + 2 * bw - 2, t, l + 2 * bw - 2 + s.separator, t + bh),
+                                 Rect(three, t, three + bw, t + bh)}),
+              rects);
+    // The floating toolbar keeps its three rows of three, its place, and fits them.
+    EXPECT_EQ(rows, BreakIds(record->floatingBreaks));
+    HWND floatingFrame = ResolveRoleWindow(floating, ROLE_FLOATING);
+    RECT frameAfter;
+    GetWindowRect(floatingFrame, &frameAfter);
+    EXPECT_EQ(frameBefore.left, frameAfter.left);
+    EXPECT_EQ(frameBefore.top, frameAfter.top);
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+              ClientRectOf(floatingFrame));
+    // The strip was chosen again for the new scale.
+    int cw = 0, ch = 0;
+    StripCellSize(m, &cw, &ch);
+    EXPECT_EQ(s.dpi == 192 ? 32 : 16, cw);
+
+    // A frame without a manager, and a change to the same scale, do nothing harmful.
+    EXPECT_EQ(0u, QBR_DpiChanged(nullptr, 0, 0));
+    EXPECT_EQ(1u, QBR_DpiChanged(frame, MAKEWPARAM(s.dpi, s.dpi), 0));
+    QBR_DestroyManager(m);
+    DestroyWindow(frame);
+    Pump();
+}

@@ -450,6 +450,32 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     return 1;
 }
 
+// ---- New display scale -----------------------------------------------------------
+
+extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
+    ToolbarClient *client = CurrentClient();
+    if (!client || !frame) return 0;
+    ToolbarManager *manager = nullptr;
+    for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
+        if (m->frame == frame) manager = m;
+    if (!manager) return 0;
+    const UINT dpi = HIWORD(wParam);
+    if (dpi && dpi != ManagerDpi(manager)) {
+        // As for a new button size: the rows come from the break lists the old
+        // scale made, so the rewrap runs at the new scale before the relayout.
+        int width = 0, height = 0;
+        GetButtonSizes(&width, &height, nullptr, nullptr);
+        manager->dpi = dpi;
+        RewrapManagerToolbars(manager, width, height);
+        if (manager->imageResource) ChooseImageStrip(manager);
+        RelayoutManagerToolbars(manager);
+    }
+    if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
+        SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
+                     suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
+    return 1;
+}
+
 // Both walk every manager of the client in list order.
 static UINT ForEachManager(UINT (*action)(ToolbarManager *, int, int), int w, int h) {
     ToolbarClient *client = CurrentClient();
