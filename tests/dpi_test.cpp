@@ -367,3 +367,126 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
     DestroyWindow(frame);
     Pump();
 }
+
+// ---- The layout table across scales -------------------------------------------------
+
+namespace {
+
+std::vector<std::pair<std::string, std::string>> CaptureTable(ToolbarManager *m) {
+    std::vector<std::pair<std::string, std::string>> table;
+    UINT count = 0;
+    QBR_CaptureLayout(m, &count);
+    for (UINT i = 0; i < count; ++i) {
+        char key[512], value[512];
+        QBR_GetLayoutEntry(i, key, value);
+        table.emplace_back(key, value);
+    }
+    QBR_FreeLayout();
+    return table;
+}
+
+struct LayoutFrame {
+    HWND frame;
+    ToolbarManager *manager;
+};
+
+LayoutFrame MakeLayoutFrame() {
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = DpiFrameProc;
+    wc.hInstance = GetModuleHandleA(nullptr);
+    wc.lpszClassName = "QbrDpiFrame";
+    RegisterClassA(&wc);
+    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr,
+                               nullptr, wc.hInstance, nullptr);
+    ToolbarManager *m = QBR_CreateManager(frame);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+    QBR_AddButtons(m, ids, 9);
+    return {frame, m};
+}
+
+} // namespace
+
+// Written at this run's scale and restored in a frame at another (96 and 144
+// both ways): the floating toolbar stands where it stood on the same screen,
+// with its items and its three rows, measured for the new scale.
+TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
+    const Scaled &here = Here();
+    LayoutFrame a = MakeLayoutFrame();
+    HWND top = QBR_CreateDock(a.manager, a.frame, DOCK_TOP);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9}, docked[] = {1, 0, 2};
+    QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 3);
+    const int threeAcross = 3 * here.buttonWidth - 2 + 2 * here.areaLeft + 2 * GetSystemMetrics(SM_CXFRAME);
+    HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
+    Pump();
+    ASSERT_EQ((std::vector<UINT>{4, 7}), BreakIds(RecordOfWindow(floating)->floatingBreaks));
+    RECT placeBefore;
+    GetWindowRect(ResolveRoleWindow(floating, ROLE_FLOATING), &placeBefore);
+
+    auto table = CaptureTable(a.manager);
+    // The scale is on record only when it is not 96 DPI.
+    std::vector<std::string> keys;
+    for (auto &entry : table)
+        keys.push_back(entry.first);
+    char scale[64];
+    wsprintfA(scale, "%d,%d,%d", here.dpi, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN));
+    if (here.dpi == 96) {
+        EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating"}), keys);
+    } else {
+        EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating", "Display Scale"}), keys);
+        EXPECT_EQ(scale, table.back().second);
+    }
+    QBR_DestroyManager(a.manager);
+    DestroyWindow(a.frame);
+    Pump();
+
+    // The frame that restores it stands on a monitor of the other scale.
+    const Scaled &s = At(here.dpi == 96 ? 144 : 96);
+    LayoutFrame b = MakeLayoutFrame();
+    QBR_DpiChanged(b.frame, MAKEWPARAM(s.dpi, s.dpi), 0);
+    QBR_BeginLayout();
+    for (auto &entry : table)
+        QBR_AddLayoutEntry(entry.first.c_str(), entry.second.c_str());
+    ASSERT_EQ(1u, QBR_ApplyLayout(b.manager, b.frame));
+    QBR_FreeLayout();
+    Pump();
+    EXPECT_EQ(static_cast<UINT>(s.dpi), ManagerDpi(b.manager));
+    ASSERT_EQ(2u, QBR_GetToolbarCount(b.manager));
+    HWND restored = QBR_GetToolbar(b.manager, 1);
+    EXPECT_EQ((std::vector<UINT>{1, 2, 3, 4, 5, 6, 7, 8, 9}), ToolbarIds(restored));
+    EXPECT_EQ((std::vector<UINT>{4, 7}), BreakIds(RecordOfWindow(restored)->floatingBreaks));
+    HWND floatingFrame = ResolveRoleWindow(restored, ROLE_FLOATING);
+    RECT placeAfter;
+    GetWindowRect(floatingFrame, &placeAfter);
+    EXPECT_EQ(placeBefore.left, placeAfter.left);
+    EXPECT_EQ(placeBefore.top, placeAfter.top);
+    const int l = s.areaLeft, bw = s.buttonWidth, bh = s.buttonHeight;
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+              ClientRectOf(floatingFrame));
+    EXPECT_EQ((std::vector<UINT>{1, 0, 2}), ToolbarIds(QBR_GetToolbar(b.manager, 0)));
+    QBR_DestroyManager(b.manager);
+    DestroyWindow(b.frame);
+    Pump();
+}
+
+// A table written on a screen half this one's size puts the floating toolbar
+// at twice its numbers: the same place in proportion to the screen.
+TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
+    LayoutFrame b = MakeLayoutFrame();
+    const int w = GetSystemMetrics(SM_CXSCREEN), h = GetSystemMetrics(SM_CYSCREEN);
+    char scale[64];
+    wsprintfA(scale, "144,%d,%d", w / 2, h / 2);
+    QBR_BeginLayout();
+    QBR_AddLayoutEntry("Top Dock", "Floating");
+    QBR_AddLayoutEntry("Floating", "3,1,2,3,33,100,80,200,150");
+    QBR_AddLayoutEntry("Display Scale", scale);
+    ASSERT_EQ(1u, QBR_ApplyLayout(b.manager, b.frame));
+    QBR_FreeLayout();
+    Pump();
+    RECT place;
+    GetWindowRect(ResolveRoleWindow(QBR_GetToolbar(b.manager, 0), ROLE_FLOATING), &place);
+    EXPECT_EQ(MulDiv(100, w, w / 2), place.left);
+    EXPECT_EQ(MulDiv(80, h, h / 2), place.top);
+    QBR_DestroyManager(b.manager);
+    DestroyWindow(b.frame);
+    Pump();
+}

@@ -98,6 +98,9 @@ UINT RewrapAllManagers(int newWidth, int newHeight);
 UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight);
 UINT RelayoutAllManagers();
 UINT RelayoutManagerToolbars(ToolbarManager *manager);
+// Measures a manager's toolbars again for another display scale, each
+// keeping its items and rows; 0 when the scale is 0 or unchanged.
+UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi);
 
 void ScreenRectToClient(HWND window, RECT *rect);
 void ClientRectToScreen(HWND window, RECT *rect);

@@ -452,6 +452,19 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
 
 // ---- New display scale -----------------------------------------------------------
 
+UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
+    if (!manager || !dpi || dpi == ManagerDpi(manager)) return 0;
+    // As for a new button size: the rows come from the break lists the old
+    // scale made, so the rewrap runs at the new scale before the relayout.
+    int width = 0, height = 0;
+    GetButtonSizes(&width, &height, nullptr, nullptr);
+    manager->dpi = dpi;
+    RewrapManagerToolbars(manager, width, height);
+    if (manager->imageResource) ChooseImageStrip(manager);
+    RelayoutManagerToolbars(manager);
+    return 1;
+}
+
 extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
     ToolbarClient *client = CurrentClient();
     if (!client || !frame) return 0;
@@ -459,17 +472,7 @@ extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
     for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
         if (m->frame == frame) manager = m;
     if (!manager) return 0;
-    const UINT dpi = HIWORD(wParam);
-    if (dpi && dpi != ManagerDpi(manager)) {
-        // As for a new button size: the rows come from the break lists the old
-        // scale made, so the rewrap runs at the new scale before the relayout.
-        int width = 0, height = 0;
-        GetButtonSizes(&width, &height, nullptr, nullptr);
-        manager->dpi = dpi;
-        RewrapManagerToolbars(manager, width, height);
-        if (manager->imageResource) ChooseImageStrip(manager);
-        RelayoutManagerToolbars(manager);
-    }
+    RescaleManagerToolbars(manager, HIWORD(wParam));
     if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
         SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
                      suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
