@@ -314,7 +314,8 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
     HWND pane = QBR_CreateToolbar("D", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 4);
     // Nine buttons floating three to a row.
     const Scaled &here = Here();
-    const int threeAcross = 3 * here.buttonWidth - 2 + 2 * here.areaLeft + 2 * GetSystemMetrics(SM_CXFRAME);
+    // A width for three buttons at 96 DPI: the same three at every scale.
+    const int threeAcross = 3 * 24 - 2 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME);
     HWND floating = QBR_CreateToolbar("F", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
     Pump();
     ToolbarRecord *record = RecordOfWindow(floating);
@@ -415,7 +416,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
     HWND top = QBR_CreateDock(a.manager, a.frame, DOCK_TOP);
     const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9}, docked[] = {1, 0, 2};
     QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 3);
-    const int threeAcross = 3 * here.buttonWidth - 2 + 2 * here.areaLeft + 2 * GetSystemMetrics(SM_CXFRAME);
+    const int threeAcross = 3 * 24 - 2 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME); // at 96 DPI
     HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
     Pump();
     ASSERT_EQ((std::vector<UINT>{4, 7}), BreakIds(RecordOfWindow(floating)->floatingBreaks));
