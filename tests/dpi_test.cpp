@@ -491,3 +491,30 @@ TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
     DestroyWindow(b.frame);
     Pump();
 }
+
+// The floating frame's caption at the frame's scale: the band as tall as the
+// caption font at this DPI makes it, the line under it, then the margin above
+// the items, read back from the screen.
+TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
+    const Scaled &s = Here();
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    RedrawWindow(frameWindow, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_FRAME);
+    Pixels shown = ReadWindowPixels(frameWindow);
+    // A 7-point font is MulDiv(7, dpi, 72) pixels high: its ascent grows with
+    // the scale (the exact ascent is the installed font's).
+    EXPECT_GE(captionHeight, MulDiv(7, s.dpi, 72) * 2 / 3);
+    const int x = shown.width - 2; // right of the centred title
+    std::vector<COLORREF> column, expected;
+    for (int y = 0; y < captionHeight + s.frameTop; ++y) {
+        column.push_back(shown.At(x, y));
+        expected.push_back(y < captionHeight - 1    ? GetSysColor(COLOR_ACTIVECAPTION)
+                           : y == captionHeight - 1 ? GetSysColor(COLOR_WINDOWFRAME)
+                                                    : GetSysColor(COLOR_BTNFACE));
+    }
+    EXPECT_EQ(expected, column);
+    // The first button's frame ring starts right below the margin.
+    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
+}
