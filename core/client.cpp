@@ -137,7 +137,9 @@ UINT WindowDpi(HWND window) {
 
 UINT ManagerDpi(const ToolbarManager *manager) { return manager && manager->dpi ? manager->dpi : kBaseDpi; }
 
-int ScaleToDpi(int value, UINT dpi) { return dpi == kBaseDpi || dpi == 0 ? value : MulDiv(value, static_cast<int>(dpi), kBaseDpi); }
+int ScaleToDpi(int value, UINT dpi) {
+    return dpi == kBaseDpi || dpi == 0 ? value : MulDiv(value, static_cast<int>(dpi), kBaseDpi);
+}
 
 UINT GetButtonSizesAt(UINT dpi, int *width, int *height, int *imageWidth, int *imageHeight) {
     int sizes[4] = {0, 0, 0, 0};

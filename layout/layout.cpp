@@ -293,8 +293,7 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
         RECT r;
         GetWindowRect(frame, &r);
         SetWindowPos(frame, nullptr, MulDiv(r.left, width, written.screenWidth),
-                     MulDiv(r.top, height, written.screenHeight), 0, 0,
-                     SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+                     MulDiv(r.top, height, written.screenHeight), 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
     }
 }
 

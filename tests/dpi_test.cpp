@@ -154,8 +154,8 @@ struct StripCase {
     int cellWidth, cellHeight;
 };
 constexpr StripCase kStripCases[] = {
-    {"MAIN", 96, 100, 1, 16, 15},    {"SINGLE", 96, 100, 1, 16, 15},  {"MAIN", 144, 150, 1, 24, 23},
-    {"SINGLE", 144, 100, 1, 16, 15}, {"MAIN", 192, 150, 1, 24, 23}, {"SINGLE", 192, 100, 2, 32, 30},
+    {"MAIN", 96, 100, 1, 16, 15},    {"SINGLE", 96, 100, 1, 16, 15}, {"MAIN", 144, 150, 1, 24, 23},
+    {"SINGLE", 144, 100, 1, 16, 15}, {"MAIN", 192, 150, 1, 24, 23},  {"SINGLE", 192, 100, 2, 32, 30},
 };
 
 // Every pixel of a bitmap, top row first.
@@ -229,7 +229,8 @@ TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
         for (UINT index = 0; index < 3; ++index) {
             UINT image = 0;
             QBR_GetButtonImage(manager, index + 1, &image);
-            const int sx = static_cast<int>(image % columns) * (cw / f), sy = static_cast<int>(image / columns) * (ch / f);
+            const int sx = static_cast<int>(image % columns) * (cw / f),
+                      sy = static_cast<int>(image / columns) * (ch / f);
             const int w = s.buttonWidth - 2, h = s.buttonHeight - 2;
             const int ix = rects[index].left + 1 + ((w - cw - 1) >> 1);
             const int iy = rects[index].top + 1 + ((h - ch) >> 1);
@@ -282,6 +283,26 @@ const Scaled &At(int dpi) {
     return kScales[0];
 }
 
+// A shown frame whose manager has buttons 1 to 9.
+struct DpiFrame {
+    HWND frame;
+    ToolbarManager *manager;
+};
+
+DpiFrame MakeDpiFrame() {
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = DpiFrameProc;
+    wc.hInstance = GetModuleHandleA(nullptr);
+    wc.lpszClassName = "QbrDpiFrame";
+    RegisterClassA(&wc);
+    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr, nullptr,
+                               wc.hInstance, nullptr);
+    ToolbarManager *m = QBR_CreateManager(frame);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+    QBR_AddButtons(m, ids, 9);
+    return {frame, m};
+}
+
 std::vector<UINT> BreakIds(const PointerList *breaks) {
     std::vector<UINT> ids;
     for (UINT i = 0; i < PointerListCount(breaks); ++i) {
@@ -298,16 +319,10 @@ std::vector<UINT> BreakIds(const PointerList *breaks) {
 // with its items and rows, the strip is chosen again, the frame takes the
 // suggested rectangle.
 TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
-    WNDCLASSA wc = {};
-    wc.lpfnWndProc = DpiFrameProc;
-    wc.hInstance = GetModuleHandleA(nullptr);
-    wc.lpszClassName = "QbrDpiFrame";
-    RegisterClassA(&wc);
-    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr,
-                               nullptr, wc.hInstance, nullptr);
-    ToolbarManager *m = QBR_CreateManager(frame);
+    const DpiFrame made = MakeDpiFrame();
+    HWND frame = made.frame;
+    ToolbarManager *m = made.manager;
     const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
-    QBR_AddButtons(m, ids, 9);
     ASSERT_EQ(1u, QBR_SetImageStrip(m, "SINGLE"));
     HWND top = QBR_CreateDock(m, frame, DOCK_TOP);
     const UINT docked[] = {1, 2, 0, 3};
@@ -386,25 +401,6 @@ std::vector<std::pair<std::string, std::string>> CaptureTable(ToolbarManager *m)
     return table;
 }
 
-struct LayoutFrame {
-    HWND frame;
-    ToolbarManager *manager;
-};
-
-LayoutFrame MakeLayoutFrame() {
-    WNDCLASSA wc = {};
-    wc.lpfnWndProc = DpiFrameProc;
-    wc.hInstance = GetModuleHandleA(nullptr);
-    wc.lpszClassName = "QbrDpiFrame";
-    RegisterClassA(&wc);
-    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr,
-                               nullptr, wc.hInstance, nullptr);
-    ToolbarManager *m = QBR_CreateManager(frame);
-    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
-    QBR_AddButtons(m, ids, 9);
-    return {frame, m};
-}
-
 } // namespace
 
 // Written at this run's scale and restored in a frame at another (96 and 144
@@ -412,7 +408,7 @@ LayoutFrame MakeLayoutFrame() {
 // with its items and its three rows, measured for the new scale.
 TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
     const Scaled &here = Here();
-    LayoutFrame a = MakeLayoutFrame();
+    DpiFrame a = MakeDpiFrame();
     HWND top = QBR_CreateDock(a.manager, a.frame, DOCK_TOP);
     const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9}, docked[] = {1, 0, 2};
     QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 3);
@@ -442,7 +438,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
 
     // The frame that restores it stands on a monitor of the other scale.
     const Scaled &s = At(here.dpi == 96 ? 144 : 96);
-    LayoutFrame b = MakeLayoutFrame();
+    DpiFrame b = MakeDpiFrame();
     QBR_DpiChanged(b.frame, MAKEWPARAM(s.dpi, s.dpi), 0);
     QBR_BeginLayout();
     for (auto &entry : table)
@@ -472,7 +468,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
 // A table written on a screen half this one's size puts the floating toolbar
 // at twice its numbers: the same place in proportion to the screen.
 TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
-    LayoutFrame b = MakeLayoutFrame();
+    DpiFrame b = MakeDpiFrame();
     const int w = GetSystemMetrics(SM_CXSCREEN), h = GetSystemMetrics(SM_CYSCREEN);
     char scale[64];
     wsprintfA(scale, "144,%d,%d", w / 2, h / 2);

@@ -170,8 +170,8 @@ RECT AreaMargins(HWND window, int role) {
         return RECT{ScaleToDpi(kAreaLeft, dpi), ScaleToDpi(kPaneAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
                     ScaleToDpi(kPaneAreaBottom, dpi)};
     // The caption band is the caption font's, which already has the screen's scale.
-    return RECT{ScaleToDpi(kAreaLeft, dpi), captionHeight + ScaleToDpi(kFrameAreaTop, dpi),
-                ScaleToDpi(kAreaRight, dpi), ScaleToDpi(kFrameAreaBottom, dpi)};
+    return RECT{ScaleToDpi(kAreaLeft, dpi), captionHeight + ScaleToDpi(kFrameAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
+                ScaleToDpi(kFrameAreaBottom, dpi)};
 }
 
 void GetItemArea(HWND window, int role, RECT *rect) {
