@@ -97,6 +97,59 @@ UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight) 
     return 1;
 }
 
+// ---- Display scale -----------------------------------------------------------
+
+namespace {
+
+using GetDpiForWindowProc = UINT(WINAPI *)(HWND);
+
+// GetDpiForWindow came with Windows 10 version 1607. It is looked up by name,
+// once, so that the library still loads on older systems, where every window
+// has the screen's one scale.
+GetDpiForWindowProc DpiForWindowCall() {
+    static bool looked = false;
+    static GetDpiForWindowProc call = nullptr;
+    if (!looked) {
+        looked = true;
+        if (HMODULE user = GetModuleHandleA("user32.dll")) {
+            // Through a plain function pointer type first: FARPROC and the
+            // real signature are unrelated function types.
+            auto found = reinterpret_cast<void (*)()>(GetProcAddress(user, "GetDpiForWindow"));
+            call = reinterpret_cast<GetDpiForWindowProc>(found);
+        }
+    }
+    return call;
+}
+
+} // namespace
+
+UINT WindowDpi(HWND window) {
+    if (GetDpiForWindowProc call = DpiForWindowCall()) {
+        UINT dpi = window ? call(window) : 0;
+        if (dpi) return dpi;
+    }
+    HDC screen = GetDC(nullptr);
+    int dpi = screen ? GetDeviceCaps(screen, LOGPIXELSY) : 0;
+    if (screen) ReleaseDC(nullptr, screen);
+    // A screen that cannot be asked is taken at 100 %.
+    return dpi > 0 ? static_cast<UINT>(dpi) : kBaseDpi;
+}
+
+UINT ManagerDpi(const ToolbarManager *manager) { return manager && manager->dpi ? manager->dpi : kBaseDpi; }
+
+int ScaleToDpi(int value, UINT dpi) {
+    return dpi == kBaseDpi || dpi == 0 ? value : MulDiv(value, static_cast<int>(dpi), kBaseDpi);
+}
+
+UINT GetButtonSizesAt(UINT dpi, int *width, int *height, int *imageWidth, int *imageHeight) {
+    int sizes[4] = {0, 0, 0, 0};
+    if (!GetButtonSizes(&sizes[0], &sizes[1], &sizes[2], &sizes[3])) return 0;
+    int *outs[4] = {width, height, imageWidth, imageHeight};
+    for (int i = 0; i < 4; ++i)
+        if (outs[i]) *outs[i] = ScaleToDpi(sizes[i], dpi);
+    return 1;
+}
+
 extern "C" UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc) {
     ToolbarClient *client = RegisterClient(instance, helpTextProc);
     if (!client) return 0;

@@ -76,6 +76,18 @@ UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int 
                       int *textButtonHeight);
 UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight);
 
+// ---- Display scale -----------------------------------------------------------
+// Every size in pixels that the library and its host name (button metrics,
+// margins, separators) is a size at 96 DPI, 100 %. Each frame's manager keeps
+// the DPI of its frame, and sizes are made for it where they are made:
+// ScaleToDpi(value, dpi) is MulDiv(value, dpi, 96), rounded.
+constexpr UINT kBaseDpi = 96;
+UINT WindowDpi(HWND window);
+UINT ManagerDpi(const ToolbarManager *manager);
+int ScaleToDpi(int value, UINT dpi);
+// GetButtonSizes at a DPI: the client's metrics scaled.
+UINT GetButtonSizesAt(UINT dpi, int *width, int *height, int *imageWidth, int *imageHeight);
+
 // ---- Manager and catalog --------------------------------------------------
 UINT AddButtonItem(ToolbarManager *manager, UINT id, UINT imageIndex);
 UINT AddSeparatorItem(ToolbarManager *manager, UINT id, int width, int height);
@@ -89,6 +101,8 @@ UINT ItemGetKind(const ToolbarItem *item, UINT *out);
 UINT ItemSetCategory(ToolbarItem *item, UINT category);
 void *ItemGetData(const ToolbarItem *item);
 UINT ItemGetSize(const ToolbarItem *item, int *width, int *height);
+// The size of an item at a DPI (ItemGetSize gives it at 96).
+UINT ItemGetSizeAt(const ToolbarItem *item, UINT dpi, int *width, int *height);
 
 UINT ButtonGetImageIndex(const ButtonData *data, UINT *out);
 UINT ButtonSetImageIndex(ButtonData *data, UINT value);

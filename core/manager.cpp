@@ -21,6 +21,7 @@ extern "C" ToolbarManager *QBR_CreateManager(HWND frame) {
     if (!MemoryBlockAllocRecord(&manager)) return nullptr;
     BlockFill(manager, 0, sizeof(ToolbarManager));
     manager->frame = frame;
+    manager->dpi = WindowDpi(frame);
     manager->docks = PointerListCreate(1, 1, 0);
     manager->toolbars = PointerListCreate(1, 1, 0);
     manager->items = PointerListCreate(5, 5, 0);
@@ -88,6 +89,7 @@ extern "C" void QBR_DestroyManager(ToolbarManager *manager) {
     PointerListDestroy(manager->items);
     manager->items = nullptr;
     if (manager->imageStrip) GdiDelete(manager->imageStrip);
+    if (manager->imageName) MemoryBlockFree(manager->imageName);
     if (manager->categories) MemoryBlockFree(manager->categories);
     if (PointerListRemove(client->managers, ListValue(manager))) UnwatchHostActivation();
     MemoryBlockFree(manager);
@@ -125,16 +127,15 @@ extern "C" UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName) 
     if (!client || !manager) return 0;
     HRSRC resource = FindResourceA(client->instance, resourceName, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
     if (!resource) return 0;
-    // A second call replaces the strip; the bitmap it replaces is the
-    // manager's alone and goes now, or it would stay made for the life of
-    // the process. Toolbars paint from the new one at their next paint.
-    // A failed load keeps the strip the toolbars have.
-    HBITMAP strip = LoadImageStrip(client->instance, resource);
-    if (!strip) return 0;
-    if (manager->imageStrip) GdiDelete(manager->imageStrip);
+    // A second call replaces the strip: the chooser loads the new bitmap
+    // first and only then deletes the one it replaces, which is the manager's
+    // alone. Toolbars paint from the new one at their next paint.
     manager->imageResource = resource;
-    manager->imageStrip = strip;
-    return 1;
+    // Kept for the strips of other display scales, which are found by name.
+    if (manager->imageName) MemoryBlockFree(manager->imageName);
+    manager->imageName = nullptr;
+    if (!IS_INTRESOURCE(resourceName)) StringDuplicate(&manager->imageName, resourceName);
+    return ChooseImageStrip(manager);
 }
 
 extern "C" UINT QBR_GetToolbarCount(ToolbarManager *manager) {
@@ -246,6 +247,14 @@ UINT ItemGetSize(const ToolbarItem *item, int *width, int *height) {
         return 1;
     }
     return 0;
+}
+
+UINT ItemGetSizeAt(const ToolbarItem *item, UINT dpi, int *width, int *height) {
+    int w = 0, h = 0;
+    if (!ItemGetSize(item, &w, &h)) return 0;
+    if (width) *width = ScaleToDpi(w, dpi);
+    if (height) *height = ScaleToDpi(h, dpi);
+    return 1;
 }
 
 // ---- Button data -----------------------------------------------------------------

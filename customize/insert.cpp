@@ -66,7 +66,7 @@ void OnInitDialog(HWND dialog) {
 void OnMeasureItem(MEASUREITEMSTRUCT *measure) {
     if (measure->CtlID != kItemList) return;
     int width, height;
-    if (!ItemGetSize(reinterpret_cast<ToolbarItem *>(measure->itemData), &width, &height)) return;
+    if (!ItemGetSizeAt(reinterpret_cast<ToolbarItem *>(measure->itemData), ManagerDpi(insertManager), &width, &height)) return;
     measure->itemHeight = static_cast<UINT>(height + 2 * kLineMargin);
     measure->itemWidth = static_cast<UINT>(width + 2 * kLineMargin);
 }
@@ -93,7 +93,7 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
     auto *item = reinterpret_cast<ToolbarItem *>(draw->itemData);
     int width, height;
     UINT kind;
-    if (!ItemGetSize(item, &width, &height) || !ItemGetKind(item, &kind)) return;
+    if (!ItemGetSizeAt(item, ManagerDpi(insertManager), &width, &height) || !ItemGetKind(item, &kind)) return;
     if (kind == ITEM_BUTTON) {
         RECT button;
         button.left = (line.right - width + line.left) >> 1; // centred across the line
@@ -147,7 +147,7 @@ LRESULT OnListPress(HWND list, UINT message, WPARAM wParam, LPARAM lParam) {
     if (line == LB_ERR) return 0;
     insertDragItem = reinterpret_cast<ToolbarItem *>(SendMessageA(list, LB_GETITEMDATA, line, 0));
     int width, height;
-    if (!ItemGetSize(insertDragItem, &width, &height)) return 0;
+    if (!ItemGetSizeAt(insertDragItem, ManagerDpi(insertManager), &width, &height)) return 0;
 
     SendMessageA(list, LB_GETITEMRECT, line, reinterpret_cast<LPARAM>(&insertDragFrame));
     ClientRectToScreen(list, &insertDragFrame);

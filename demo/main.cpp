@@ -153,6 +153,9 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM
     case WM_MENUSELECT:
         OnMenuSelect(mainStatusBar, wParam);
         return 0;
+    case WM_DPICHANGED:
+        QBR_DpiChanged(window, wParam, lParam);
+        return 0;
     }
     return DefWindowProcA(window, message, wParam, lParam);
 }
@@ -275,6 +278,9 @@ LRESULT CALLBACK ViewWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM
         return 0;
     case WM_MENUSELECT:
         if (state) OnMenuSelect(state->statusBar, wParam);
+        return 0;
+    case WM_DPICHANGED:
+        QBR_DpiChanged(window, wParam, lParam);
         return 0;
     }
     return DefWindowProcA(window, message, wParam, lParam);

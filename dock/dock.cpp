@@ -269,7 +269,7 @@ void PlaceDock(HWND window, RECT *rect) {
         // and its height still pushes the side docks down.
         show = SW_HIDE;
         int width = 0, height = 0;
-        GetButtonSizes(&width, &height, nullptr, nullptr);
+        GetButtonSizesAt(ManagerDpi(DockManager(window)), &width, &height, nullptr, nullptr);
         rect->right = width;
         rect->bottom = height;
     }

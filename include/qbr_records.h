@@ -52,6 +52,10 @@ struct ToolbarManager {
     UINT categoryCount;
     HRSRC imageResource;
     HBITMAP imageStrip;
+    UINT dpi; /* the frame's display scale that sizes are made for; 96 is 100 % */
+    LPSTR imageName;  /* the strip's resource name, owned; null for a numbered resource */
+    UINT imageScale;  /* the scale in per cent that imageStrip was drawn for; 0 is 100 */
+    UINT imageFactor; /* the whole factor it was enlarged by since; 0 is 1 */
 };
 
 typedef struct ToolbarItem {

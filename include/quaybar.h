@@ -77,9 +77,24 @@ extern HINSTANCE moduleInstance;
 UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc);
 void QBR_Terminate(void);
 void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage);
+/* Sizes in pixels at 96 DPI (100 %), 0 for the default (24, 22, 16, 15, 48,
+   44). Each frame's toolbars scale them to the frame's DPI with MulDiv: at
+   144 DPI the defaults are 36, 33, 24, 23, 72, 66. */
 void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imageWidth, int imageHeight, int textButtonWidth,
                           int textButtonHeight);
 void QBR_SetQuickHelp(UINT on);
+
+/* A new display scale for a frame. A per-monitor DPI aware host calls this
+   from the frame's WM_DPICHANGED with the message's parameters, and returns 0:
+       case WM_DPICHANGED: QBR_DpiChanged(window, wParam, lParam); return 0;
+   The frame's toolbars, docks and floating frames are measured again for the
+   new DPI (HIWORD of wParam), each toolbar keeping its items and rows, its
+   strip is chosen again for the scale, and the frame takes the suggested
+   rectangle (lParam; may be null). 0 for a frame without a manager. */
+#ifndef WM_DPICHANGED
+#define WM_DPICHANGED 0x02E0
+#endif
+UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam);
 UINT QBR_GetQuickHelp(void);
 void QBR_SetCustomize(UINT on);
 UINT QBR_GetCustomize(void);
@@ -92,6 +107,13 @@ void QBR_DestroyManager(ToolbarManager *manager);
 UINT QBR_SetCategories(ToolbarManager *manager, const UINT *ids, UINT count);
 UINT QBR_AddButtons(ToolbarManager *manager, const UINT *ids, UINT count);
 UINT QBR_AssignCategory(ToolbarManager *manager, UINT category, const UINT *ids, UINT count);
+/* The strip is a 16-colour BITMAP resource of the host at 100 % (96 DPI).
+   The same images drawn for larger display scales may be given beside it as
+   resources named resourceName, an underscore and the scale in per cent:
+   "Main" with "Main_150" (144 DPI) and "Main_200" (192 DPI). A frame uses
+   the strip of its own scale, else the nearest smaller one enlarged by the
+   largest whole factor that fits (pixel for pixel, never blurred), its
+   images centred in the buttons. A numbered resource has no such strips. */
 UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName);
 UINT QBR_SetButtonBehaviour(ToolbarManager *manager, UINT id, UINT behaviour);
 UINT QBR_SetButtonState(ToolbarManager *manager, UINT id, UINT state);
@@ -107,7 +129,9 @@ UINT QBR_IsButtonPressed(ToolbarManager *manager, UINT id);
 UINT QBR_GetToolbarCount(ToolbarManager *manager);
 HWND QBR_GetToolbar(ToolbarManager *manager, UINT index);
 
-/* Toolbars. A toolbar is named by the handle of its docked pane. */
+/* Toolbars. A toolbar is named by the handle of its docked pane. x and y
+   place its floating frame on the screen; width and height, like the button
+   metrics, are 96-DPI sizes that the frame's scale enlarges. */
 HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock, const UINT *ids,
                        UINT idCount);
 void QBR_DestroyToolbar(HWND pane);

@@ -14,6 +14,10 @@ static LPSTR *layoutKeys = nullptr;
 static LPSTR *layoutValues = nullptr;
 
 constexpr UINT kDockKeyBase = 5106; // "Top Dock", "Left Dock", "Right Dock"
+// The display scale the table was written at, as "DPI,screen width,screen
+// height". Written only when the scale is not 96 DPI, so that a table of a
+// frame at 100 % is the same as ever; a table without it was written at 96.
+constexpr char kScaleKey[] = "Display Scale";
 
 static UINT PointerBytes(UINT count) { return count * static_cast<UINT>(sizeof(LPSTR)); }
 
@@ -173,6 +177,11 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
         MemoryBlockFree(values);
         layoutCount += n;
     }
+    if (ManagerDpi(manager) != kBaseDpi) {
+        char scale[64];
+        wsprintfA(scale, "%u,%d,%d", ManagerDpi(manager), GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN));
+        if (!QBR_AddLayoutEntry(kScaleKey, scale)) return 0;
+    }
     if (count) *count = layoutCount;
     return 1;
 }
@@ -267,7 +276,56 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
     return 1;
 }
 
+// The scale and screen a table was written at; 96 DPI and today's screen
+// when it does not say, or says something no screen has.
+struct WrittenScale {
+    UINT dpi;
+    int screenWidth, screenHeight;
+};
+
+static WrittenScale ReadWrittenScale(LPSTR *keys, LPSTR *values, UINT count) {
+    WrittenScale written = {kBaseDpi, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    LPSTR value;
+    if (!FindLayoutValue(keys, values, count, kScaleKey, &value)) return written;
+    // Read from a copy: reading tokens uses up the value.
+    std::vector<char> copy(static_cast<size_t>(lstrlenA(value)) + 1);
+    StringCopy(copy.data(), value);
+    const int dpi = ReadTokenInt(copy.data());
+    const int width = ReadTokenInt(copy.data());
+    const int height = ReadTokenInt(copy.data());
+    if (dpi >= 48 && dpi <= 1920) written.dpi = static_cast<UINT>(dpi);
+    if (width > 0 && height > 0) {
+        written.screenWidth = width;
+        written.screenHeight = height;
+    }
+    return written;
+}
+
+// Each floating toolbar where it stood in proportion to the screen it was
+// written on.
+static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScale &written) {
+    const int width = GetSystemMetrics(SM_CXSCREEN), height = GetSystemMetrics(SM_CYSCREEN);
+    if (width == written.screenWidth && height == written.screenHeight) return;
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
+        HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
+        if (!frame) continue;
+        RECT r;
+        GetWindowRect(frame, &r);
+        SetWindowPos(frame, nullptr, MulDiv(r.left, width, written.screenWidth),
+                     MulDiv(r.top, height, written.screenHeight), 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+    }
+}
+
 extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     if (!manager) return 1;
-    return ApplyLayoutRecords(manager, frame, layoutKeys, layoutValues, layoutCount);
+    // A table written at another scale is applied at that scale, as it was
+    // measured, and then measured again for the frame's: each toolbar keeps
+    // its items and its rows.
+    const WrittenScale written = ReadWrittenScale(layoutKeys, layoutValues, layoutCount);
+    const UINT dpi = ManagerDpi(manager);
+    manager->dpi = written.dpi;
+    UINT ok = ApplyLayoutRecords(manager, frame, layoutKeys, layoutValues, layoutCount);
+    RescaleManagerToolbars(manager, dpi);
+    PlaceFloatingInProportion(manager, written);
+    return ok;
 }

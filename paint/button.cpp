@@ -10,6 +10,11 @@ static HGDIOBJ savedStripObject = nullptr;
 static HGDIOBJ savedMaskObject = nullptr;
 static HBITMAP maskBitmap = nullptr;
 static int stripColumns = 0;
+// The display scale of the pass (its manager's) and the size of one image in
+// the strip it draws from, which is the size the image is drawn at.
+static UINT passDpi = kBaseDpi;
+static int cellWidth = 0;
+static int cellHeight = 0;
 
 namespace {
 
@@ -34,8 +39,7 @@ void MaskedBrushBlt(int x, int y, int width, int height, HBRUSH brush, DWORD rop
 }
 
 void SourceOfImage(UINT imageIndex, int *sourceX, int *sourceY) {
-    int iw = 0, ih = 0;
-    GetButtonSizes(nullptr, nullptr, &iw, &ih);
+    const int iw = cellWidth, ih = cellHeight;
     UINT column = 0, row = 0;
     StripCellOf(imageIndex, &column, &row);
     *sourceX = static_cast<int>(column) * iw;
@@ -60,17 +64,21 @@ void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color) {
 }
 
 UINT BeginButtonPaint(ToolbarManager *manager, HDC dc) {
-    int bw = 0, bh = 0, iw = 0;
-    if (!manager || !dc || !GetButtonSizes(&bw, &bh, &iw, nullptr)) return 0;
+    int bw = 0, bh = 0;
+    if (!manager || !dc || !CurrentClient()) return 0;
+    passDpi = ManagerDpi(manager);
+    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
     targetDC = dc;
 
-    savedStripObject = manager->imageStrip ? SelectObject(stripDC, manager->imageStrip) : nullptr;
+    HBITMAP image = manager->imageStrip;
+    savedStripObject = image ? SelectObject(stripDC, image) : nullptr;
     if (!savedStripObject) return 0;
+    StripCellSize(manager, &cellWidth, &cellHeight);
 
     BITMAP strip;
     BlockFill(&strip, 0, sizeof(strip));
-    GetObjectA(manager->imageStrip, sizeof(strip), &strip);
-    stripColumns = iw > 0 ? strip.bmWidth / iw : 0;
+    GetObjectA(image, sizeof(strip), &strip);
+    stripColumns = cellWidth > 0 ? strip.bmWidth / cellWidth : 0;
 
     // The caller stops drawing after a failure and does not end the pass, so
     // what this pass selected so far is put back here.
@@ -122,8 +130,9 @@ static void ErodeMask(int width, int height) {
 }
 
 void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, UINT erode) {
-    int bw = 0, bh = 0, iw = 0, ih = 0;
-    GetButtonSizes(&bw, &bh, &iw, &ih);
+    int bw = 0, bh = 0;
+    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
+    const int iw = cellWidth, ih = cellHeight;
     // Everything outside the image counts as background.
     PatBlt(maskDC, 0, 0, bw - 2, bh - 2, WHITENESS);
 
@@ -163,8 +172,9 @@ void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
     const auto *button = item->kind == ITEM_BUTTON ? static_cast<const ButtonData *>(ItemGetData(item)) : nullptr;
     if (!button) return;
 
-    int bw = 0, bh = 0, iw = 0, ih = 0;
-    GetButtonSizes(&bw, &bh, &iw, &ih);
+    int bw = 0, bh = 0;
+    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
+    const int iw = cellWidth, ih = cellHeight;
     const bool on = !noState && ButtonGetState(button) == 1;
     const bool mixed = !noState && ButtonGetState(button) == 2;
     const bool pressed = !noState && ButtonIsPressed(button) != 0;
@@ -177,7 +187,7 @@ void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
     const int w = bw - 2;
     const int h = bh - 2;
     int imageX = (w - iw - 1) >> 1;
-    int imageY = client->buttonText ? 5 : (h - ih) >> 1;
+    int imageY = client->buttonText ? ScaleToDpi(5, passDpi) : (h - ih) >> 1;
     int labelDX = 0;
     int labelDY = 0;
 
@@ -259,7 +269,7 @@ void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
             // A label wider than the button gets a negative offset and
             // overhangs both sides; only the window clips it.
             const int labelX = x + labelDX + ((w - extent.cx - 1) >> 1);
-            const int labelY = y + labelDY + h - extent.cy - 3;
+            const int labelY = y + labelDY + h - extent.cy - ScaleToDpi(3, passDpi);
             ExtTextOutA(targetDC, labelX, labelY, 0, nullptr, text, static_cast<UINT>(length), nullptr);
         }
         SetBkMode(targetDC, oldMode);
@@ -273,7 +283,8 @@ constexpr int kFocusInset = 3;
 void PaintFocusRect(const RECT *rect) {
     if (!targetDC || !rect) return;
     RECT focus = *rect;
-    InflateRect(&focus, -kFocusInset, -kFocusInset);
+    const int inset = ScaleToDpi(kFocusInset, passDpi);
+    InflateRect(&focus, -inset, -inset);
     // The dots invert what lies under them, black and white being the
     // colours the platform's own controls draw them with.
     const COLORREF oldText = SetTextColor(targetDC, RGB(0, 0, 0));

@@ -18,6 +18,13 @@ extern HBRUSH ditherBrush;
 UINT PaintResourcesStart();
 void PaintResourcesEnd();
 HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource);
+// Loads into manager->imageStrip the strip that suits the manager's display
+// scale: the host's strip drawn for that scale if it has one, else the
+// nearest smaller one enlarged by a whole factor. 0 when none loads.
+UINT ChooseImageStrip(ToolbarManager *manager);
+// The size of one image in the manager's strip: the image metrics at the
+// strip's own scale, times the factor it was enlarged by.
+void StripCellSize(const ToolbarManager *manager, int *width, int *height);
 UINT RefreshPaintColors();
 HBITMAP MakeDitherBitmap();
 void StripCellOf(UINT imageIndex, UINT *column, UINT *row);

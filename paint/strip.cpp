@@ -128,6 +128,122 @@ HBITMAP MakeDitherBitmap() {
                                    reinterpret_cast<const BITMAPINFO *>(&image), DIB_RGB_COLORS));
 }
 
+// ---- Strips for display scales ------------------------------------------------------
+//
+// A host gives its strip at 100 % under a name ("Main") and may give the
+// same images drawn for larger scales as resources named with the scale in
+// per cent after an underscore ("Main_150", "Main_200"). A frame at 150 %
+// (144 DPI) uses "Main_150"; at a scale with no strip of its own, the nearest
+// smaller one is enlarged by the largest whole factor that still fits the
+// image size, pixel for pixel: never by a fraction, which would blur or make
+// uneven pixels.
+
+namespace {
+
+// The scales a strip may be given for, largest first, besides the exact one.
+constexpr UINT kStripScales[] = {500, 400, 350, 300, 250, 225, 200, 175, 150, 125};
+
+int ScalePercent(int value, UINT percent) { return MulDiv(value, static_cast<int>(percent), 100); }
+
+HRSRC FindScaledStrip(HINSTANCE instance, LPCSTR name, UINT percent) {
+    char scaled[300];
+    if (!name || lstrlenA(name) > 280) return nullptr;
+    wsprintfA(scaled, "%s_%u", name, percent);
+    return FindResourceA(instance, scaled, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
+}
+
+// A copy of `strip` with every pixel made a factor by factor square.
+HBITMAP EnlargeWhole(HBITMAP strip, int factor) {
+    BITMAP info;
+    BlockFill(&info, 0, sizeof(info));
+    if (!GetObjectA(strip, sizeof(info), &info)) return nullptr;
+    HBITMAP large = nullptr;
+    {
+        ScreenDC screen;
+        large = GdiTrack(CreateCompatibleBitmap(screen, info.bmWidth * factor, info.bmHeight * factor));
+    }
+    if (!large) return nullptr;
+    HDC target = GdiTrackDC(CreateCompatibleDC(nullptr));
+    if (!target) {
+        GdiDelete(large);
+        return nullptr;
+    }
+    {
+        SelectScope from(stripDC, strip);
+        SelectScope to(target, large);
+        // With a whole factor every source pixel covers exactly factor by
+        // factor target pixels; COLORONCOLOR keeps each colour as it is.
+        const int oldMode = SetStretchBltMode(target, COLORONCOLOR);
+        StretchBlt(target, 0, 0, info.bmWidth * factor, info.bmHeight * factor, stripDC, 0, 0, info.bmWidth,
+                   info.bmHeight, SRCCOPY);
+        SetStretchBltMode(target, oldMode);
+    }
+    GdiDeleteDC(target);
+    return large;
+}
+
+} // namespace
+
+void StripCellSize(const ToolbarManager *manager, int *width, int *height) {
+    int iw = 0, ih = 0;
+    GetButtonSizes(nullptr, nullptr, &iw, &ih);
+    const UINT scale = manager && manager->imageScale ? manager->imageScale : 100;
+    const int factor = manager && manager->imageFactor ? static_cast<int>(manager->imageFactor) : 1;
+    if (width) *width = ScalePercent(iw, scale) * factor;
+    if (height) *height = ScalePercent(ih, scale) * factor;
+}
+
+UINT ChooseImageStrip(ToolbarManager *manager) {
+    ToolbarClient *client = CurrentClient();
+    if (!client || !manager || !manager->imageResource) return 0;
+    const UINT dpi = ManagerDpi(manager);
+    const UINT wanted = static_cast<UINT>(MulDiv(100, static_cast<int>(dpi), static_cast<int>(kBaseDpi)));
+    HRSRC resource = manager->imageResource;
+    UINT scale = 100;
+    if (manager->imageName && wanted > 100) {
+        if (HRSRC exact = FindScaledStrip(client->instance, manager->imageName, wanted)) {
+            resource = exact;
+            scale = wanted;
+        } else {
+            for (UINT step : kStripScales) {
+                if (step >= wanted) continue;
+                if (HRSRC smaller = FindScaledStrip(client->instance, manager->imageName, step)) {
+                    resource = smaller;
+                    scale = step;
+                    break;
+                }
+            }
+        }
+    }
+    HBITMAP strip = LoadImageStrip(client->instance, resource);
+    if (!strip) return 0;
+
+    // The largest whole factor by which the strip's images still fit the
+    // image size at the frame's scale; 1 when they already fill it.
+    int iw = 0, ih = 0, wantWidth = 0, wantHeight = 0;
+    GetButtonSizes(nullptr, nullptr, &iw, &ih);
+    GetButtonSizesAt(dpi, nullptr, nullptr, &wantWidth, &wantHeight);
+    const int cellWidth = ScalePercent(iw, scale), cellHeight = ScalePercent(ih, scale);
+    int factor = 1;
+    if (cellWidth > 0 && cellHeight > 0) {
+        const int across = wantWidth / cellWidth, down = wantHeight / cellHeight;
+        factor = across < down ? across : down;
+    }
+    if (factor > 1) {
+        HBITMAP large = EnlargeWhole(strip, factor);
+        GdiDelete(strip);
+        if (!large) return 0;
+        strip = large;
+    } else {
+        factor = 1;
+    }
+    if (manager->imageStrip) GdiDelete(manager->imageStrip);
+    manager->imageStrip = strip;
+    manager->imageScale = scale;
+    manager->imageFactor = static_cast<UINT>(factor);
+    return 1;
+}
+
 HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource) {
     const UINT rowsToTry = newerSystem ? 4 : 3;
 

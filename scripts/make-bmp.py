@@ -1,8 +1,14 @@
 #!/usr/bin/env python3
 """Turn a text picture (demo/images/*.txt) into a 16-colour uncompressed BMP strip or a 16-colour .ico."""
 #
-# Usage:  make-bmp.py PICTURE.txt OUTPUT.bmp
+# Usage:  make-bmp.py [--scale PERCENT] PICTURE.txt OUTPUT.bmp
 #         make-bmp.py PICTURE.txt OUTPUT.ico
+#
+# --scale draws the strip for a display scale: every cell becomes
+# W*PERCENT/100 by H*PERCENT/100 pixels (rounded half up, as the library
+# scales its image size), each pixel taken from the nearest pixel of the
+# picture, so the images stay sharp and keep exactly the picture's colours.
+# The demo ships main_150.bmp and main_200.bmp made this way from main.txt.
 #
 # The picture file is plain text, one directive per line; '#' starts a comment
 # line and blank lines are ignored:
@@ -110,6 +116,25 @@ def palette_of(picture):
     return palette + [(0, 0, 0)] * (16 - len(palette))
 
 
+def scaled_size(value, percent):
+    """value * percent / 100, halves rounded up (what MulDiv gives for sizes)."""
+    return (value * percent * 2 + 100) // 200
+
+
+def scale_picture(picture, percent):
+    """The picture with every image redrawn for a display scale, pixel by
+    nearest pixel."""
+    width, height = picture.cell
+    new_width, new_height = scaled_size(width, percent), scaled_size(height, percent)
+    for name, rows in picture.images.items():
+        picture.images[name] = [
+            "".join(rows[y * height // new_height][x * width // new_width] for x in range(new_width))
+            for y in range(new_height)
+        ]
+    picture.cell = (new_width, new_height)
+    return picture
+
+
 def compose(picture):
     """The whole picture as rows of characters, top row first."""
     width, height = picture.cell
@@ -191,9 +216,15 @@ def write_ico(picture, path):
 
 
 def main(argv):
-    if len(argv) != 3:
-        sys.exit("usage: make-bmp.py PICTURE.txt OUTPUT.bmp|OUTPUT.ico")
+    percent = 100
+    if len(argv) == 5 and argv[1] == "--scale":
+        percent = int(argv[2])
+        argv = argv[:1] + argv[3:]
+    if len(argv) != 3 or percent < 100:
+        sys.exit("usage: make-bmp.py [--scale PERCENT] PICTURE.txt OUTPUT.bmp|OUTPUT.ico")
     picture = read_picture(argv[1])
+    if percent != 100:
+        scale_picture(picture, percent)
     if argv[2].lower().endswith(".ico"):
         write_ico(picture, argv[2])
     else:

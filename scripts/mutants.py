@@ -24,7 +24,9 @@ lines, `#` starts a comment line:
 `find` must occur exactly once in `file`; `\\n`, `\\t` and `\\\\` in find and
 replace stand for a line break, a tab and a backslash. `tests` names test
 programs (`paint_test`, or `paint_test:Filter*` for a GoogleTest filter) and
-end-to-end scripts (`demo_start_e2e`), separated by blanks.
+end-to-end scripts (`demo_start_e2e`), separated by blanks. A program named
+with a display scale in front (`dpi144_dpi_test`) runs in the scratch build's
+prefix for that DPI, as its CTest entry does.
 
 --only REGEX   runs the mutants whose name matches
 --file REGEX   runs the mutants whose file matches (say, what a change touched)
@@ -140,8 +142,14 @@ def test_targets(tests):
     targets = {"qbr_keeper", "qbr_ctl"}
     for t in tests:
         name = t.split(":")[0]
-        targets.add("qbrdemo" if name.endswith("_e2e") else name)
+        targets.add("qbrdemo" if name.endswith("_e2e") else scaled_test(name)[1])
     return sorted(targets)
+
+
+def scaled_test(name):
+    """(DPI, program) of a test name: dpi144_dpi_test is dpi_test at 144."""
+    m = re.match(r"dpi(\d+)_(.+)$", name)
+    return (m.group(1), m.group(2)) if m else ("96", name)
 
 
 def run_tests(tests, src, build, log):
@@ -153,8 +161,10 @@ def run_tests(tests, src, build, log):
             cmd = ["bash", os.path.join(src, "tests", "e2e", name + ".sh"), build]
             timeout = E2E_TIMEOUT
         else:
-            cmd = [os.path.join(src, "scripts", "wine-run.sh"), build,
-                   os.path.join(build, "bin", name + ".exe"), "--gtest_brief=1"]
+            dpi, program = scaled_test(name)
+            env["QBR_EXPECT_DPI"] = dpi
+            cmd = [os.path.join(src, "scripts", "wine-run.sh"), "--dpi", dpi, build,
+                   os.path.join(build, "bin", program + ".exe"), "--gtest_brief=1"]
             if flt:
                 cmd.append("--gtest_filter=" + flt)
             timeout = TEST_TIMEOUT

@@ -3,9 +3,15 @@
 # one Xvfb when there is no $DISPLAY, a private Wine prefix with a virtual desktop
 # in the build folder, a persistent wineserver and one idle keeper process.
 #
-#   wine-env.sh start BUILD_DIR   bring it up (idempotent); prints nothing on success
-#   wine-env.sh stop  BUILD_DIR   end the wineserver, the keeper and our Xvfb
-#   wine-env.sh shell BUILD_DIR   print the exports for `eval`
+#   wine-env.sh start BUILD_DIR [DPI]   bring it up (idempotent); prints nothing on success
+#   wine-env.sh stop  BUILD_DIR [DPI]   end the wineserver, the keeper and our Xvfb
+#   wine-env.sh shell BUILD_DIR [DPI]   print the exports for `eval`
+#
+# DPI (96 when absent) is the display scale the prefix gives its programs, as
+# LogPixels: 144 is 150 %, 192 is 200 %. Each DPI other than 96 has a prefix,
+# a state folder and an Xvfb of its own beside the 96-DPI ones
+# (BUILD_DIR/wineprefix-144, BUILD_DIR/wine-env-144), so one build folder can
+# run the same programs at several scales.
 #
 # Everything that runs in the background is started detached, with all three
 # standard streams redirected, so that a caller reading our output (CTest, a
@@ -14,17 +20,26 @@ set -u
 
 action=${1:-}
 build=${2:-}
+dpi=${3:-96}
 if [ -z "$action" ] || [ -z "$build" ]; then
-    echo "usage: wine-env.sh start|stop|shell BUILD_DIR" >&2
+    echo "usage: wine-env.sh start|stop|shell BUILD_DIR [DPI]" >&2
     exit 2
 fi
+case "$dpi" in
+'' | *[!0-9]*)
+    echo "wine-env: DPI must be a number, such as 96, 144 or 192" >&2
+    exit 2
+    ;;
+esac
 mkdir -p "$build"
 build=$(cd "$build" && pwd)
-state="$build/wine-env"
+suffix=""
+[ "$dpi" != 96 ] && suffix="-$dpi"
+state="$build/wine-env$suffix"
 mkdir -p "$state"
 log="$state/log.txt"
 
-export WINEPREFIX="$build/wineprefix"
+export WINEPREFIX="$build/wineprefix$suffix"
 export WINEDEBUG=-all
 # WinHelp with a missing file would wait on a modal message box, and a
 # program that crashes would wait in Wine's debugger until a timeout: with the
@@ -76,6 +91,11 @@ make_prefix() {
     # window with a sizing border waits about two seconds.
     wine reg add 'HKCU\Software\Wine\Explorer' /v Desktop /d Default /f </dev/null >>"$log" 2>&1
     wine reg add 'HKCU\Software\Wine\Explorer\Desktops' /v Default /d 1024x768 /f </dev/null >>"$log" 2>&1
+    # The display scale: Wine reads it when the wineserver starts, which the
+    # restart below does.
+    if [ "$dpi" != 96 ]; then
+        wine reg add 'HKCU\Control Panel\Desktop' /v LogPixels /t REG_DWORD /d "$dpi" /f </dev/null >>"$log" 2>&1
+    fi
     # The desktop process that wineboot left ignores the new values until restarted.
     wineserver -k </dev/null >>"$log" 2>&1
     wineserver -w </dev/null >>"$log" 2>&1
@@ -117,7 +137,7 @@ case "$action" in
 start | stop)
     # flock -o keeps the lock in flock itself: the servers we start must not
     # inherit it, or the next start would wait for them forever.
-    exec flock -o "$state/lock" "$0" "$action-locked" "$build"
+    exec flock -o "$state/lock" "$0" "$action-locked" "$build" "$dpi"
     ;;
 start-locked)
     start_xvfb
@@ -140,11 +160,11 @@ stop-locked)
     rm -f "$state/xvfb.pid" "$state/xvfb.display" "$state/display" "$state/keeper.ready" "$state/exports.sh"
     ;;
 shell)
-    [ -f "$state/exports.sh" ] || "$0" start "$build"
+    [ -f "$state/exports.sh" ] || "$0" start "$build" "$dpi"
     cat "$state/exports.sh"
     ;;
 *)
-    echo "usage: wine-env.sh start|stop|shell BUILD_DIR" >&2
+    echo "usage: wine-env.sh start|stop|shell BUILD_DIR [DPI]" >&2
     exit 2
     ;;
 esac

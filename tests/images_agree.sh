@@ -27,6 +27,15 @@ for picture in "$here"/demo/images/*.txt; do
     fresh=$scratch/$(basename "$committed")
     python3 "$here/scripts/make-bmp.py" "$picture" "$fresh"
     compare "$committed" "$fresh" "scripts/make-bmp.py ${picture#"$here"/} ${committed#"$here"/}"
+    # The same strip drawn for larger display scales (NAME_150.bmp, NAME_200.bmp).
+    for scaled in "${base}"_[0-9]*.bmp; do
+        [ -f "$scaled" ] || continue
+        percent=${scaled##*_}
+        percent=${percent%.bmp}
+        fresh=$scratch/$(basename "$scaled")
+        python3 "$here/scripts/make-bmp.py" --scale "$percent" "$picture" "$fresh"
+        compare "$scaled" "$fresh" "scripts/make-bmp.py --scale $percent ${picture#"$here"/} ${scaled#"$here"/}"
+    done
 done
 
 python3 "$here/tests/support/make_test_bmp.py" "$scratch/test_strip.bmp"

@@ -18,17 +18,20 @@ namespace {
 // What the walk's wrap test decided for one item.
 enum class Wrap { None, NewRow, EdgeMoved };
 
-// When separators take no place at all, and when one that wraps is dropped.
+// When separators take no place at all, when one that wraps is dropped, and
+// the display scale every item is measured at.
 struct FlowRules {
     bool skipSeparators;
     bool dropSeparators;
+    UINT dpi;
 };
 
 // The differences between the members of the walk. Each member overrides
 // only what it changes; Place may stop the walk by returning true.
 struct FlowVisitor {
+    UINT dpi = kBaseDpi; // the walk's, set by FlowWalk
     virtual ~FlowVisitor() = default;
-    virtual bool Size(ToolbarItem *item, int *w, int *h) { return ItemGetSize(item, w, h) != 0; }
+    virtual bool Size(ToolbarItem *item, int *w, int *h) { return ItemGetSizeAt(item, dpi, w, h) != 0; }
     virtual void AfterRowHeight(ToolbarItem *, bool /*separator*/, int & /*h*/, int /*rowHeight*/) {}
     virtual Wrap WrapTest(ToolbarItem *, int x, int w, RECT &area) {
         return x + w > area.right ? Wrap::NewRow : Wrap::None;
@@ -41,6 +44,7 @@ struct FlowVisitor {
 // part. It is a reference because a drop measure may push its right edge out.
 void FlowWalk(const PointerList *items, RECT &area, const FlowRules &rules, FlowVisitor &visitor) {
     int x = area.left, y = area.top, rowHeight = 0;
+    visitor.dpi = rules.dpi;
     for (UINT i = 0; i < PointerListCount(items); ++i) {
         ToolbarItem *item = ListAt<ToolbarItem>(items, i);
         UINT kind;
@@ -62,15 +66,18 @@ void FlowWalk(const PointerList *items, RECT &area, const FlowRules &rules, Flow
         if (wrap != Wrap::None && separator && rules.dropSeparators) continue;
         RECT rect = {x, y, x + w, y + h};
         if (visitor.Place(i, item, separator, rect, x + w - 1)) return;
-        x += w - 1; // neighbours share one pixel column
+        x += w - 1; // neighbours share one pixel column, at every scale
     }
 }
 
 bool HasFlags(const ToolbarRecord *record, UINT flags) { return (record->flags & flags) == flags; }
 
+UINT ToolbarDpi(const ToolbarRecord *record) { return ManagerDpi(ManagerOfToolbar(record->paneWindow)); }
+
 // The window on show goes by the record's flags.
 FlowRules ActiveRules(const ToolbarRecord *record) {
-    return {HasFlags(record, TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS), HasFlags(record, TBF_FLOATING)};
+    return {HasFlags(record, TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS), HasFlags(record, TBF_FLOATING),
+            ToolbarDpi(record)};
 }
 
 // Hit testing, painting and item rectangles describe the window on show.
@@ -83,7 +90,7 @@ void WalkActiveWindow(const ToolbarRecord *record, FlowVisitor &visitor) {
 // The measuring members go by the role they are given.
 FlowRules RoleRules(const ToolbarRecord *record, int role) {
     bool floating = role == ROLE_FLOATING;
-    return {floating && HasFlags(record, TBF_NO_FLOAT_SEPARATORS), floating};
+    return {floating && HasFlags(record, TBF_NO_FLOAT_SEPARATORS), floating, ToolbarDpi(record)};
 }
 
 // Extents of the placed items, with an optional trailing-separator rule: a
@@ -103,7 +110,7 @@ struct ExtentVisitor : FlowVisitor {
         ToolbarItem *next = ListAt<ToolbarItem>(items, index + 1);
         UINT kind;
         int w, h;
-        if (!ItemGetKind(next, &kind) || !ItemGetSize(next, &w, &h)) return false;
+        if (!ItemGetKind(next, &kind) || !ItemGetSizeAt(next, dpi, &w, &h)) return false;
         if (kind == ITEM_BUTTON && nextButtonWidth) w = nextButtonWidth;
         return !(separator && nextX + w > bound->right);
     }
@@ -209,7 +216,7 @@ static UINT NaturalSize(HWND pane, bool vertical, int *outWidth, int *outHeight)
         ToolbarItem *item = ListAt<ToolbarItem>(record->items, i);
         UINT kind;
         int w, h;
-        if (!ItemGetKind(item, &kind) || !ItemGetSize(item, &w, &h)) continue;
+        if (!ItemGetKind(item, &kind) || !ItemGetSizeAt(item, rules.dpi, &w, &h)) continue;
         if (kind == ITEM_SEPARATOR && rules.skipSeparators) continue;
         along += (vertical ? h : w) - 1;
         across = std::max(across, vertical ? w : h);
@@ -233,7 +240,7 @@ UINT MeasureToFit(HWND pane, int role, RECT *rect) {
     if (!record) return 0;
     if (!PointerListCount(record->items)) {
         int w = 0, h = 0;
-        GetButtonSizes(&w, &h, nullptr, nullptr);
+        GetButtonSizesAt(ToolbarDpi(record), &w, &h, nullptr, nullptr);
         OneButton(rect, w, h);
         return 1;
     }
@@ -323,7 +330,7 @@ UINT RewrapForMetrics(HWND window, int role, int newWidth, int newHeight, RECT *
                 *h = newHeight;
                 return true;
             }
-            return ItemGetSize(item, w, h) != 0;
+            return ItemGetSizeAt(item, dpi, w, h) != 0;
         }
         Wrap WrapTest(ToolbarItem *item, int, int, RECT &) override {
             ToolbarItem *nextBreak = ListAt<ToolbarItem>(breaks, nextBreakIndex);

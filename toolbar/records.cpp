@@ -124,6 +124,10 @@ extern "C" HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int wid
     // x, y, width and height are always the floating frame's, in screen
     // coordinates; the pane's place is the dock's business. A width is a
     // wrapping width: the refit below sets the height the rows need.
+    // The wrapping width and height are 96-DPI sizes, as the host's button
+    // metrics are: the same call gives the same rows at every scale.
+    width = ScaleToDpi(width, ManagerDpi(manager));
+    height = ScaleToDpi(height, ManagerDpi(manager));
     RECT present;
     GetToolbarWindowRect(pane, ROLE_FLOATING, &present);
     RECT target = {x, y, width >= 1 ? x + width : x + (present.right - present.left),

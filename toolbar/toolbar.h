@@ -98,6 +98,9 @@ UINT RewrapAllManagers(int newWidth, int newHeight);
 UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight);
 UINT RelayoutAllManagers();
 UINT RelayoutManagerToolbars(ToolbarManager *manager);
+// Measures a manager's toolbars again for another display scale, each
+// keeping its items and rows; 0 when the scale is 0 or unchanged.
+UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi);
 
 void ScreenRectToClient(HWND window, RECT *rect);
 void ClientRectToScreen(HWND window, RECT *rect);
@@ -119,3 +122,6 @@ constexpr int kPaneAreaTop = 3;
 constexpr int kPaneAreaBottom = 4;
 constexpr int kFrameAreaTop = 3; // below the caption band
 constexpr int kFrameAreaBottom = 3;
+// The margins above at the display scale of the toolbar's frame (top, for
+// the floating frame, with the caption band): left, top, right, bottom.
+RECT AreaMargins(HWND window, int role);

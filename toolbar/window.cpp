@@ -164,17 +164,24 @@ void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
     if (role == ROLE_DOCKED) ScreenRectToClient(GetParent(target), rect);
 }
 
+RECT AreaMargins(HWND window, int role) {
+    const UINT dpi = ManagerDpi(ManagerOfToolbar(window));
+    if (role == ROLE_DOCKED)
+        return RECT{ScaleToDpi(kAreaLeft, dpi), ScaleToDpi(kPaneAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
+                    ScaleToDpi(kPaneAreaBottom, dpi)};
+    // The caption band is the caption font's, which already has the screen's scale.
+    return RECT{ScaleToDpi(kAreaLeft, dpi), captionHeight + ScaleToDpi(kFrameAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
+                ScaleToDpi(kFrameAreaBottom, dpi)};
+}
+
 void GetItemArea(HWND window, int role, RECT *rect) {
     if (!SettleRole(window, role)) return;
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
     RECT client;
     GetClientRect(target, &client);
-    if (role == ROLE_DOCKED)
-        *rect = RECT{kAreaLeft, kPaneAreaTop, client.right - kAreaRight, client.bottom - kPaneAreaBottom};
-    else
-        *rect =
-            RECT{kAreaLeft, captionHeight + kFrameAreaTop, client.right - kAreaRight, client.bottom - kFrameAreaBottom};
+    const RECT margins = AreaMargins(target, role);
+    *rect = RECT{margins.left, margins.top, client.right - margins.right, client.bottom - margins.bottom};
 }
 
 static int Width(const RECT &r) { return r.right - r.left; }
@@ -253,12 +260,14 @@ UINT SizeToolbarWindows(HWND window) {
     // The margins of the item areas, plus what WS_BORDER takes around the
     // pane and WS_THICKFRAME around the frame: each item area comes out
     // exactly the natural size.
-    RECT paneSize = {0, 0, width + kAreaLeft + kAreaRight + 2 * GetSystemMetrics(SM_CXBORDER),
-                     height + kPaneAreaTop + kPaneAreaBottom + 2 * GetSystemMetrics(SM_CYBORDER)};
+    const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
+    RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
+                     height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
     PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
-    RECT frameSize = {0, 0, width + kAreaLeft + kAreaRight + 2 * GetSystemMetrics(SM_CXFRAME),
-                      height + kFrameAreaTop + kFrameAreaBottom + 2 * GetSystemMetrics(SM_CYFRAME) + captionHeight};
+    const RECT frameMargins = AreaMargins(pane, ROLE_FLOATING);
+    RECT frameSize = {0, 0, width + frameMargins.left + frameMargins.right + 2 * GetSystemMetrics(SM_CXFRAME),
+                      height + frameMargins.top + frameMargins.bottom + 2 * GetSystemMetrics(SM_CYFRAME)};
     PlaceWindow(ResolveRoleWindow(pane, ROLE_FLOATING), frameSize, false, true);
     ComputeRowBreaks(pane, ROLE_FLOATING);
     RefitToolbar(pane, ROLE_BOTH);
@@ -404,6 +413,10 @@ UINT SwitchToDocked(HWND window) { return Switch(window, false); }
 
 UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight) {
     if (!manager) return 0;
+    // The new size is given at 96 DPI, as the host gives its metrics.
+    const UINT dpi = ManagerDpi(manager);
+    newWidth = ScaleToDpi(newWidth, dpi);
+    newHeight = ScaleToDpi(newHeight, dpi);
     for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
         HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
         for (int role : {ROLE_FLOATING, ROLE_DOCKED}) {
@@ -434,6 +447,35 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     for (bool top : {true, false})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             if ((dock->side == DOCK_TOP) == top) PackDock(dock);
+    return 1;
+}
+
+// ---- New display scale -----------------------------------------------------------
+
+UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
+    if (!manager || !dpi || dpi == ManagerDpi(manager)) return 0;
+    // As for a new button size: the rows come from the break lists the old
+    // scale made, so the rewrap runs at the new scale before the relayout.
+    int width = 0, height = 0;
+    GetButtonSizes(&width, &height, nullptr, nullptr);
+    manager->dpi = dpi;
+    RewrapManagerToolbars(manager, width, height);
+    if (manager->imageResource) ChooseImageStrip(manager);
+    RelayoutManagerToolbars(manager);
+    return 1;
+}
+
+extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
+    ToolbarClient *client = CurrentClient();
+    if (!client || !frame) return 0;
+    ToolbarManager *manager = nullptr;
+    for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
+        if (m->frame == frame) manager = m;
+    if (!manager) return 0;
+    RescaleManagerToolbars(manager, HIWORD(wParam));
+    if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
+        SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
+                     suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
     return 1;
 }
 

@@ -1,0 +1,516 @@
+// The library at the display scale of the prefix it runs in. CTest runs this
+// program three times: in the build folder's own prefix (96 DPI) and in its
+// 144- and 192-DPI prefixes (dpi144_dpi_test, dpi192_dpi_test), with
+// QBR_EXPECT_DPI telling it which scale it was started for.
+#include <cstdlib>
+
+#include "harness.h"
+#include "quaybar.h"
+
+namespace {
+
+int ScreenDpi() {
+    HDC screen = GetDC(nullptr);
+    int dpi = GetDeviceCaps(screen, LOGPIXELSY);
+    ReleaseDC(nullptr, screen);
+    return dpi;
+}
+
+// The scale this run was started for; 96 when started by hand without one.
+int ExpectedDpi() {
+    char value[16] = "";
+    DWORD length = GetEnvironmentVariableA("QBR_EXPECT_DPI", value, sizeof value);
+    return length > 0 && length < sizeof value ? atoi(value) : 96;
+}
+
+} // namespace
+
+// The prefix gives the scale the entry names; a prefix that lost its
+// LogPixels would make every other check here pass at 96 by accident.
+TEST(DisplayScale, ThePrefixGivesTheScaleThisRunWasStartedFor) { EXPECT_EQ(ExpectedDpi(), ScreenDpi()); }
+
+// ---- Sizes at the frame's scale -------------------------------------------------
+
+#include "core/core.h"
+#include "paint/paint.h"
+#include "toolbar/toolbar.h"
+
+namespace {
+
+// What 96-DPI pixels come to at each scale the tests run at.
+struct Scaled {
+    int dpi;
+    int buttonWidth, buttonHeight, imageWidth, imageHeight, textWidth, textHeight;
+    int areaLeft, paneTop, paneBottom, frameTop, frameBottom, separator;
+    int custom[6]; // QBR_SetButtonMetrics(30, 28, 20, 18, 60, 50) at this scale
+};
+constexpr Scaled kScales[] = {
+    {96, 24, 22, 16, 15, 48, 44, 6, 3, 4, 3, 3, 10, {30, 28, 20, 18, 60, 50}},
+    {144, 36, 33, 24, 23, 72, 66, 9, 5, 6, 5, 5, 15, {45, 42, 30, 27, 90, 75}},
+    {192, 48, 44, 32, 30, 96, 88, 12, 6, 8, 6, 6, 20, {60, 56, 40, 36, 120, 100}},
+};
+
+const Scaled &Here() {
+    for (const Scaled &s : kScales)
+        if (s.dpi == ScreenDpi()) return s;
+    ADD_FAILURE() << "no table row for " << ScreenDpi() << " DPI";
+    return kScales[0];
+}
+
+constexpr UINT S = 0; // the shared separator
+
+class ScaleTest : public FrameTest {
+  protected:
+    void SetUp() override {
+        FrameTest::SetUp();
+        AddButtons(1, 6);
+        top = MakeDock(DOCK_TOP);
+    }
+    HWND Make(std::vector<UINT> ids, UINT flags) {
+        return QBR_CreateToolbar("T", flags, 300, 200, 0, 0, top, ids.data(), static_cast<UINT>(ids.size()));
+    }
+    std::vector<RECT> ItemRects(HWND pane) {
+        std::vector<RECT> rects;
+        ToolbarRecord *record = RecordOfWindow(pane);
+        for (UINT i = 0; i < PointerListCount(record->items); ++i) {
+            RECT r = {};
+            GetItemRect(record, i, &r);
+            rects.push_back(r);
+        }
+        return rects;
+    }
+    HWND top = nullptr;
+};
+
+} // namespace
+
+TEST_F(ScaleTest, TheManagerTakesItsFramesScaleAndButtonMetricsScaleWithIt) {
+    const Scaled &s = Here();
+    EXPECT_EQ(static_cast<UINT>(s.dpi), ManagerDpi(manager));
+    int got[4] = {};
+    GetButtonSizesAt(ManagerDpi(manager), &got[0], &got[1], &got[2], &got[3]);
+    EXPECT_EQ((std::vector<int>{s.buttonWidth, s.buttonHeight, s.imageWidth, s.imageHeight}),
+              (std::vector<int>{got[0], got[1], got[2], got[3]}));
+    QBR_SetButtonText(1);
+    GetButtonSizesAt(ManagerDpi(manager), &got[0], &got[1], nullptr, nullptr);
+    EXPECT_EQ((std::vector<int>{s.textWidth, s.textHeight}), (std::vector<int>{got[0], got[1]}));
+    QBR_SetButtonText(0);
+
+    // The host's metrics are 96-DPI values, whatever the scale.
+    QBR_SetButtonMetrics(30, 28, 20, 18, 60, 50);
+    int all[6] = {};
+    GetButtonSizesAt(ManagerDpi(manager), &all[0], &all[1], &all[2], &all[3]);
+    QBR_SetButtonText(1);
+    GetButtonSizesAt(ManagerDpi(manager), &all[4], &all[5], nullptr, nullptr);
+    QBR_SetButtonText(0);
+    EXPECT_EQ(std::vector<int>(s.custom, s.custom + 6), std::vector<int>(all, all + 6));
+    QBR_SetButtonMetrics(0, 0, 0, 0, 0, 0);
+}
+
+// Buttons, margins and separators grow with the scale; neighbours still
+// share one pixel column.
+TEST_F(ScaleTest, ItemRectanglesAndPaneSizeAtTheFramesScale) {
+    const Scaled &s = Here();
+    HWND pane = Make({1, S, 2, 3}, TBF_VISIBLE | TBF_DOCKED);
+    Pump();
+    const int l = s.areaLeft, t = s.paneTop, bw = s.buttonWidth, bh = s.buttonHeight;
+    const int sepLeft = l + bw - 1, two = sepLeft + s.separator - 1, three = two + bw - 1;
+    const std::vector<RECT> expected = {Rect(l, t, l + bw, t + bh), Rect(sepLeft, t, sepLeft + s.separator, t + bh),
+                                        Rect(two, t, two + bw, t + bh), Rect(three, t, three + bw, t + bh)};
+    EXPECT_EQ(expected, ItemRects(pane));
+    // The pane is its items, its margins and the border the platform gives.
+    const int border = GetSystemMetrics(SM_CXBORDER);
+    RECT outer = WindowRectInParent(pane);
+    EXPECT_EQ(three + bw + s.areaLeft + 2 * border, outer.right - outer.left);
+    EXPECT_EQ(t + bh + s.paneBottom + 2 * GetSystemMetrics(SM_CYBORDER), outer.bottom - outer.top);
+}
+
+// The floating frame: its caption band (the caption font's, at the screen's
+// scale) and the margins below it at the frame's scale.
+TEST_F(ScaleTest, FloatingFrameItemsStandBelowTheCaptionBand) {
+    const Scaled &s = Here();
+    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    const int top = captionHeight + s.frameTop, l = s.areaLeft, bw = s.buttonWidth, bh = s.buttonHeight;
+    EXPECT_EQ((std::vector<RECT>{Rect(l, top, l + bw, top + bh), Rect(l + bw - 1, top, l + 2 * bw - 1, top + bh)}),
+              ItemRects(pane));
+    RECT client = ClientRectOf(frameWindow);
+    EXPECT_EQ(Rect(0, 0, l + 2 * bw - 1 + l, top + bh + s.frameBottom), client);
+    // The caption font grows with the screen: its band is taller than at 96.
+    if (s.dpi > 96) EXPECT_GT(captionHeight, 10);
+}
+
+// ---- Sharp images -------------------------------------------------------------------
+
+namespace {
+
+// Which strip a frame uses and how much it is enlarged: the one drawn for
+// its scale, else the nearest smaller one times a whole factor.
+struct StripCase {
+    const char *name;
+    int dpi;
+    UINT scale, factor;
+    int cellWidth, cellHeight;
+};
+constexpr StripCase kStripCases[] = {
+    {"MAIN", 96, 100, 1, 16, 15},    {"SINGLE", 96, 100, 1, 16, 15}, {"MAIN", 144, 150, 1, 24, 23},
+    {"SINGLE", 144, 100, 1, 16, 15}, {"MAIN", 192, 150, 1, 24, 23},  {"SINGLE", 192, 100, 2, 32, 30},
+};
+
+// Every pixel of a bitmap, top row first.
+Pixels BitmapPixels(HBITMAP bitmap) {
+    BITMAP info = {};
+    GetObjectA(bitmap, sizeof info, &info);
+    Pixels out;
+    out.width = info.bmWidth;
+    out.height = info.bmHeight;
+    BITMAPINFO header = {};
+    header.bmiHeader = {sizeof(BITMAPINFOHEADER), info.bmWidth, -info.bmHeight, 1, 32, BI_RGB, 0, 0, 0, 0, 0};
+    std::vector<DWORD> bits(static_cast<size_t>(info.bmWidth) * info.bmHeight);
+    HDC screen = GetDC(nullptr);
+    GetDIBits(screen, bitmap, 0, info.bmHeight, bits.data(), &header, DIB_RGB_COLORS);
+    ReleaseDC(nullptr, screen);
+    for (DWORD v : bits)
+        out.colors.push_back(RGB((v >> 16) & 0xFF, (v >> 8) & 0xFF, v & 0xFF));
+    return out;
+}
+
+} // namespace
+
+TEST_F(ScaleTest, TheStripForTheFramesScaleOrTheNearestSmallerByAWholeFactor) {
+    for (const StripCase &c : kStripCases) {
+        if (c.dpi != ScreenDpi()) continue;
+        SCOPED_TRACE(c.name);
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, c.name));
+        EXPECT_EQ(c.scale, manager->imageScale);
+        EXPECT_EQ(c.factor, manager->imageFactor);
+        int w = 0, h = 0;
+        StripCellSize(manager, &w, &h);
+        EXPECT_EQ(c.cellWidth, w);
+        EXPECT_EQ(c.cellHeight, h);
+        // The strip in memory is the chosen one times the factor, whole.
+        BITMAP info = {};
+        GetObjectA(manager->imageStrip, sizeof info, &info);
+        EXPECT_EQ(23 * c.cellWidth, info.bmWidth);
+        EXPECT_EQ(2 * c.cellHeight, info.bmHeight);
+    }
+}
+
+// A button at the frame's scale shows its image pixel for pixel from the
+// strip resource, each pixel a whole factor by factor square (so every pixel
+// is a colour of the strip and nothing is blurred), centred in the button as
+// at 96 DPI.
+TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
+    const Scaled &s = Here();
+    for (const char *name : {"MAIN", "SINGLE"}) {
+        SCOPED_TRACE(name);
+        ASSERT_EQ(1u, QBR_SetImageStrip(manager, name));
+        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_DOCKED);
+        Pump();
+        RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+        Pixels shown = ReadWindowPixels(pane);
+        // The resource the library chose, recoloured as loaded but not enlarged.
+        char chosen[32];
+        if (manager->imageScale == 150)
+            wsprintfA(chosen, "%s_150", name);
+        else
+            lstrcpyA(chosen, name);
+        HBITMAP source = LoadImageStrip(GetModuleHandleA(nullptr),
+                                        FindResourceA(GetModuleHandleA(nullptr), chosen, MAKEINTRESOURCEA(2)));
+        ASSERT_NE(nullptr, source);
+        Pixels strip = BitmapPixels(source);
+        DeleteObject(source);
+        const int f = static_cast<int>(manager->imageFactor);
+        int cw = 0, ch = 0;
+        StripCellSize(manager, &cw, &ch);
+        const int columns = strip.width / (cw / f);
+        std::vector<RECT> rects = ItemRects(pane);
+        for (UINT index = 0; index < 3; ++index) {
+            UINT image = 0;
+            QBR_GetButtonImage(manager, index + 1, &image);
+            const int sx = static_cast<int>(image % columns) * (cw / f),
+                      sy = static_cast<int>(image / columns) * (ch / f);
+            const int w = s.buttonWidth - 2, h = s.buttonHeight - 2;
+            const int ix = rects[index].left + 1 + ((w - cw - 1) >> 1);
+            const int iy = rects[index].top + 1 + ((h - ch) >> 1);
+            int wrong = 0;
+            for (int y = 0; y < ch; ++y)
+                for (int x = 0; x < cw; ++x)
+                    if (shown.At(ix + x, iy + y) != strip.At(sx + x / f, sy + y / f)) ++wrong;
+            EXPECT_EQ(0, wrong) << "button " << index << " at " << ix << "," << iy;
+        }
+        QBR_DestroyToolbar(pane);
+        Pump();
+    }
+}
+
+// At 96 DPI a frame never sees the strips drawn for larger scales.
+TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
+    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case";
+    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+    HWND frame = CreateRecordingFrame();
+    ToolbarManager *m = QBR_CreateManager(frame);
+    ASSERT_EQ(1u, QBR_SetImageStrip(m, "MAIN"));
+    BITMAP info = {};
+    GetObjectA(m->imageStrip, sizeof info, &info);
+    EXPECT_EQ(368, info.bmWidth);
+    EXPECT_EQ(30, info.bmHeight);
+    QBR_DestroyManager(m);
+    DestroyWindow(frame);
+    QBR_Terminate();
+}
+
+// ---- A new scale for a frame ----------------------------------------------------------
+
+namespace {
+
+// A host frame as the README shows it: WM_DPICHANGED goes to the library.
+LRESULT CALLBACK DpiFrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_DPICHANGED) {
+        QBR_DpiChanged(window, wParam, lParam);
+        return 0;
+    }
+    return DefWindowProcA(window, message, wParam, lParam);
+}
+
+// The scale each run moves its frame to: another one of the three.
+int OtherDpi(int dpi) { return dpi == 96 ? 144 : dpi == 144 ? 192 : 96; }
+
+const Scaled &At(int dpi) {
+    for (const Scaled &s : kScales)
+        if (s.dpi == dpi) return s;
+    return kScales[0];
+}
+
+// A shown frame whose manager has buttons 1 to 9.
+struct DpiFrame {
+    HWND frame;
+    ToolbarManager *manager;
+};
+
+DpiFrame MakeDpiFrame() {
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = DpiFrameProc;
+    wc.hInstance = GetModuleHandleA(nullptr);
+    wc.lpszClassName = "QbrDpiFrame";
+    RegisterClassA(&wc);
+    HWND frame = CreateWindowA("QbrDpiFrame", "F", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 40, 40, 640, 420, nullptr, nullptr,
+                               wc.hInstance, nullptr);
+    ToolbarManager *m = QBR_CreateManager(frame);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+    QBR_AddButtons(m, ids, 9);
+    return {frame, m};
+}
+
+std::vector<UINT> BreakIds(const PointerList *breaks) {
+    std::vector<UINT> ids;
+    for (UINT i = 0; i < PointerListCount(breaks); ++i) {
+        UINT id = 0;
+        ItemGetId(ListAt<ToolbarItem>(breaks, i), &id);
+        ids.push_back(id);
+    }
+    return ids;
+}
+
+} // namespace
+
+// WM_DPICHANGED sent to a frame: every toolbar is measured for the new scale
+// with its items and rows, the strip is chosen again, the frame takes the
+// suggested rectangle.
+TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
+    const DpiFrame made = MakeDpiFrame();
+    HWND frame = made.frame;
+    ToolbarManager *m = made.manager;
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+    ASSERT_EQ(1u, QBR_SetImageStrip(m, "SINGLE"));
+    HWND top = QBR_CreateDock(m, frame, DOCK_TOP);
+    const UINT docked[] = {1, 2, 0, 3};
+    HWND pane = QBR_CreateToolbar("D", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 4);
+    // Nine buttons floating three to a row.
+    const Scaled &here = Here();
+    // A width for three buttons at 96 DPI: the same three at every scale.
+    const int threeAcross = 3 * 24 - 2 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME);
+    HWND floating = QBR_CreateToolbar("F", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
+    Pump();
+    ToolbarRecord *record = RecordOfWindow(floating);
+    const std::vector<UINT> rows = BreakIds(record->floatingBreaks);
+    ASSERT_EQ((std::vector<UINT>{4, 7}), rows);
+    RECT frameBefore;
+    GetWindowRect(ResolveRoleWindow(floating, ROLE_FLOATING), &frameBefore);
+
+    const Scaled &s = At(OtherDpi(here.dpi));
+    RECT suggested = {60, 50, 60 + 800, 50 + 500};
+    SendMessageA(frame, WM_DPICHANGED, MAKEWPARAM(s.dpi, s.dpi), reinterpret_cast<LPARAM>(&suggested));
+    Pump();
+
+    EXPECT_EQ(static_cast<UINT>(s.dpi), ManagerDpi(m));
+    RECT now;
+    GetWindowRect(frame, &now);
+    EXPECT_EQ(suggested, now);
+    // The docked toolbar: buttons and separator at the new scale.
+    const int l = s.areaLeft, t = s.paneTop, bw = s.buttonWidth, bh = s.buttonHeight;
+    const int three = l + 2 * bw - 2 + s.separator - 1;
+    ToolbarRecord *dockedRecord = RecordOfWindow(pane);
+    std::vector<RECT> rects;
+    for (UINT i = 0; i < 4; ++i) {
+        RECT r = {};
+        GetItemRect(dockedRecord, i, &r);
+        rects.push_back(r);
+    }
+    EXPECT_EQ((std::vector<RECT>{Rect(l, t, l + bw, t + bh), Rect(l + bw - 1, t, l + 2 * bw - 1, t + bh),
+                                 Rect(l + 2 * bw - 2, t, l + 2 * bw - 2 + s.separator, t + bh),
+                                 Rect(three, t, three + bw, t + bh)}),
+              rects);
+    // The floating toolbar keeps its three rows of three, its place, and fits them.
+    EXPECT_EQ(rows, BreakIds(record->floatingBreaks));
+    HWND floatingFrame = ResolveRoleWindow(floating, ROLE_FLOATING);
+    RECT frameAfter;
+    GetWindowRect(floatingFrame, &frameAfter);
+    EXPECT_EQ(frameBefore.left, frameAfter.left);
+    EXPECT_EQ(frameBefore.top, frameAfter.top);
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+              ClientRectOf(floatingFrame));
+    // The strip was chosen again for the new scale.
+    int cw = 0, ch = 0;
+    StripCellSize(m, &cw, &ch);
+    EXPECT_EQ(s.dpi == 192 ? 32 : 16, cw);
+
+    // A frame without a manager, and a change to the same scale, do nothing harmful.
+    EXPECT_EQ(0u, QBR_DpiChanged(nullptr, 0, 0));
+    EXPECT_EQ(1u, QBR_DpiChanged(frame, MAKEWPARAM(s.dpi, s.dpi), 0));
+    QBR_DestroyManager(m);
+    DestroyWindow(frame);
+    Pump();
+}
+
+// ---- The layout table across scales -------------------------------------------------
+
+namespace {
+
+std::vector<std::pair<std::string, std::string>> CaptureTable(ToolbarManager *m) {
+    std::vector<std::pair<std::string, std::string>> table;
+    UINT count = 0;
+    QBR_CaptureLayout(m, &count);
+    for (UINT i = 0; i < count; ++i) {
+        char key[512], value[512];
+        QBR_GetLayoutEntry(i, key, value);
+        table.emplace_back(key, value);
+    }
+    QBR_FreeLayout();
+    return table;
+}
+
+} // namespace
+
+// Written at this run's scale and restored in a frame at another (96 and 144
+// both ways): the floating toolbar stands where it stood on the same screen,
+// with its items and its three rows, measured for the new scale.
+TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
+    const Scaled &here = Here();
+    DpiFrame a = MakeDpiFrame();
+    HWND top = QBR_CreateDock(a.manager, a.frame, DOCK_TOP);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9}, docked[] = {1, 0, 2};
+    QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 3);
+    const int threeAcross = 3 * 24 - 2 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME); // at 96 DPI
+    HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 200, threeAcross, 0, top, ids, 9);
+    Pump();
+    ASSERT_EQ((std::vector<UINT>{4, 7}), BreakIds(RecordOfWindow(floating)->floatingBreaks));
+    RECT placeBefore;
+    GetWindowRect(ResolveRoleWindow(floating, ROLE_FLOATING), &placeBefore);
+
+    auto table = CaptureTable(a.manager);
+    // The scale is on record only when it is not 96 DPI.
+    std::vector<std::string> keys;
+    for (auto &entry : table)
+        keys.push_back(entry.first);
+    char scale[64];
+    wsprintfA(scale, "%d,%d,%d", here.dpi, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN));
+    if (here.dpi == 96) {
+        EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating"}), keys);
+    } else {
+        EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating", "Display Scale"}), keys);
+        EXPECT_EQ(scale, table.back().second);
+    }
+    QBR_DestroyManager(a.manager);
+    DestroyWindow(a.frame);
+    Pump();
+
+    // The frame that restores it stands on a monitor of the other scale.
+    const Scaled &s = At(here.dpi == 96 ? 144 : 96);
+    DpiFrame b = MakeDpiFrame();
+    QBR_DpiChanged(b.frame, MAKEWPARAM(s.dpi, s.dpi), 0);
+    QBR_BeginLayout();
+    for (auto &entry : table)
+        QBR_AddLayoutEntry(entry.first.c_str(), entry.second.c_str());
+    ASSERT_EQ(1u, QBR_ApplyLayout(b.manager, b.frame));
+    QBR_FreeLayout();
+    Pump();
+    EXPECT_EQ(static_cast<UINT>(s.dpi), ManagerDpi(b.manager));
+    ASSERT_EQ(2u, QBR_GetToolbarCount(b.manager));
+    HWND restored = QBR_GetToolbar(b.manager, 1);
+    EXPECT_EQ((std::vector<UINT>{1, 2, 3, 4, 5, 6, 7, 8, 9}), ToolbarIds(restored));
+    EXPECT_EQ((std::vector<UINT>{4, 7}), BreakIds(RecordOfWindow(restored)->floatingBreaks));
+    HWND floatingFrame = ResolveRoleWindow(restored, ROLE_FLOATING);
+    RECT placeAfter;
+    GetWindowRect(floatingFrame, &placeAfter);
+    EXPECT_EQ(placeBefore.left, placeAfter.left);
+    EXPECT_EQ(placeBefore.top, placeAfter.top);
+    const int l = s.areaLeft, bw = s.buttonWidth, bh = s.buttonHeight;
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+              ClientRectOf(floatingFrame));
+    EXPECT_EQ((std::vector<UINT>{1, 0, 2}), ToolbarIds(QBR_GetToolbar(b.manager, 0)));
+    QBR_DestroyManager(b.manager);
+    DestroyWindow(b.frame);
+    Pump();
+}
+
+// A table written on a screen half this one's size puts the floating toolbar
+// at twice its numbers: the same place in proportion to the screen.
+TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
+    DpiFrame b = MakeDpiFrame();
+    const int w = GetSystemMetrics(SM_CXSCREEN), h = GetSystemMetrics(SM_CYSCREEN);
+    char scale[64];
+    wsprintfA(scale, "144,%d,%d", w / 2, h / 2);
+    QBR_BeginLayout();
+    QBR_AddLayoutEntry("Top Dock", "Floating");
+    QBR_AddLayoutEntry("Floating", "3,1,2,3,33,100,80,200,150");
+    QBR_AddLayoutEntry("Display Scale", scale);
+    ASSERT_EQ(1u, QBR_ApplyLayout(b.manager, b.frame));
+    QBR_FreeLayout();
+    Pump();
+    RECT place;
+    GetWindowRect(ResolveRoleWindow(QBR_GetToolbar(b.manager, 0), ROLE_FLOATING), &place);
+    EXPECT_EQ(MulDiv(100, w, w / 2), place.left);
+    EXPECT_EQ(MulDiv(80, h, h / 2), place.top);
+    QBR_DestroyManager(b.manager);
+    DestroyWindow(b.frame);
+    Pump();
+}
+
+// The floating frame's caption at the frame's scale: the band as tall as the
+// caption font at this DPI makes it, the line under it, then the margin above
+// the items, read back from the screen.
+TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
+    const Scaled &s = Here();
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    RedrawWindow(frameWindow, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_FRAME);
+    Pixels shown = ReadWindowPixels(frameWindow);
+    // A 7-point font is MulDiv(7, dpi, 72) pixels high: its ascent grows with
+    // the scale (the exact ascent is the installed font's).
+    EXPECT_GE(captionHeight, MulDiv(7, s.dpi, 72) * 2 / 3);
+    const int x = shown.width - 2; // right of the centred title
+    std::vector<COLORREF> column, expected;
+    for (int y = 0; y < captionHeight + s.frameTop; ++y) {
+        column.push_back(shown.At(x, y));
+        expected.push_back(y < captionHeight - 1    ? GetSysColor(COLOR_ACTIVECAPTION)
+                           : y == captionHeight - 1 ? GetSysColor(COLOR_WINDOWFRAME)
+                                                    : GetSysColor(COLOR_BTNFACE));
+    }
+    EXPECT_EQ(expected, column);
+    // The first button's frame ring starts right below the margin.
+    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
+}
