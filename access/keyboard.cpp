@@ -56,7 +56,7 @@ bool IsShown(const ToolbarRecord *record) {
 std::vector<ToolbarRecord *> ShownToolbars(ToolbarManager *manager) {
     std::vector<ToolbarRecord *> order;
     if (!manager) return order;
-    for (UINT side : {DOCK_TOP, DOCK_LEFT, DOCK_RIGHT})
+    for (UINT side : {DOCK_TOP, DOCK_LEFT, DOCK_RIGHT, DOCK_BOTTOM})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             if (dock->side == side)
                 for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(dock->toolbars, i); ++i)

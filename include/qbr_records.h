@@ -52,6 +52,8 @@ struct ToolbarManager {
     UINT categoryCount;
     HRSRC imageResource;
     HBITMAP imageStrip;
+    RECT usableArea; /* from QBR_SetUsableArea, frame client coordinates */
+    UINT hasUsableArea;
 };
 
 typedef struct ToolbarItem {

@@ -13,7 +13,10 @@ UINT layoutCount = 0;
 static LPSTR *layoutKeys = nullptr;
 static LPSTR *layoutValues = nullptr;
 
-constexpr UINT kDockKeyBase = 5106; // "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kDockKeyBase = 5106;   // "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kBottomDockKey = 5112; // "Bottom Dock", after the action names
+
+static LPCSTR DockKey(UINT side) { return LoadLibraryText(side == DOCK_BOTTOM ? kBottomDockKey : kDockKeyBase + side); }
 
 static UINT PointerBytes(UINT count) { return count * static_cast<UINT>(sizeof(LPSTR)); }
 
@@ -133,7 +136,7 @@ UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count
     BlockFill(*keys, 0, PointerBytes(n));
     BlockFill(*values, 0, PointerBytes(n));
     // Entry 0: the dock's key, and its toolbars' titles joined by commas.
-    if (!StringDuplicate(&(*keys)[0], LoadLibraryText(kDockKeyBase + dock->side)) ||
+    if (!StringDuplicate(&(*keys)[0], DockKey(dock->side)) ||
         !StringDuplicate(&(*values)[0], "")) {
         FreeEntries(*keys, *values, n);
         return 0;
@@ -155,9 +158,13 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
     if (!QBR_BeginLayout()) return 0;
     if (!manager) return 1;
     for (UINT d = 0; d < PointerListCount(manager->docks); ++d) {
+        DockArea *dock = ListAt<DockArea>(manager->docks, d);
+        // An empty bottom dock writes no line, so that a host that merely
+        // offers one stores the same arrangement as a host without it.
+        if (dock->side == DOCK_BOTTOM && !PointerListCount(dock->toolbars)) continue;
         LPSTR *keys, *values;
         UINT n;
-        if (!CaptureDockLayout(ListAt<DockArea>(manager->docks, d), &keys, &values, &n)) {
+        if (!CaptureDockLayout(dock, &keys, &values, &n)) {
             QBR_FreeLayout();
             return 0;
         }
@@ -224,9 +231,9 @@ HWND RestoreToolbar(HWND dockWindow, LPCSTR title, LPSTR value) {
 }
 
 UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR *values, UINT count) {
-    for (UINT side = DOCK_TOP; side <= DOCK_RIGHT; ++side) {
+    for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
         LPSTR titles;
-        if (!FindLayoutValue(keys, values, count, LoadLibraryText(kDockKeyBase + side), &titles)) continue;
+        if (!FindLayoutValue(keys, values, count, DockKey(side), &titles)) continue;
         HWND dock = QBR_CreateDock(manager, frame, side);
         if (!dock) continue;
         // Reading a token moves the rest to the front, so every value read is
