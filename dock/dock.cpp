@@ -361,6 +361,10 @@ extern "C" UINT QBR_SetUsableArea(ToolbarManager *manager, const RECT *area) {
     manager->hasUsableArea = area ? 1 : 0;
     manager->usableArea = area ? *area : RECT{0, 0, 0, 0};
     FollowUsableArea(manager);
+    // A chevron comes or goes with the edge: the docked panes paint anew.
+    for (UINT i = 0; ToolbarRecord *toolbar = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        if (toolbar->paneWindow && IsWindowVisible(toolbar->paneWindow))
+            InvalidateRect(toolbar->paneWindow, nullptr, TRUE);
     return 1;
 }
 

@@ -64,7 +64,7 @@ typedef struct ToolbarManager ToolbarManager;
 typedef int(CALLBACK *HelpTextProc)(UINT id, UINT kind, LPSTR buffer, int size);
 
 /* Instance that holds the library's resources (window classes, dialog
-   templates, strings 5101 to 5112). The host stores its own instance here
+   templates, strings 5101 to 5113). The host stores its own instance here
    before it creates anything; the resources are linked into the host. */
 extern HINSTANCE moduleInstance;
 
@@ -121,8 +121,11 @@ void QBR_DestroyDock(HWND window);
 /* The part of the frame's client area the toolbars may use: the client area
    less the host's own controls, such as a status bar along the bottom. The
    host calls it in its WM_SIZE answer, before it reads the docks' sizes. The
-   bottom dock stands on its bottom edge. Null (the default) means the whole
-   client area. 1 on success. */
+   bottom dock stands on its bottom edge; a docked toolbar reaching past its
+   right edge (top and bottom docks) or past the bottom dock or its bottom
+   edge (side docks) shows a chevron with the buttons it cannot show. Null
+   (the default) means the whole client area and no chevrons: without the
+   host's word the library cannot follow the frame's size. 1 on success. */
 UINT QBR_SetUsableArea(ToolbarManager *manager, const RECT *area);
 
 /* The keyboard. The host passes every message of its loop here first, as to
