@@ -172,6 +172,8 @@ TEST_F(ChevronTest, ARealClickOnTheChevronOffersTheCutOffButtonsAndClicksTheChos
     std::string seen;
     std::vector<Line> lines;
     bool menuSeen = false;
+    LONG blocksBefore = 0, objectsBefore = 0, blocksAfter = 0, objectsAfter = 0;
+    QBR_GetLiveCounts(&blocksBefore, &objectsBefore);
     ClickAtStep(ChevronOnScreen());
     ModalSteps::Add([&] {
         HMENU menu = OpenMenu();
@@ -194,6 +196,9 @@ TEST_F(ChevronTest, ARealClickOnTheChevronOffersTheCutOffButtonsAndClicksTheChos
     ModalSteps::Stop();
     Pump();
     EXPECT_EQ("Q3:4 | Q4*:5 | -- | Q5:7 | Q6*:8", seen);
+    QBR_GetLiveCounts(&blocksAfter, &objectsAfter);
+    EXPECT_EQ(blocksBefore, blocksAfter);
+    EXPECT_EQ(objectsBefore, objectsAfter) << "the menu's images are deleted with it";
     ASSERT_EQ(5u, lines.size());
     const UINT states[] = {0, MFS_CHECKED, 0, MFS_GRAYED, MFS_CHECKED};
     for (size_t i = 0; i < lines.size(); ++i) {
@@ -287,6 +292,37 @@ TEST_F(ChevronTest, TheKeyboardAndScreenReadersReachTheChevron) {
     EXPECT_EQ(8, count);
     EXPECT_EQ(E_INVALIDARG, object->get_accName(child, &name));
     object->Release();
+}
+
+// In a side dock the chevron lies across the column, above the bottom dock
+// (or the usable area's bottom edge), and the buttons below it are cut off.
+TEST_F(ChevronTest, ASideDockedToolbarIsCutOffAboveTheBottomDock) {
+    HWND left = MakeDock(DOCK_LEFT);
+    const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8};
+    HWND column = QBR_CreateToolbar("Column", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, left, ids, 8);
+    Pump();
+    ToolbarRecord *r = RecordOfWindow(column);
+    RECT third = {};
+    ASSERT_EQ(1u, GetItemRect(r, 2, &third));
+    ASSERT_GT(third.top, 20) << "the column should run down";
+    // The bottom dock's top, and so the edge, just below the chevron that
+    // clears the third button.
+    HWND bottom = MakeDock(DOCK_BOTTOM);
+    POINT edge = {0, third.bottom + kChevronSize};
+    MapWindowPoints(column, frame, &edge, 1);
+    const int dockHeight = WindowRectInParent(bottom).bottom - WindowRectInParent(bottom).top;
+    RECT usable = ClientRectOf(frame);
+    usable.bottom = edge.y + dockHeight;
+    ASSERT_EQ(1u, QBR_SetUsableArea(manager, &usable));
+    Pump();
+    RECT chevron;
+    ASSERT_EQ(1u, ChevronRect(r, &chevron));
+    EXPECT_EQ(Rect(0, third.bottom, ClientRectOf(column).right, third.bottom + kChevronSize), chevron);
+    std::vector<int> cut;
+    for (UINT i = 0; i < 8; ++i)
+        cut.push_back(IsItemCutOff(r, i) ? 1 : 0);
+    EXPECT_EQ((std::vector<int>{0, 0, 0, 1, 1, 1, 1, 1}), cut);
+    QBR_DestroyToolbar(column);
 }
 
 } // namespace
