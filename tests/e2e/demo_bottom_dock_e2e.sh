@@ -23,8 +23,9 @@ start_demo "first start"
 read -r ml mt mr mb mv <<<"$(ctl rect "$main")"
 read -r dv dl dt dr db <<<"$(bottom_dock)"
 [ "$dv" = 0 ] || fail "the bottom dock shows on a first start"
-# Its placeholder stands on the status bar, near the window's bottom edge.
-[ "$db" -lt "$mb" ] && [ "$db" -gt $((mb - 60)) ] || fail "the bottom dock is not at the bottom: $db in $mt..$mb"
+# Its placeholder stands on the status bar, which stays below everything.
+read -r sl st sr sb sv <<<"$(ctl statusrect "$main")"
+[ "$sv" = 1 ] && [ "$db" = "$st" ] || fail "the bottom dock does not stand on the status bar: $db, bar at $st"
 stop_demo "first close"
 tr -d '\r' <"$ini" | grep -q '^Bottom Dock=' && fail "an empty bottom dock was written"
 [ "$(ini_value 'Main Layout' 'Top Dock')" = "Standard,Style,Align,Palette" ] || fail "top dock line changed"
@@ -36,6 +37,8 @@ ldrag $((r - 4)) $(((t + b) / 2)) $(((ml + mr) / 2)) $(((dt + db) / 2))
 in_bottom_dock Style
 read -r dv2 dl2 dt2 dr2 db2 <<<"$(bottom_dock)"
 [ "$db2" = "$db" ] || fail "the bottom dock did not grow upwards from its edge: $db -> $db2"
+read -r sl2 st2 _ <<<"$(ctl statusrect "$main")"
+[ "$st2" = "$st" ] || fail "the status bar moved: $st -> $st2"
 before="$(toolbar_rect "$main" pane Style)"
 shot bottom-1-docked
 stop_demo "close with Style at the bottom"
