@@ -331,9 +331,9 @@ static int SideDockBottom(ToolbarManager *manager) {
     return bottomDock ? RectInParent(bottomDock).top : GetSystemMetrics(SM_CYFULLSCREEN);
 }
 
-// Moves the bottom dock onto the usable area's bottom edge and ends the side
-// docks above it, without telling the frame: called from the frame's own
-// size handling, and from a packing that tells it anyway.
+// Ends the side docks above the bottom dock, without telling the frame:
+// called from the frame's own size handling, and from a packing that tells it
+// anyway.
 void FitSideDocksAboveBottom(ToolbarManager *manager) {
     if (!manager) return;
     const int bottom = SideDockBottom(manager);
@@ -346,6 +346,8 @@ void FitSideDocksAboveBottom(ToolbarManager *manager) {
     }
 }
 
+// Moves the bottom dock onto the usable area's bottom edge, and the side docks
+// after it; the frame is not told, as it is in its own WM_SIZE answer now.
 static void FollowUsableArea(ToolbarManager *manager) {
     if (HWND bottomDock = DockWindowForSide(manager, DOCK_BOTTOM)) {
         RECT r = RectInParent(bottomDock);
