@@ -56,7 +56,7 @@ bool IsShown(const ToolbarRecord *record) {
 std::vector<ToolbarRecord *> ShownToolbars(ToolbarManager *manager) {
     std::vector<ToolbarRecord *> order;
     if (!manager) return order;
-    for (UINT side : {DOCK_TOP, DOCK_LEFT, DOCK_RIGHT})
+    for (UINT side : {DOCK_TOP, DOCK_LEFT, DOCK_RIGHT, DOCK_BOTTOM})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             if (dock->side == side)
                 for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(dock->toolbars, i); ++i)
@@ -64,6 +64,11 @@ std::vector<ToolbarRecord *> ShownToolbars(ToolbarManager *manager) {
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
         if (RecordIsFloating(record) && IsShown(record)) order.push_back(record);
     return order;
+}
+
+// A button the keyboard stops at: enabled, and not cut off behind a chevron.
+bool IsReachable(const ToolbarRecord *record, UINT index) {
+    return IsEnabledButton(record, index) && !IsItemCutOff(record, index);
 }
 
 // The first enabled button from `start` on, stepping by `step` and wrapping
@@ -77,7 +82,7 @@ bool StepToEnabled(const ToolbarRecord *record, UINT start, int step, bool wrap,
             if (!wrap) return false;
             i = i < 0 ? count - 1 : 0;
         }
-        if (IsEnabledButton(record, static_cast<UINT>(i))) {
+        if (IsReachable(record, static_cast<UINT>(i))) {
             *found = static_cast<UINT>(i);
             return true;
         }
@@ -85,10 +90,28 @@ bool StepToEnabled(const ToolbarRecord *record, UINT start, int step, bool wrap,
     return false;
 }
 
-bool FirstEnabled(const ToolbarRecord *record, UINT *found) { return StepToEnabled(record, 0, 1, false, true, found); }
+// The chevron of a cut-off toolbar is its last stop, at the index just past
+// its items; the buttons it stands for are reached through its menu.
+UINT ChevronStop(const ToolbarRecord *record) { return PointerListCount(record ? record->items : nullptr); }
+bool HasChevron(const ToolbarRecord *record) {
+    RECT rect;
+    return ChevronRect(record, &rect) != 0;
+}
+bool AtChevron(const ToolbarRecord *record) { return keyFocus.index >= ChevronStop(record); }
+
+bool FirstEnabled(const ToolbarRecord *record, UINT *found) {
+    if (StepToEnabled(record, 0, 1, false, true, found)) return true;
+    if (!HasChevron(record)) return false;
+    *found = ChevronStop(record);
+    return true;
+}
 
 bool LastEnabled(const ToolbarRecord *record, UINT *found) {
     const UINT count = PointerListCount(record ? record->items : nullptr);
+    if (HasChevron(record)) {
+        *found = ChevronStop(record);
+        return true;
+    }
     return count && StepToEnabled(record, count - 1, -1, false, true, found);
 }
 
@@ -102,7 +125,7 @@ bool NearestVertically(const ToolbarRecord *record, UINT from, bool down, UINT *
     bool any = false;
     for (UINT i = 0; i < PointerListCount(record->items); ++i) {
         RECT rect;
-        if (!IsEnabledButton(record, i) || !GetItemRect(record, i, &rect)) continue;
+        if (!IsReachable(record, i) || !GetItemRect(record, i, &rect)) continue;
         const int row = ((rect.top + rect.bottom) / 2 - oy) * (down ? 1 : -1);
         const int across = abs((rect.left + rect.right) / 2 - ox);
         if (row <= 0) continue;
@@ -123,7 +146,8 @@ ToolbarRecord *FocusedRecord() { return keyFocus.pane ? RecordOfWindow(keyFocus.
 void RepaintFocused(HWND pane, UINT index) {
     ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     RECT rect;
-    if (record && GetItemRect(record, index, &rect)) RepaintToolbarWindow(pane, ROLE_ACTIVE, &rect);
+    if (record && (GetItemRect(record, index, &rect) || (index == ChevronStop(record) && ChevronRect(record, &rect))))
+        RepaintToolbarWindow(pane, ROLE_ACTIVE, &rect);
 }
 
 void ShowKeyTip() {
@@ -217,9 +241,23 @@ void NavigateKey(ToolbarRecord *record, UINT key) {
     bool moved = false;
     switch (key) {
     case VK_LEFT:
-    case VK_RIGHT:
-        moved = StepToEnabled(record, keyFocus.index, key == VK_RIGHT ? 1 : -1, true, false, &index);
+    case VK_RIGHT: {
+        // Past the last reachable button comes the chevron, if there is one,
+        // and then the first button again; Left walks the same way back.
+        const UINT count = ChevronStop(record);
+        if (key == VK_RIGHT) {
+            if (AtChevron(record))
+                moved = FirstEnabled(record, &index);
+            else if (!(moved = StepToEnabled(record, keyFocus.index, 1, false, false, &index)))
+                moved = HasChevron(record) ? (index = count, true) : FirstEnabled(record, &index);
+        } else {
+            if (AtChevron(record))
+                moved = count && StepToEnabled(record, count - 1, -1, false, true, &index);
+            else if (!(moved = StepToEnabled(record, keyFocus.index, -1, false, false, &index)))
+                moved = LastEnabled(record, &index);
+        }
         break;
+    }
     case VK_UP:
     case VK_DOWN:
         moved = NearestVertically(record, keyFocus.index, key == VK_DOWN, &index);
@@ -262,6 +300,10 @@ void OnKeyDown(UINT key, LPARAM lParam) {
     case VK_SPACE:
     case VK_RETURN: {
         // Auto-repeat (bit 30: the key was already down) presses nothing more.
+        if (AtChevron(record)) {
+            if (!(lParam & (1 << 30)) && !keyFocus.pressedId) ShowChevronMenu(record->paneWindow);
+            break;
+        }
         UINT id = 0;
         if ((lParam & (1 << 30)) || keyFocus.pressedId || !ItemGetId(ItemAt(record, keyFocus.index), &id)) break;
         if (!IsEnabledButton(record, keyFocus.index)) break;
@@ -388,6 +430,10 @@ void AccessToolbarHidden(HWND window) {
 
 void AccessDefaultAction(HWND window, WPARAM index, LPARAM id) {
     ToolbarRecord *record = RecordOfWindow(window);
+    if (record && id == 0 && index == ChevronStop(record)) {
+        ShowChevronMenu(record->paneWindow); // does nothing once the chevron has gone
+        return;
+    }
     UINT itemId = 0;
     // The toolbar may have changed since the reader asked: only the same
     // button at the same place is pressed.

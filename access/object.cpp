@@ -1,5 +1,6 @@
 // The accessible object of a toolbar window, as screen readers see it: the
-// toolbar, and one child per item of its list (child ids 1..n in list order).
+// toolbar, and one child per item of its list (child ids 1..n in list order),
+// and, while the toolbar is cut off, its chevron as child n + 1.
 //
 // An object holds the handle of its window, never a record: every call looks
 // the toolbar up again, so that a reader's late call after the toolbar has
@@ -13,6 +14,7 @@
 
 #include "access/access.h"
 #include "core/core.h"
+#include "input/input.h"
 #include "toolbar/toolbar.h"
 
 namespace {
@@ -21,6 +23,7 @@ namespace {
 constexpr UINT kActionPressText = 5109;
 constexpr UINT kActionCheckText = 5110;
 constexpr UINT kActionUncheckText = 5111;
+constexpr UINT kChevronText = 5113; // "More buttons"
 
 // Help texts and titles are read into buffers of this size.
 constexpr int kTextBuffer = 256;
@@ -45,6 +48,13 @@ HRESULT TextResult(const char *text, BSTR *out) {
 ToolbarItem *ItemOf(const ToolbarRecord *record, LONG child) {
     return child >= 1 ? ItemAt(record, static_cast<UINT>(child - 1)) : nullptr;
 }
+
+// The chevron's child id, or 0 while the toolbar shows none.
+LONG ChevronChild(const ToolbarRecord *record) {
+    RECT rect;
+    return ChevronRect(record, &rect) ? static_cast<LONG>(PointerListCount(record->items)) + 1 : 0;
+}
+bool IsChevron(const ToolbarRecord *record, LONG id) { return id != CHILDID_SELF && id == ChevronChild(record); }
 
 bool IsButton(const ToolbarItem *item) {
     UINT kind = ITEM_SEPARATOR;
@@ -111,7 +121,7 @@ class ToolbarAccessible final : public IAccessible {
         *count = 0;
         const ToolbarRecord *record = Record();
         if (!record) return kGone;
-        *count = static_cast<LONG>(PointerListCount(record->items));
+        *count = static_cast<LONG>(PointerListCount(record->items)) + (ChevronChild(record) ? 1 : 0);
         return S_OK;
     }
     HRESULT STDMETHODCALLTYPE get_accChild(VARIANT child, IDispatch **out) override {
@@ -125,6 +135,8 @@ class ToolbarAccessible final : public IAccessible {
             char text[kTextBuffer] = "";
             if (id == CHILDID_SELF)
                 QBR_GetToolbarTitle(record->paneWindow, text, kTextBuffer);
+            else if (IsChevron(record, id))
+                return TextResult(LoadLibraryText(kChevronText), out);
             else
                 ButtonText(ItemOf(record, id), HELP_QUICK, text);
             return TextResult(text, out);
@@ -164,6 +176,7 @@ class ToolbarAccessible final : public IAccessible {
     }
     HRESULT STDMETHODCALLTYPE get_accDefaultAction(VARIANT child, BSTR *action) override {
         return Property(child, action, [](const ToolbarRecord *record, LONG id, BSTR *out) {
+            if (IsChevron(record, id)) return TextResult(LoadLibraryText(kActionPressText), out);
             const ButtonData *data = DataOf(ItemOf(record, id));
             if (!data) return S_FALSE;
             UINT text = kActionPressText;
@@ -204,10 +217,14 @@ class ToolbarAccessible final : public IAccessible {
         HRESULT hr = Resolve(child, &record, &id);
         if (FAILED(hr)) return hr;
         RECT rect;
-        if (id == CHILDID_SELF)
+        if (id == CHILDID_SELF) {
             GetWindowRect(window_, &rect);
-        else if (!ItemScreenRect(record, static_cast<UINT>(id - 1), &rect))
+        } else if (IsChevron(record, id)) {
+            ChevronRect(record, &rect);
+            ClientRectToScreen(record->paneWindow, &rect);
+        } else if (!ItemScreenRect(record, static_cast<UINT>(id - 1), &rect)) {
             return S_FALSE; // a separator the floating frame leaves out has no place
+        }
         *left = rect.left;
         *top = rect.top;
         *width = rect.right - rect.left;
@@ -222,6 +239,13 @@ class ToolbarAccessible final : public IAccessible {
         RECT outer;
         POINT p = {x, y};
         if (!GetWindowRect(ItemsWindow(record), &outer) || !PtInRect(&outer, p)) return S_FALSE;
+        // The chevron lies over the items it cuts off, and wins as for a click.
+        POINT inPane = p;
+        ScreenToClient(record->paneWindow, &inPane);
+        if (ChevronChild(record) && InChevron(record->paneWindow, inPane.x, inPane.y)) {
+            SetChild(found, ChevronChild(record));
+            return S_OK;
+        }
         // Item rectangles share their edge columns with their neighbours; the
         // first item that holds the point wins, as for a click.
         for (UINT i = 0; i < PointerListCount(record->items); ++i) {
@@ -241,7 +265,7 @@ class ToolbarAccessible final : public IAccessible {
         LONG id = 0;
         HRESULT hr = Resolve(start, &record, &id);
         if (FAILED(hr)) return hr;
-        const LONG count = static_cast<LONG>(PointerListCount(record->items));
+        const LONG count = static_cast<LONG>(PointerListCount(record->items)) + (ChevronChild(record) ? 1 : 0);
         LONG target = 0;
         switch (direction) {
         case NAVDIR_FIRSTCHILD:
@@ -274,6 +298,10 @@ class ToolbarAccessible final : public IAccessible {
         LONG id = 0;
         HRESULT hr = Resolve(child, &record, &id);
         if (FAILED(hr)) return hr;
+        // The chevron's menu opens from the message loop too.
+        if (IsChevron(record, id))
+            return PostMessageA(record->paneWindow, kAccessDefaultAction, static_cast<WPARAM>(id - 1), 0) ? S_OK
+                                                                                                          : E_FAIL;
         ToolbarItem *item = ItemOf(record, id);
         const ButtonData *data = DataOf(item);
         if (!data) return DISP_E_MEMBERNOTFOUND; // the toolbar and its separators have no action
@@ -301,7 +329,8 @@ class ToolbarAccessible final : public IAccessible {
         const ToolbarRecord *found = Record();
         if (!found) return kGone;
         if (child.vt != VT_I4) return E_INVALIDARG;
-        if (child.lVal < 0 || child.lVal > static_cast<LONG>(PointerListCount(found->items))) return E_INVALIDARG;
+        const LONG last = static_cast<LONG>(PointerListCount(found->items)) + (ChevronChild(found) ? 1 : 0);
+        if (child.lVal < 0 || child.lVal > last) return E_INVALIDARG;
         if (record) *record = found;
         if (id) *id = child.lVal;
         return S_OK;
@@ -331,6 +360,7 @@ class ToolbarAccessible final : public IAccessible {
 
     static LONG RoleOf(const ToolbarRecord *record, LONG id) {
         if (id == CHILDID_SELF) return ROLE_SYSTEM_TOOLBAR;
+        if (IsChevron(record, id)) return ROLE_SYSTEM_BUTTONMENU;
         const ButtonData *data = DataOf(ItemOf(record, id));
         if (!data) return ROLE_SYSTEM_SEPARATOR;
         return (ButtonGetBehaviour(data) & BTN_CHECK) ? ROLE_SYSTEM_CHECKBUTTON : ROLE_SYSTEM_PUSHBUTTON;
@@ -341,6 +371,9 @@ class ToolbarAccessible final : public IAccessible {
         const DWORD hidden = IsWindowVisible(id == CHILDID_SELF ? window_ : ItemsWindow(record))
                                  ? 0
                                  : static_cast<DWORD>(STATE_SYSTEM_INVISIBLE);
+        if (IsChevron(record, id))
+            return hidden | STATE_SYSTEM_FOCUSABLE | STATE_SYSTEM_HASPOPUP |
+                   (AccessIsFocused(record, static_cast<UINT>(id - 1)) ? STATE_SYSTEM_FOCUSED : 0);
         const ButtonData *data = DataOf(ItemOf(record, id));
         if (!data) return hidden;
         DWORD state = hidden;

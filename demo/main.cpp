@@ -354,19 +354,23 @@ HWND CreateEditControl(HWND frame, HFONT *font) {
     return edit;
 }
 
-// The client control goes below the top dock and above the status bar; the
-// side docks lie over it. The manager may still be 0 while the docks are
-// being built, as the dock tells the frame of each change at once.
+// The client control goes between the top and bottom docks, the status bar
+// below everything; the side docks lie over the control. The library is told
+// what the status bar leaves, so that the bottom dock stands on it. The
+// manager may still be 0 while the docks are being built, as the dock tells
+// the frame of each change at once.
+static int ShownDockHeight(ToolbarManager *manager, UINT side) {
+    HWND dock = QBR_GetDock(manager, side);
+    if (!dock || !IsWindowVisible(dock)) return 0;
+    RECT r;
+    GetWindowRect(dock, &r);
+    return r.bottom - r.top;
+}
+
 void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND edit) {
     RECT client;
     GetClientRect(frame, &client);
-    int topSpace = 0, statusHeight = 0;
-    HWND top = QBR_GetDock(manager, DOCK_TOP);
-    if (top && IsWindowVisible(top)) {
-        RECT r;
-        GetWindowRect(top, &r);
-        topSpace = r.bottom - r.top - 1;
-    }
+    int statusHeight = 0;
     if (statusBar && IsWindowVisible(statusBar)) {
         RECT r;
         GetWindowRect(statusBar, &r);
@@ -374,10 +378,17 @@ void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND
         SetWindowPos(statusBar, nullptr, client.left, client.bottom - statusHeight, client.right, statusHeight,
                      SWP_NOZORDER | SWP_NOACTIVATE);
     }
+    RECT usable = client;
+    usable.bottom -= statusHeight;
+    QBR_SetUsableArea(manager, &usable);
+    // The top dock's last line is the control's top border.
+    const int topHeight = ShownDockHeight(manager, DOCK_TOP);
+    const int topSpace = topHeight ? topHeight - 1 : 0;
+    const int bottomSpace = ShownDockHeight(manager, DOCK_BOTTOM);
     // At the bottom of the z-order: the side docks lie over it and must get the mouse.
     if (edit)
         SetWindowPos(edit, HWND_BOTTOM, client.left - 1, topSpace - 1, client.right + 1,
-                     client.bottom - topSpace - statusHeight + 1, SWP_NOACTIVATE);
+                     usable.bottom - bottomSpace - topSpace + 1, SWP_NOACTIVATE);
 }
 
 INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM) {

@@ -72,7 +72,8 @@ static std::vector<char> ReadProfile(LPCSTR section, LPCSTR key) {
 namespace {
 
 constexpr char kEscape = '%';
-constexpr UINT kDockKeyBase = 5106; // the library's "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kDockKeyBase = 5106;   // the library's "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kBottomDockKey = 5112; // and "Bottom Dock"
 
 bool IsBlank(unsigned char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
 
@@ -167,9 +168,10 @@ class FileKeys {
 
 // A dock's key: the library's strings are linked into the program.
 bool IsDockKey(const std::string &key) {
-    for (UINT side = DOCK_TOP; side <= DOCK_RIGHT; ++side) {
+    for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
         char text[256] = "";
-        if (LoadStringA(moduleInstance, kDockKeyBase + side, text, sizeof text) > 0 && key == text) return true;
+        const UINT id = side == DOCK_BOTTOM ? kBottomDockKey : kDockKeyBase + side;
+        if (LoadStringA(moduleInstance, id, text, sizeof text) > 0 && key == text) return true;
     }
     return false;
 }

@@ -90,7 +90,11 @@ ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section) {
     QBR_SetButtonBehaviour(manager, 151, BTN_LATCH);
     QBR_SetButtonEnabled(manager, 107, 0);
     QBR_SetButtonState(manager, 301, 2);
-    return RestoreOrDefault(manager, frame, section, kMainToolbars);
+    if (!RestoreOrDefault(manager, frame, section, kMainToolbars)) return nullptr;
+    // A bottom dock, empty unless the stored arrangement filled it: an empty
+    // one is not written, so the default arrangement's file is as before.
+    if (!QBR_GetDock(manager, DOCK_BOTTOM) && !QBR_CreateDock(manager, frame, DOCK_BOTTOM)) return nullptr;
+    return manager;
 }
 
 ToolbarManager *BuildViewToolbars(HWND frame, LPCSTR section) {

@@ -1,5 +1,5 @@
-// Dock areas: the strips along the top, left and right edges of a frame's
-// client area. A dock packs the panes of its toolbars into rows, sizes itself
+// Dock areas: the strips along the top, left, right and bottom edges of a
+// frame's client area. A dock packs the panes of its toolbars into rows, sizes itself
 // to them, hides when it has nothing to show and tells the frame through
 // WM_SIZE (both parameters 0) whenever its place, size or visibility changed.
 #include "dock/dock.h"
@@ -149,6 +149,8 @@ UINT GetDockSide(HWND window, UINT *side) {
     return 1;
 }
 
+bool IsAcrossDock(UINT side) { return side == DOCK_TOP || side == DOCK_BOTTOM; }
+
 // A toolbar that takes part in packing: docked, visible and with a pane.
 static bool IsPacked(const ToolbarRecord *toolbar) {
     return !(toolbar->flags & TBF_FLOATING) && (toolbar->flags & TBF_VISIBLE) && toolbar->paneWindow;
@@ -164,9 +166,10 @@ UINT DockInsertionIndex(DockArea *dock, int x, int y, UINT *index) {
         if (!IsPacked(toolbar)) continue;
         RECT pane;
         GetToolbarWindowRect(toolbar->paneWindow, ROLE_DOCKED, &pane);
-        // Rows run left to right in every dock; in the top dock a row lies
-        // below the one before it, in the side docks a column beside it.
-        bool before = dock->side == DOCK_TOP ? y < pane.top : x < pane.left;
+        // Rows run left to right in every dock; in the top and bottom docks a
+        // row lies below the one before it, in the side docks a column beside
+        // it.
+        bool before = IsAcrossDock(dock->side) ? y < pane.top : x < pane.left;
         if (PointInRectInclusive(&pane, x, y) || before) {
             result = i;
             break;
@@ -297,11 +300,78 @@ void PlaceDock(HWND window, RECT *rect) {
     if (moved || resized || !IsWindowVisible(window)) {
         ShowWindow(window, show);
         ToolbarManager *manager = DockManager(window);
+        // The side docks end above the bottom dock: they follow its top.
+        DockArea *placed = FindDockRecord(window);
+        if ((moved || resized) && placed && placed->side == DOCK_BOTTOM) FitSideDocksAboveBottom(manager);
         HWND frame = manager ? manager->frame : parent;
         // Both parameters 0: the host reads the sizes itself.
         SendMessageA(frame, WM_SIZE, 0, 0);
     }
     UpdateWindow(window);
+}
+
+// The bottom of the area the toolbars may use, in the frame's client
+// coordinates: the host's word if it gave one, else the client area's.
+static int UsableBottom(ToolbarManager *manager) {
+    if (manager->hasUsableArea) return manager->usableArea.bottom;
+    RECT client;
+    GetClientRect(manager->frame, &client);
+    return client.bottom;
+}
+
+// The window's rectangle in its parent's client coordinates.
+static RECT RectInParent(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    MapWindowPoints(nullptr, GetParent(window), reinterpret_cast<POINT *>(&r), 2);
+    return r;
+}
+
+// Where a side dock ends: above the bottom dock, shown or not (a hidden one
+// keeps its placeholder there as a drop target), else at the full-screen
+// height.
+static int SideDockBottom(ToolbarManager *manager) {
+    HWND bottomDock = DockWindowForSide(manager, DOCK_BOTTOM);
+    return bottomDock ? RectInParent(bottomDock).top : GetSystemMetrics(SM_CYFULLSCREEN);
+}
+
+// Ends the side docks above the bottom dock, without telling the frame:
+// called from the frame's own size handling, and from a packing that tells it
+// anyway.
+void FitSideDocksAboveBottom(ToolbarManager *manager) {
+    if (!manager) return;
+    const int bottom = SideDockBottom(manager);
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i) {
+        if (IsAcrossDock(dock->side)) continue;
+        RECT r = RectInParent(dock->window);
+        if (r.bottom != bottom)
+            SetWindowPos(dock->window, nullptr, 0, 0, r.right - r.left, bottom - r.top,
+                         SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    }
+}
+
+// Moves the bottom dock onto the usable area's bottom edge, and the side docks
+// after it; the frame is not told, as it is in its own WM_SIZE answer now.
+static void FollowUsableArea(ToolbarManager *manager) {
+    if (HWND bottomDock = DockWindowForSide(manager, DOCK_BOTTOM)) {
+        RECT r = RectInParent(bottomDock);
+        const int top = UsableBottom(manager) - (r.bottom - r.top);
+        if (r.top != top)
+            SetWindowPos(bottomDock, nullptr, r.left, top, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+    }
+    FitSideDocksAboveBottom(manager);
+}
+
+extern "C" UINT QBR_SetUsableArea(ToolbarManager *manager, const RECT *area) {
+    if (!manager) return 0;
+    manager->hasUsableArea = area ? 1 : 0;
+    manager->usableArea = area ? *area : RECT{0, 0, 0, 0};
+    FollowUsableArea(manager);
+    // A chevron comes or goes with the edge: the docked panes paint anew.
+    for (UINT i = 0; ToolbarRecord *toolbar = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        if (toolbar->paneWindow && IsWindowVisible(toolbar->paneWindow))
+            InvalidateRect(toolbar->paneWindow, nullptr, TRUE);
+    return 1;
 }
 
 void ApplyDockSideRule(HWND window, RECT *rect) {
@@ -313,8 +383,17 @@ void ApplyDockSideRule(HWND window, RECT *rect) {
         rect->right = GetSystemMetrics(SM_CXFULLSCREEN);
         return;
     }
+    if (dock->side == DOCK_BOTTOM) {
+        // As the top dock, but standing on the usable area's bottom edge and
+        // growing upwards as rows are added.
+        const int height = rect->bottom - rect->top;
+        rect->right = GetSystemMetrics(SM_CXFULLSCREEN);
+        rect->bottom = UsableBottom(manager);
+        rect->top = rect->bottom - height;
+        return;
+    }
     // The side docks start below the top dock, whether that shows or not, and
-    // run to the full-screen height.
+    // run to the full-screen height, or to the bottom dock if there is one.
     int top = 0;
     if (HWND topDock = DockWindowForSide(manager, DOCK_TOP)) {
         RECT client;
@@ -322,7 +401,7 @@ void ApplyDockSideRule(HWND window, RECT *rect) {
         top = client.bottom;
     }
     rect->top = top;
-    rect->bottom = GetSystemMetrics(SM_CYFULLSCREEN);
+    rect->bottom = SideDockBottom(manager);
     if (dock->side == DOCK_RIGHT) {
         RECT frameClient;
         GetClientRect(manager->frame, &frameClient);

@@ -12,6 +12,10 @@ DockArea *FindDockRecord(HWND window);
 HWND DockWindowFromPoint(ToolbarManager *manager, int x, int y);
 HWND DockWindowForSide(ToolbarManager *manager, UINT side);
 UINT GetDockSide(HWND window, UINT *side);
+// The top and bottom docks lay their rows across the frame; the side docks
+// lay theirs as columns.
+bool IsAcrossDock(UINT side);
+void FitSideDocksAboveBottom(ToolbarManager *manager);
 UINT DockInsertionIndex(DockArea *dock, int x, int y, UINT *index);
 UINT ToolbarIndexInDock(DockArea *dock, ToolbarRecord *toolbar, UINT *index);
 UINT InsertToolbarAt(DockArea *dock, UINT index, ToolbarRecord *toolbar);

@@ -56,6 +56,8 @@ struct ToolbarManager {
     LPSTR imageName;  /* the strip's resource name, owned; null for a numbered resource */
     UINT imageScale;  /* the scale in per cent that imageStrip was drawn for; 0 is 100 */
     UINT imageFactor; /* the whole factor it was enlarged by since; 0 is 1 */
+    RECT usableArea; /* from QBR_SetUsableArea, frame client coordinates */
+    UINT hasUsableArea;
 };
 
 typedef struct ToolbarItem {

@@ -60,6 +60,7 @@ extern "C" {
 #define DOCK_TOP 0
 #define DOCK_LEFT 1
 #define DOCK_RIGHT 2
+#define DOCK_BOTTOM 3
 
 typedef struct ToolbarManager ToolbarManager;
 
@@ -69,7 +70,7 @@ typedef struct ToolbarManager ToolbarManager;
 typedef int(CALLBACK *HelpTextProc)(UINT id, UINT kind, LPSTR buffer, int size);
 
 /* Instance that holds the library's resources (window classes, dialog
-   templates, strings 5101 to 5111). The host stores its own instance here
+   templates, strings 5101 to 5113). The host stores its own instance here
    before it creates anything; the resources are linked into the host. */
 extern HINSTANCE moduleInstance;
 
@@ -147,6 +148,15 @@ HWND QBR_GetToolbarDock(HWND pane);
 HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side);
 HWND QBR_GetDock(ToolbarManager *manager, UINT side);
 void QBR_DestroyDock(HWND window);
+/* The part of the frame's client area the toolbars may use: the client area
+   less the host's own controls, such as a status bar along the bottom. The
+   host calls it in its WM_SIZE answer, before it reads the docks' sizes. The
+   bottom dock stands on its bottom edge; a docked toolbar reaching past its
+   right edge (top and bottom docks) or past the bottom dock or its bottom
+   edge (side docks) shows a chevron with the buttons it cannot show. Null
+   (the default) means the whole client area and no chevrons: without the
+   host's word the library cannot follow the frame's size. 1 on success. */
+UINT QBR_SetUsableArea(ToolbarManager *manager, const RECT *area);
 
 /* The keyboard. The host passes every message of its loop here first, as to
    IsDialogMessage; 1 means the toolbars used it, and it must be neither

@@ -54,3 +54,13 @@ void OnToolbarCommand(HWND window, UINT id);
 // end of a press that was let go elsewhere.
 void StartKeyPress(HWND window, UINT id);
 void FinishKeyPress(HWND window, UINT id, bool completed);
+
+// The chevron of a docked toolbar cut off at the edge of its host's usable
+// area: its rectangle in the pane's client coordinates (0 when there is none),
+// whether the item at `index` is under it or past it, its painting, whether a
+// point of `window` is on it, and its menu, whose choice is clicked.
+UINT ChevronRect(const ToolbarRecord *record, RECT *rect);
+bool IsItemCutOff(const ToolbarRecord *record, UINT index);
+void PaintChevron(HWND window, HDC dc);
+UINT InChevron(HWND window, int x, int y);
+UINT ShowChevronMenu(HWND window);

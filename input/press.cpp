@@ -188,6 +188,12 @@ void OnToolbarLeftDown(HWND window, int x, int y, UINT) {
         BeginClosePress(window);
         return;
     }
+    // The chevron lies over the cut-off buttons: it is asked first.
+    if (InChevron(window, x, y)) {
+        AccessLeaveKeyboard();
+        ShowChevronMenu(window);
+        return;
+    }
     mouseTrack.hitItem =
         HitTestToolbar(ResolveRoleWindow(window, ROLE_DOCKED), x, y, &mouseTrack.hitItemId, &mouseTrack.hitRect);
     if (mouseTrack.hitItem)

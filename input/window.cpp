@@ -101,6 +101,7 @@ static void OnDoubleClick(HWND window, LPARAM lParam) {
     int x = static_cast<int>(LOWORD(lParam)), y = static_cast<int>(HIWORD(lParam));
     HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
     if (HitTestToolbar(pane, x, y, nullptr, nullptr)) return; // on a button: the click did it all
+    if (InChevron(window, x, y)) return;                       // the chevron: a second menu, nothing more
     UINT flags = QBR_GetToolbarFlags(pane);
     if (IsFloatingFrame(window)) {
         RECT box;

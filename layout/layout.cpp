@@ -13,11 +13,14 @@ UINT layoutCount = 0;
 static LPSTR *layoutKeys = nullptr;
 static LPSTR *layoutValues = nullptr;
 
-constexpr UINT kDockKeyBase = 5106; // "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kDockKeyBase = 5106;   // "Top Dock", "Left Dock", "Right Dock"
+constexpr UINT kBottomDockKey = 5112; // "Bottom Dock", after the action names
 // The display scale the table was written at, as "DPI,screen width,screen
 // height". Written only when the scale is not 96 DPI, so that a table of a
 // frame at 100 % is the same as ever; a table without it was written at 96.
 constexpr char kScaleKey[] = "Display Scale";
+
+static LPCSTR DockKey(UINT side) { return LoadLibraryText(side == DOCK_BOTTOM ? kBottomDockKey : kDockKeyBase + side); }
 
 static UINT PointerBytes(UINT count) { return count * static_cast<UINT>(sizeof(LPSTR)); }
 
@@ -137,7 +140,7 @@ UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count
     BlockFill(*keys, 0, PointerBytes(n));
     BlockFill(*values, 0, PointerBytes(n));
     // Entry 0: the dock's key, and its toolbars' titles joined by commas.
-    if (!StringDuplicate(&(*keys)[0], LoadLibraryText(kDockKeyBase + dock->side)) ||
+    if (!StringDuplicate(&(*keys)[0], DockKey(dock->side)) ||
         !StringDuplicate(&(*values)[0], "")) {
         FreeEntries(*keys, *values, n);
         return 0;
@@ -158,10 +161,21 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
     if (count) *count = 0;
     if (!QBR_BeginLayout()) return 0;
     if (!manager) return 1;
+    // The scale comes first, so that the docks' entries stay together, each
+    // dock followed by its toolbars, as a host that stores them may expect.
+    if (ManagerDpi(manager) != kBaseDpi) {
+        char scale[64];
+        wsprintfA(scale, "%u,%d,%d", ManagerDpi(manager), GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN));
+        if (!QBR_AddLayoutEntry(kScaleKey, scale)) return 0;
+    }
     for (UINT d = 0; d < PointerListCount(manager->docks); ++d) {
+        DockArea *dock = ListAt<DockArea>(manager->docks, d);
+        // An empty bottom dock writes no line, so that a host that merely
+        // offers one stores the same arrangement as a host without it.
+        if (dock->side == DOCK_BOTTOM && !PointerListCount(dock->toolbars)) continue;
         LPSTR *keys, *values;
         UINT n;
-        if (!CaptureDockLayout(ListAt<DockArea>(manager->docks, d), &keys, &values, &n)) {
+        if (!CaptureDockLayout(dock, &keys, &values, &n)) {
             QBR_FreeLayout();
             return 0;
         }
@@ -176,11 +190,6 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
         MemoryBlockFree(keys);
         MemoryBlockFree(values);
         layoutCount += n;
-    }
-    if (ManagerDpi(manager) != kBaseDpi) {
-        char scale[64];
-        wsprintfA(scale, "%u,%d,%d", ManagerDpi(manager), GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN));
-        if (!QBR_AddLayoutEntry(kScaleKey, scale)) return 0;
     }
     if (count) *count = layoutCount;
     return 1;
@@ -254,9 +263,9 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
     // all those moves (quadratic in a value's length). A title in a dock's
     // value that names the dock's own key reads on from that same cursor.
     std::vector<LPSTR> cursors(values, values + count);
-    for (UINT side = DOCK_TOP; side <= DOCK_RIGHT; ++side) {
+    for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
         UINT dockIndex;
-        if (!FindLayoutIndex(keys, count, LoadLibraryText(kDockKeyBase + side), &dockIndex)) continue;
+        if (!FindLayoutIndex(keys, count, DockKey(side), &dockIndex)) continue;
         HWND dock = QBR_CreateDock(manager, frame, side);
         if (!dock) continue;
         {

@@ -5,6 +5,7 @@
 // only code that paints toolbars pulls it in.
 #include "core/core.h"
 #include "core/gdi.h"
+#include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -41,6 +42,7 @@ void PaintToolbar(HWND window) {
         PaintToolbarItems(ResolveRoleWindow(window, ROLE_DOCKED));
         EndButtonPaint();
     }
+    PaintChevron(target, dc);
 }
 
 // The band, from the top of the client area down to captionHeight:

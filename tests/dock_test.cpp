@@ -436,4 +436,90 @@ TEST_F(DockPackTest, ADockThatHoldsToolbarsIsNotDestroyed) {
     EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
 }
 
+// ---- The bottom dock ------------------------------------------------------------------
+
+// It stands on the usable area's bottom edge (the client area's until the host
+// says otherwise), full-screen wide, and the side docks end above it, shown
+// or not. The host's word moves it and the side docks without a WM_SIZE: the
+// host gives it from its own WM_SIZE answer.
+TEST_F(DockTest, BottomDockStandsOnTheUsableAreaAndTheSideDocksEndAboveIt) {
+    const ButtonSize b = CurrentButton();
+    const int cxFull = GetSystemMetrics(SM_CXFULLSCREEN);
+    const RECT client = ClientRectOf(frame);
+    HWND top = MakeDock(DOCK_TOP);
+    Pump();
+    ClearFrameLog();
+    HWND bottom = MakeDock(DOCK_BOTTOM);
+    Pump();
+    EXPECT_EQ(kOneSize, FrameLog()) << Describe(FrameLog());
+    EXPECT_EQ(bottom, QBR_GetDock(manager, DOCK_BOTTOM));
+    EXPECT_EQ(top, QBR_GetDock(manager, DOCK_TOP));
+    EXPECT_FALSE(IsWindowVisible(bottom));
+    EXPECT_EQ(Rect(0, client.bottom - b.height, cxFull, client.bottom), WindowRectInParent(bottom));
+    HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
+    EXPECT_EQ(Rect(0, b.height, b.width, client.bottom - b.height), WindowRectInParent(left));
+    EXPECT_EQ(Rect(client.right - b.width, b.height, client.right, client.bottom - b.height),
+              WindowRectInParent(right));
+    Pump();
+    ClearFrameLog();
+    // A status bar of 20 pixels: the dock stands on it.
+    const RECT usable = Rect(0, 0, client.right, client.bottom - 20);
+    EXPECT_EQ(1u, QBR_SetUsableArea(manager, &usable));
+    Pump();
+    EXPECT_EQ(0, CountHeard(WM_SIZE));
+    EXPECT_EQ(Rect(0, usable.bottom - b.height, cxFull, usable.bottom), WindowRectInParent(bottom));
+    EXPECT_EQ(usable.bottom - b.height, WindowRectInParent(left).bottom);
+    EXPECT_EQ(usable.bottom - b.height, WindowRectInParent(right).bottom);
+    // Null: the whole client area again; no manager: 0.
+    EXPECT_EQ(1u, QBR_SetUsableArea(manager, nullptr));
+    EXPECT_EQ(client.bottom, WindowRectInParent(bottom).bottom);
+    EXPECT_EQ(client.bottom - b.height, WindowRectInParent(left).bottom);
+    EXPECT_EQ(0u, QBR_SetUsableArea(nullptr, &usable));
+    // The dropping place follows it.
+    RECT r;
+    GetWindowRect(bottom, &r);
+    EXPECT_EQ(bottom, DockWindowFromPoint(manager, r.left + 50, r.bottom - 2));
+    // Without a bottom dock the side docks keep the full-screen height.
+    QBR_DestroyDock(bottom);
+    EXPECT_EQ(1u, RelayoutDock(left));
+    EXPECT_EQ(GetSystemMetrics(SM_CYFULLSCREEN), WindowRectInParent(left).bottom);
+}
+
+// The same toolbars pack alike in the top and the bottom dock: the same pane
+// places inside the dock and the same dock height, the bottom dock growing
+// upwards from the usable area's edge; the side docks follow its top.
+TEST_F(DockPackTest, BottomDockPacksAsTheTopDockAndGrowsUpwards) {
+    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
+    HWND t[3];
+    ThreeToolbars(t);
+    HWND bottom = MakeDock(DOCK_BOTTOM);
+    HWND left = MakeDock(DOCK_LEFT);
+    const RECT usable = Rect(0, 0, ClientRectOf(frame).right, ClientRectOf(frame).bottom - 17);
+    QBR_SetUsableArea(manager, &usable);
+    std::vector<HWND> u;
+    for (UINT first : {1u, 31u, 43u}) {
+        const UINT count = first == 1 ? 30 : first == 31 ? 12 : 8;
+        std::vector<UINT> ids;
+        for (UINT i = 0; i < count; ++i)
+            ids.push_back(first + i);
+        u.push_back(QBR_CreateToolbar("B", TBF_VISIBLE | TBF_DOCKED, 100, 100, 0, 0, bottom, ids.data(), count));
+        Pump();
+        const RECT d = WindowRectInParent(bottom);
+        EXPECT_EQ(usable.bottom, d.bottom) << "it stands on the usable edge";
+        EXPECT_EQ(d.top, WindowRectInParent(left).bottom) << "the left dock ends above it";
+    }
+    for (int i = 0; i < 3; ++i)
+        EXPECT_EQ(WindowRectInParent(t[i]), WindowRectInParent(u[static_cast<size_t>(i)])) << "pane " << i;
+    const int height = H(WindowRectInParent(dock));
+    EXPECT_EQ(Rect(0, usable.bottom - height, limit, usable.bottom), WindowRectInParent(bottom));
+    EXPECT_TRUE(IsWindowVisible(bottom));
+    // Emptied, it hides again and keeps its placeholder on the edge.
+    for (HWND pane : u)
+        QBR_DestroyToolbar(pane);
+    Pump();
+    EXPECT_FALSE(IsWindowVisible(bottom));
+    EXPECT_EQ(Rect(0, usable.bottom - CurrentButton().height, limit, usable.bottom), WindowRectInParent(bottom));
+    EXPECT_EQ(usable.bottom - CurrentButton().height, WindowRectInParent(left).bottom);
+}
+
 } // namespace

@@ -429,7 +429,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
     if (here.dpi == 96) {
         EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating"}), keys);
     } else {
-        EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating", "Display Scale"}), keys);
+        EXPECT_EQ((std::vector<std::string>{"Display Scale", "Top Dock", "Docked", "Floating"}), keys);
         EXPECT_EQ(scale, table.back().second);
     }
     QBR_DestroyManager(a.manager);

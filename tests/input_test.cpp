@@ -386,6 +386,54 @@ TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
 
 // ---- Toolbar drags -----------------------------------------------------------------
 
+// The bottom dock takes a dragged toolbar, gives it back to a double click
+// after a tear-off, and lets it go again when dragged out; it hides emptied.
+TEST_F(InputTest, ToolbarsAreDraggedIntoTheBottomDockAndOut) {
+    HWND bottom = MakeDock(DOCK_BOTTOM);
+    HWND anchor = Make({5, 6}); // keeps the top dock showing
+    HWND pane = Make({1, 2, 3});
+    const POINT into = InDock(bottom);
+    const POINT from = Empty(pane);
+    Down(from);
+    Move(Offset(from, 7, 9));
+    Move(into);
+    Up(into);
+    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
+    EXPECT_EQ(bottom, GetParent(pane));
+    EXPECT_EQ(bottom, QBR_GetToolbarDock(pane));
+    EXPECT_EQ(std::vector<HWND>{pane}, Order(bottom));
+    EXPECT_EQ(std::vector<HWND>{anchor}, Order(top));
+    EXPECT_TRUE(IsWindowVisible(bottom));
+    EXPECT_EQ(ClientRectOf(frame).bottom, WindowRectInParent(bottom).bottom) << "on the frame's bottom edge";
+    for (UINT state : stateHeard)
+        EXPECT_EQ(0u, state);
+
+    // A double click tears it off, another on the caption brings it back here.
+    Click(Empty(pane));
+    Mouse(WM_LBUTTONDBLCLK, Empty(pane));
+    Up(Empty(pane));
+    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
+    EXPECT_FALSE(IsWindowVisible(bottom));
+    Click(Caption(pane));
+    Mouse(WM_LBUTTONDBLCLK, Caption(pane));
+    Up(Caption(pane));
+    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
+    EXPECT_EQ(bottom, GetParent(pane));
+    EXPECT_TRUE(IsWindowVisible(bottom));
+
+    // Dragged out onto the frame's client area it floats; the dock hides.
+    const POINT again = Empty(pane);
+    Down(again);
+    Move(Offset(again, 7, -9));
+    Move(Outside());
+    Up(Outside());
+    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
+    EXPECT_FALSE(IsWindowVisible(bottom));
+    QBR_DestroyToolbar(pane);
+    QBR_DestroyToolbar(anchor);
+}
+
+
 TEST_F(InputTest, DropsDockFloatAndKeepLockedToolbarsOnTheirSide) {
     HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
     enum Drop { Outside_, OnTop, OnLeft, OnRight };

@@ -320,4 +320,33 @@ TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {
     QBR_FreeLayout();
 }
 
+TEST_F(LayoutTest, TheBottomDockIsStoredUnderItsOwnKeyOnlyWhenItHoldsToolbars) {
+    HWND top = MakeDock(DOCK_TOP);
+    const UINT standard[] = {101, 102};
+    QBR_CreateToolbar("Standard", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, standard, 2);
+    Pump();
+    const Entries withoutBottom = Capture(manager);
+    HWND bottom = MakeDock(DOCK_BOTTOM);
+    EXPECT_EQ(withoutBottom, Capture(manager)) << "an empty bottom dock writes nothing";
+    const UINT low[] = {103, 0, 104};
+    HWND pane = QBR_CreateToolbar("Low", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, bottom, low, 3);
+    Pump();
+    const Entries entries = Capture(manager);
+    ASSERT_EQ(withoutBottom.size() + 2, entries.size());
+    EXPECT_EQ((std::pair<std::string, std::string>{"Bottom Dock", "Low"}), entries[withoutBottom.size()]);
+    EXPECT_EQ("Low", entries.back().first);
+
+    otherManager = SecondManager();
+    Apply(otherManager, other, entries);
+    HWND restoredBottom = QBR_GetDock(otherManager, DOCK_BOTTOM);
+    ASSERT_NE(nullptr, restoredBottom);
+    HWND restored = QBR_GetToolbar(otherManager, 1);
+    EXPECT_EQ(restoredBottom, QBR_GetToolbarDock(restored));
+    EXPECT_EQ((std::vector<UINT>{103, 0, 104}), ToolbarIds(restored));
+    EXPECT_TRUE(IsWindowVisible(restoredBottom));
+    EXPECT_EQ(ClientRectOf(other).bottom, WindowRectInParent(restoredBottom).bottom);
+    EXPECT_EQ(entries, Capture(otherManager));
+    QBR_DestroyToolbar(pane);
+}
+
 } // namespace

@@ -91,7 +91,7 @@ HWND DockOfToolbar(HWND window) {
 
 UINT IsSideDocked(HWND window) {
     UINT side;
-    return GetDockSide(DockOfToolbar(window), &side) && side != DOCK_TOP ? 1 : 0;
+    return GetDockSide(DockOfToolbar(window), &side) && !IsAcrossDock(side) ? 1 : 0;
 }
 
 // ---- Creation -------------------------------------------------------------------
@@ -432,7 +432,8 @@ UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight)
 // Every dock is packed once, after all toolbars are refitted: packing it again
 // for each of its toolbars would move and paint its panes once per toolbar (a
 // dock of 40 took 40 packs), and only the last packing would stay on the
-// screen. The top dock goes first, since the side docks start below it.
+// screen. The top and bottom docks go first, since the side docks lie
+// between them.
 UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     if (!manager) return 0;
     {
@@ -446,7 +447,7 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     }
     for (bool top : {true, false})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
-            if ((dock->side == DOCK_TOP) == top) PackDock(dock);
+            if (IsAcrossDock(dock->side) == top) PackDock(dock);
     return 1;
 }
 

@@ -51,18 +51,21 @@ toolbar_rect() {
         $1 == k && title == t { print $2, $3, $4, $5, $6 }'
 }
 
-# "visible left top right bottom" of the dock on side $2 (top, left, right)
-# of frame $1, found by its place: the top dock is the highest, at the
-# client area's top; the side docks start below it, the left one at the
-# client area's left edge, which the top dock shares.
+# "visible left top right bottom" of the dock on side $2 (top, left, right,
+# bottom) of frame $1, found by its place: the top dock is the highest, at
+# the client area's top; the bottom dock the lowest of those as wide as the
+# top dock (both are full-screen wide); the side docks start below the top
+# dock, the left one at the client area's left edge, which the top dock
+# shares.
 dock_rect() {
     ctl docks "$1" | sort -n -k3 | awk -v side="$2" '
-        { v[NR] = $0; l[NR] = $2 }
+        { v[NR] = $0; l[NR] = $2; w[NR] = $4 - $2 }
         END {
             if (NR == 0) exit
             if (side == "top") { print v[1]; exit }
+            if (side == "bottom") { for (i = NR; i > 1; i--) if (w[i] == w[1]) { print v[i]; exit }; exit }
             for (i = 2; i <= NR; i++)
-                if ((side == "left") == (l[i] <= l[1] + 1)) { print v[i]; exit }
+                if (w[i] != w[1] && (side == "left") == (l[i] <= l[1] + 1)) { print v[i]; exit }
         }'
 }
 

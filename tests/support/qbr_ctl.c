@@ -6,6 +6,7 @@
      qbr_ctl foreground        print the title of the foreground window
      qbr_ctl childrect TITLE CHILD  the same for a child window of it, found by its title
      qbr_ctl status TITLE      print the line of the status bar of that window
+     qbr_ctl statusrect TITLE  the status bar's outer rectangle and 1 if visible
      qbr_ctl rect TITLE        print its outer rectangle (left top right bottom) and 1 if visible
      qbr_ctl toolbars TITLE    every toolbar window of that frame (panes and floating frames):
                                pane|frame visible left top right bottom title
@@ -146,6 +147,14 @@ int main(int argc, char **argv) {
         if (!bar) return 1;
         SendMessageA(bar, WM_GETTEXT, sizeof(text), (LPARAM)text);
         printf("%s\n", text);
+        return 0;
+    }
+    if (strcmp(argv[1], "statusrect") == 0) {
+        RECT r;
+        HWND bar = FindWindowExA(window, NULL, "StatusBar", NULL);
+        if (!bar) return 1;
+        GetWindowRect(bar, &r);
+        printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(bar) ? 1 : 0);
         return 0;
     }
     if (strcmp(argv[1], "rect") == 0) {

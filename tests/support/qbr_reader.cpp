@@ -62,6 +62,8 @@ std::string Role(IAccessible *object, LONG id) {
         return "check";
     case ROLE_SYSTEM_SEPARATOR:
         return "separator";
+    case ROLE_SYSTEM_BUTTONMENU:
+        return "buttonmenu";
     }
     return std::to_string(v.lVal);
 }
