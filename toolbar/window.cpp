@@ -1,6 +1,7 @@
 // The two windows of a toolbar: the pane in a dock and the floating frame.
 // Both exist for the toolbar's whole life; docking and floating only hide the
 // one and show the other, and every edit refits both.
+#include <algorithm>
 #include <initializer_list>
 
 #include "core/core.h"
@@ -223,12 +224,23 @@ void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
-    RECT outer, area;
+    RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
     if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
-    // Whatever the window spends outside its item area stays the same.
-    RECT size = {0, 0, Width(*rect) + Width(outer) - Width(area), Height(*rect) + Height(outer) - Height(area)};
+    // Whatever the window spends outside its item area stays the same: the
+    // margins inside the client area, and the borders outside it. A user can
+    // size a floating frame down to less than its own borders; its client
+    // area is then empty and tells nothing of them, so the borders are never
+    // taken smaller than the platform gives for the window's style.
+    GetClientRect(target, &client);
+    RECT borders = {0, 0, 0, 0};
+    AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
+                       static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
+    const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
+    const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
+    RECT size = {0, 0, Width(*rect) + outsideW + Width(client) - Width(area),
+                 Height(*rect) + outsideH + Height(client) - Height(area)};
     PlaceWindow(target, size, false, true);
 }
 
