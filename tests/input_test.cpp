@@ -372,6 +372,7 @@ TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
         // apart than that.
         PumpFor(GetDoubleClickTime() + 100);
         ASSERT_TRUE(released);
+        EXPECT_EQ(frame, GetActiveWindow()) << "the toolbar kept the activation";
         EXPECT_TRUE(smallSteps.empty()) << smallSteps.size() << " steps left a frame smaller than one button, first "
                                         << smallSteps.front();
 
