@@ -351,6 +351,18 @@ TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
         std::vector<RECT> smallSteps; // item areas narrower or lower than one button, seen between steps
         bool released = false;
         ModalSteps::Add([] { SendButton(MOUSEEVENTF_LEFTDOWN); });
+        // The platform's sizing loop holds the capture. Under Wine a press
+        // on a border soon after the last drag is now and then lost on the
+        // way (no window hears of it); it is then pressed again.
+        auto ticks = std::make_shared<int>(0);
+        ModalSteps::Until([floating, ticks] {
+            if (GetCapture() == floating) return true;
+            if (++*ticks % 30 == 0) {
+                SendButton(MOUSEEVENTF_LEFTUP);
+                SendButton(MOUSEEVENTF_LEFTDOWN);
+            }
+            return false;
+        });
         for (int i = 1; i <= c.steps; ++i) {
             MoveCursorStep(POINT{from.x + i * c.dx, from.y});
             ModalSteps::Add([&] {
