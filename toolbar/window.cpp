@@ -326,12 +326,14 @@ static HWND PlaceAbove(HWND host, HWND window) {
     return above;
 }
 
-// Whether every shown window above the host, topmost ones aside, is one of
-// its floating frames: then the host and its frames are the top of the
-// z-order, and nothing else can be passed over.
+// Whether every shown window above the host is one of its floating frames:
+// then the host and its frames are the top of the z-order, and nothing else
+// can be passed over. A topmost window counts as another window too, such
+// as the popup menu of a toolbar: under Wine a menu open while the windows
+// under it are sent to the top no longer gets the keys.
 static bool HostAndFramesOnTop(HWND host) {
     for (HWND window = GetTopWindow(nullptr); window && window != host; window = GetWindow(window, GW_HWNDNEXT))
-        if (IsWindowVisible(window) && !IsTopmost(window) && !IsShownFloatingFrameOf(window, host)) return false;
+        if (IsWindowVisible(window) && !IsShownFloatingFrameOf(window, host)) return false;
     return true;
 }
 
