@@ -83,18 +83,40 @@ static void PassActivationToHost(HWND window) {
 
 // The library moves and sizes its own windows all the time, and none of those
 // changes may come back as a refit: the WM_SIZE that DefWindowProc would make
-// of WM_WINDOWPOSCHANGED is let through only after the user pressed a border.
+// of WM_WINDOWPOSCHANGED is let through only while the user sizes a floating
+// frame by its border.
+//
+// With the contents shown while sizing, the window system resizes the frame
+// at every mouse move of the drag, from a rectangle of its own (the one the
+// drag began with, moved by the cursor's travel), and the loop ends inside
+// the DefWindowProc of the WM_NCLBUTTONDOWN that began it. Every one of those
+// steps is refitted, so the items follow the border, the frame is never left
+// smaller than one button, and the last step leaves exactly what one refit of
+// the width the user chose gives. The refit's own resize, nested inside a
+// step, stops here like any other change the library makes.
+static HWND sizingFrame = nullptr; // the frame whose border the user holds
+static bool refittingStep = false;
+
 static LRESULT OnWindowPosChanged(HWND window, WPARAM wParam, LPARAM lParam) {
     AccessWindowPosChanged(window, reinterpret_cast<const WINDOWPOS *>(lParam));
-    if (!borderSizing) return 0;
-    borderSizing = 0;
-    ActivateHostFrame(window);
-    return DefWindowProcA(window, WM_WINDOWPOSCHANGED, wParam, lParam);
+    if (!borderSizing || window != sizingFrame || refittingStep) return 0;
+    refittingStep = true;
+    LRESULT result = DefWindowProcA(window, WM_WINDOWPOSCHANGED, wParam, lParam);
+    refittingStep = false;
+    return result;
 }
 
 static LRESULT OnNcLeftDown(HWND window, WPARAM hitCode, LPARAM lParam) {
-    if (hitCode >= HTLEFT && hitCode <= HTBOTTOMRIGHT) borderSizing = 1;
-    return DefWindowProcA(window, WM_NCLBUTTONDOWN, hitCode, lParam);
+    if (hitCode < HTLEFT || hitCode > HTBOTTOMRIGHT) return DefWindowProcA(window, WM_NCLBUTTONDOWN, hitCode, lParam);
+    borderSizing = 1;
+    sizingFrame = window;
+    LRESULT result = DefWindowProcA(window, WM_NCLBUTTONDOWN, hitCode, lParam); // the sizing loop
+    borderSizing = 0;
+    sizingFrame = nullptr;
+    // The window system may activate the frame as it sizes it (Wine does, at
+    // every step); the toolbar window itself never keeps the activation.
+    PassActivationToHost(window);
+    return result;
 }
 
 static void OnDoubleClick(HWND window, LPARAM lParam) {

@@ -1,5 +1,6 @@
 // Toolbars in real windows: the flow walk's worked examples on real panes and
 // floating frames, item edits and their refits, the window pair, button text.
+#include <algorithm>
 #include <map>
 #include <vector>
 
@@ -826,6 +827,149 @@ TEST_F(ToolbarTest, DestroyedManagerLeavesNoWindowOnFreedRecords) {
     Pump();
     EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
     EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(floating, ROLE_FLOATING))) << "windows go with the frame";
+}
+
+// The windows given, topmost first, as the window system stacks them.
+std::vector<HWND> Stacking(const std::vector<HWND> &windows) {
+    std::vector<HWND> out;
+    for (HWND w = GetTopWindow(nullptr); w; w = GetWindow(w, GW_HWNDNEXT))
+        if (std::find(windows.begin(), windows.end(), w) != windows.end()) out.push_back(w);
+    return out;
+}
+
+// The centre of a toolbar's item on the screen, in the window on show.
+POINT ItemOnScreen(HWND pane, UINT index) {
+    RECT r = {};
+    GetItemRect(RecordOfWindow(pane), index, &r);
+    POINT p = {(r.left + r.right) / 2, (r.top + r.bottom) / 2};
+    ClientToScreen(ResolveRoleWindow(pane, ROLE_ACTIVE), &p);
+    return p;
+}
+
+// A click of the real left button at a screen point, pumped until the host
+// heard a command from it, and no longer: no settle timer has run yet.
+void RealClick(POINT p) {
+    PlaceCursor(p);
+    const int before = CountHeard(WM_COMMAND);
+    SendButton(MOUSEEVENTF_LEFTDOWN);
+    SendButton(MOUSEEVENTF_LEFTUP);
+    for (int round = 0; round < 200 && CountHeard(WM_COMMAND) == before; ++round) {
+        MsgWaitForMultipleObjects(0, nullptr, FALSE, 5, QS_ALLINPUT);
+        Pump();
+    }
+}
+
+// A click on a floating toolbar leaves the floating toolbars in their order
+// among themselves, at once and after the activation has settled, so the
+// next click at the same place lands on the same toolbar; also when another
+// window was active and above the host. Three frames overlap at the point
+// clicked; "A", on top there, is the first of the list, so a restack in list
+// order would bury it.
+TEST_F(ToolbarTest, AClickOnAFloatingToolbarKeepsTheirOrder) {
+    HWND a = Make({1, 2, 3}, TBF_VISIBLE | TBF_FLOATING, nullptr, 400, 300);
+    HWND b = Make({4, 5, 6}, TBF_VISIBLE | TBF_FLOATING, nullptr, 420, 310);
+    HWND c = Make({7, 8, 9}, TBF_VISIBLE | TBF_FLOATING, nullptr, 440, 320);
+    // "A" hidden and shown again: it is on top now, out of list order.
+    QBR_SetToolbarFlags(a, TBF_HIDDEN);
+    QBR_SetToolbarFlags(a, TBF_VISIBLE | TBF_FLOATING);
+    PumpFor(3 * kRestackPeriod);
+    const HWND fa = ResolveRoleWindow(a, ROLE_FLOATING), fb = ResolveRoleWindow(b, ROLE_FLOATING),
+               fc = ResolveRoleWindow(c, ROLE_FLOATING);
+    const std::vector<HWND> order = {fa, fc, fb, frame};
+    ASSERT_EQ(order, Stacking({fa, fb, fc, frame}));
+    const POINT onA = ItemOnScreen(a, 2); // button 3 of "A", over "B" and "C"
+    ASSERT_EQ(fa, WindowFromPoint(onA));
+    for (HWND covered : {fb, fc}) {
+        const RECT r = WindowRectInParent(covered);
+        ASSERT_TRUE(PtInRect(&r, onA)) << "the frames do not overlap as planned";
+    }
+
+    HWND other = nullptr;
+    for (bool otherActive : {false, true}) {
+        SCOPED_TRACE(otherActive ? "another window active and on top" : "the host active");
+        if (otherActive) {
+            other = CreateWindowExA(0, "QbrTestFrame", "Other", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 600, 500, 300, 200,
+                                    nullptr, nullptr, GetModuleHandleA(nullptr), nullptr);
+            PumpFor(3 * kRestackPeriod);
+        }
+        ASSERT_EQ(otherActive ? other : frame, GetActiveWindow());
+        ASSERT_EQ(order, Stacking({fa, fb, fc, frame}));
+        ClearFrameLog();
+        RealClick(onA);
+        // A host activated from another window is raised by Wine a moment
+        // later, on its own time and without a message (Windows brings the
+        // owned frames along); only the settled order can be asked for then.
+        if (!otherActive) EXPECT_EQ(order, Stacking({fa, fb, fc, frame})) << "right after the click";
+        PumpFor(3 * kRestackPeriod);
+        EXPECT_EQ(order, Stacking({fa, fb, fc, frame})) << "once the activation settled";
+        EXPECT_EQ(frame, GetActiveWindow());
+        RealClick(onA);
+        EXPECT_EQ(2, CountHeard(WM_COMMAND)) << Describe(FrameLog());
+        EXPECT_EQ(2, std::count(FrameLog().begin(), FrameLog().end(), Heard{WM_COMMAND, 3, 0})) << Describe(FrameLog());
+    }
+    DestroyWindow(other);
+    Pump();
+}
+
+// A host opens a modal dialog from a toolbar button (the demo's About box,
+// say): while it is open it stays above every floating toolbar, which stay
+// above the host; when it closes, they are above the host again.
+const char kDialogTitle[] = "Opened From A Toolbar";
+WNDPROC recordingFrameProc = nullptr;
+LRESULT CALLBACK DialogHostProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
+    LRESULT result = CallWindowProcA(recordingFrameProc, window, message, wParam, lParam);
+    if (message == WM_COMMAND && LOWORD(wParam) == 9) MessageBoxA(window, "Open.", kDialogTitle, MB_OK);
+    return result;
+}
+
+TEST_F(ToolbarTest, ADialogOpenedFromAToolbarStaysAboveTheFloatingToolbars) {
+    HWND docked = Make({8, 9});
+    HWND a = Make({1, 2, 9}, TBF_VISIBLE | TBF_FLOATING, nullptr, 200, 200);
+    HWND b = Make({4, 5, 6}, TBF_VISIBLE | TBF_FLOATING, nullptr, 260, 230);
+    const HWND fa = ResolveRoleWindow(a, ROLE_FLOATING), fb = ResolveRoleWindow(b, ROLE_FLOATING);
+    recordingFrameProc =
+        reinterpret_cast<WNDPROC>(SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(DialogHostProc)));
+    PumpFor(3 * kRestackPeriod);
+    const std::vector<HWND> floatingOrder = Stacking({fa, fb});
+    struct Case {
+        const char *name;
+        HWND toolbar;
+        UINT index; // of button 9
+    } const cases[] = {{"a docked toolbar", docked, 1}, {"a floating toolbar", a, 2}};
+    for (const Case &k : cases) {
+        SCOPED_TRACE(k.name);
+        HWND dialog = nullptr;
+        ClearFrameLog();
+        std::vector<HWND> atOnce, settled;
+        DWORD shown = 0;
+        ModalSteps::Until([&] {
+            dialog = FindWindowA(nullptr, kDialogTitle);
+            if (!dialog || !IsWindowVisible(dialog)) return false;
+            shown = GetTickCount();
+            atOnce = Stacking({dialog, fa, fb, frame});
+            return true;
+        });
+        ModalSteps::Until([&] { return GetTickCount() - shown >= 4 * kRestackPeriod; });
+        ModalSteps::Add([&] {
+            settled = Stacking({dialog, fa, fb, frame});
+            PostMessageA(dialog, WM_COMMAND, IDOK, 0);
+        });
+        PlaceCursor(ItemOnScreen(k.toolbar, k.index));
+        SendButton(MOUSEEVENTF_LEFTDOWN);
+        SendButton(MOUSEEVENTF_LEFTUP);
+        for (int round = 0; round < 400 && !(dialog && !IsWindow(dialog)); ++round)
+            PumpFor(5);
+        ModalSteps::Stop();
+        ASSERT_NE(nullptr, dialog) << "no dialog opened " << Describe(FrameLog());
+        const std::vector<HWND> expected = {dialog, floatingOrder[0], floatingOrder[1], frame};
+        EXPECT_EQ(expected, atOnce) << "as the dialog opened";
+        EXPECT_EQ(expected, settled) << "while it was open";
+        PumpFor(4 * kRestackPeriod);
+        EXPECT_EQ(frame, GetActiveWindow()) << "after it closed";
+        EXPECT_EQ(floatingOrder, Stacking({fa, fb})) << "after it closed";
+        EXPECT_TRUE(Above(fa, frame) && Above(fb, frame)) << "after it closed";
+    }
+    SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(recordingFrameProc));
 }
 
 } // namespace

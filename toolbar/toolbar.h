@@ -86,7 +86,8 @@ constexpr UINT_PTR kWaitForOwnerTimer = 0x5101;
 constexpr UINT_PTR kSettleTimer = 0x5102;
 constexpr UINT kRestackPeriod = 250;
 void OnRestackTimer(HWND frame, UINT_PTR timer);
-// Puts the manager's shown floating frames back above their owner.
+// Puts the manager's shown floating frames back above their owner, in their
+// order and over no other window, at once and once more when settled.
 void KeepFloatingFramesAbove(ToolbarManager *manager);
 // Watches the activation of the host frames of this thread, which may bury
 // their floating frames; one call for each manager made and destroyed.

@@ -1,6 +1,7 @@
 // The two windows of a toolbar: the pane in a dock and the floating frame.
 // Both exist for the toolbar's whole life; docking and floating only hide the
 // one and show the other, and every edit refits both.
+#include <algorithm>
 #include <initializer_list>
 
 #include "access/access.h"
@@ -231,12 +232,23 @@ void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
-    RECT outer, area;
+    RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
     if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
-    // Whatever the window spends outside its item area stays the same.
-    RECT size = {0, 0, Width(*rect) + Width(outer) - Width(area), Height(*rect) + Height(outer) - Height(area)};
+    // Whatever the window spends outside its item area stays the same: the
+    // margins inside the client area, and the borders outside it. A user can
+    // size a floating frame down to less than its own borders; its client
+    // area is then empty and tells nothing of them, so the borders are never
+    // taken smaller than the platform gives for the window's style.
+    GetClientRect(target, &client);
+    RECT borders = {0, 0, 0, 0};
+    AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
+                       static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
+    const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
+    const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
+    RECT size = {0, 0, Width(*rect) + outsideW + Width(client) - Width(area),
+                 Height(*rect) + outsideH + Height(client) - Height(area)};
     PlaceWindow(target, size, false, true);
 }
 
@@ -301,15 +313,79 @@ UINT RefitToolbar(HWND window, int role) { return Refit(window, role, nullptr, f
 
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item) { return Refit(window, role, item, true); }
 
-// Shows a toolbar window without activating it. A floating frame also goes
-// to the top: showing alone keeps its old place in the z-order, which may be
-// below its owner if it was last placed while the owner was hidden.
+// The shown floating frames of a host belong right above it: they are
+// owned by its frame. Windows keeps owned windows above their owner by
+// itself. Wine can raise a host over them without a message to anyone: as
+// its frame is first exposed, when it is activated, as a move loop starts
+// after a click on its caption. So the library puts them back, at once and
+// again once the activation has settled, always in their order among
+// themselves (a click never reorders the floating toolbars, so the next
+// click lands where the last did) and never over any window but their host,
+// such as a dialog the host opened from a toolbar button.
+static bool IsShownFloatingFrameOf(HWND window, HWND host) {
+    return GetWindow(window, GW_OWNER) == host && IsWindowVisible(window) && IsFloatingFrame(window);
+}
+
+static bool IsTopmost(HWND window) { return (GetWindowLongA(window, GWL_EXSTYLE) & WS_EX_TOPMOST) != 0; }
+
+// Where SetWindowPos puts `window` to stand right above `host`.
+static HWND PlaceAbove(HWND host, HWND window) {
+    HWND above = GetWindow(host, GW_HWNDPREV);
+    // Behind a topmost window a window would become topmost itself.
+    if (!above || (!IsTopmost(window) && IsTopmost(above))) return HWND_TOP;
+    return above;
+}
+
+// Whether every shown window above the host is one of its floating frames:
+// then the host and its frames are the top of the z-order, and nothing else
+// can be passed over. A topmost window counts as another window too, such
+// as the popup menu of a toolbar: under Wine a menu open while the windows
+// under it are sent to the top no longer gets the keys.
+static bool HostAndFramesOnTop(HWND host) {
+    for (HWND window = GetTopWindow(nullptr); window && window != host; window = GetWindow(window, GW_HWNDNEXT))
+        if (IsWindowVisible(window) && !IsShownFloatingFrameOf(window, host)) return false;
+    return true;
+}
+
+static void LiftFloatingFramesAboveHost(HWND host) {
+    if (!host || !IsWindow(host)) return;
+    if (HostAndFramesOnTop(host)) {
+        // Each frame to the top, from the bottom up, so in their order. The
+        // frames are placed again even where the window list has them right
+        // already: under Wine the X server's stacking can still have the
+        // host above them (after a dialog of the host closed, say), and it
+        // then sends the mouse to the host. Placing a window again at the
+        // place it has changes nothing, so it is sent to the top.
+        HWND first = GetTopWindow(nullptr);
+        for (HWND window = GetWindow(first, GW_HWNDLAST); window;) {
+            HWND previous = window == first ? nullptr : GetWindow(window, GW_HWNDPREV);
+            if (IsShownFloatingFrameOf(window, host))
+                SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+            window = previous;
+        }
+        return;
+    }
+    // Another window stands above the host, a dialog it opened, say: only
+    // the frames below the host move, top to bottom, each right above the
+    // host, so under those moved before it, as it was.
+    for (HWND window = GetWindow(host, GW_HWNDNEXT); window;) {
+        HWND next = GetWindow(window, GW_HWNDNEXT);
+        if (IsShownFloatingFrameOf(window, host))
+            SetWindowPos(window, PlaceAbove(host, window), 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+        window = next;
+    }
+}
+
+// Shows a toolbar window without activating it. A floating frame comes up
+// on top, where the user who floated or showed it looks: showing alone keeps
+// its old place in the z-order, which may be below its owner if it was last
+// placed while the owner was hidden.
 //
 // A host builds its toolbars while its frame is still hidden (in WM_CREATE).
 // When that frame shows, the window system may raise it later, on its own
 // time and without a message to anyone, over the floating frames shown
 // before it. So a frame shown under a hidden owner watches for the owner to
-// appear, lets it settle, and then takes its place above it again.
+// appear, lets it settle, and then the frames go back above it.
 static void ShowWithoutActivating(HWND window) {
     if (!IsFloatingFrame(window)) {
         ShowWindow(window, SW_SHOWNA);
@@ -320,17 +396,17 @@ static void ShowWithoutActivating(HWND window) {
     if (owner && !IsWindowVisible(owner)) SetTimer(window, kWaitForOwnerTimer, kRestackPeriod, nullptr);
 }
 
-// Activating the host frame from a click on a toolbar raises the frame; under
-// some window systems that happens again a moment later, without a message,
-// when it is exposed. The shown floating frames go back on top at once and
-// once more when that has settled.
+// At once, when `now`, and once the activation has settled. One walk serves
+// all frames of the host, so one timer does, on one of its shown frames.
 static void RestackFloatingFrames(ToolbarManager *manager, bool now) {
     if (!manager) return;
+    if (now) LiftFloatingFramesAboveHost(manager->frame);
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
         HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
-        if (!frame || !IsWindowVisible(frame)) continue;
-        if (now) SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
-        SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
+        if (frame && IsWindowVisible(frame)) {
+            SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
+            return;
+        }
     }
 }
 
@@ -344,7 +420,7 @@ void OnRestackTimer(HWND frame, UINT_PTR timer) {
         SetTimer(frame, IsWindowVisible(owner) ? kSettleTimer : kWaitForOwnerTimer, kRestackPeriod, nullptr);
         return;
     }
-    if (IsWindowVisible(frame)) SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE);
+    LiftFloatingFramesAboveHost(owner);
 }
 
 // A host frame activated by a click on its caption or border, while another

@@ -54,6 +54,32 @@ sleep 0.4
 line=$(ctl status 'Quaybar Demo')
 [ "$line" = "Welcome to the Quaybar Demo!" ] || fail "status line after the release: '$line'"
 
+# The About box, opened with the last button of "Standard", stays above the
+# floating toolbars while it is open, also once the activation has settled;
+# when it closes they are above the main window again.
+above() { # above ORDER FIRST SECOND: FIRST is listed before SECOND
+    local a b
+    a=$(grep -n -m1 "^$2" <<<"$1" | cut -d: -f1)
+    b=$(grep -n -m1 "^$3" <<<"$1" | cut -d: -f1)
+    [ -n "$a" ] && [ -n "$b" ] && [ "$a" -lt "$b" ]
+}
+read -r l t r b v <<<"$(ctl childrect 'Quaybar Demo' Standard)"
+xdotool mousemove $((r - 15)) $((t + 15)) click 1
+ctl wait "About QBR" 5000 || fail "the About button opened no About box"
+sleep 1.5
+order=$(ctl zorder)
+for title in Align Palette; do
+    above "$order" "About QBR owned by" "$title owned by" || fail "$title covers the About box: $order"
+done
+shot demo-about
+xdotool key Return
+sleep 1.5
+order=$(ctl zorder)
+! grep -q "^About QBR" <<<"$order" || fail "the About box did not close"
+for title in Align Palette; do
+    above "$order" "$title owned by" "Quaybar Demo$" || fail "$title is not above the main window after the About box: $order"
+done
+
 stop_demo "after the first start"
 
 grep -q '^\[Main Layout\]' "$ini" || fail "no [Main Layout] in $ini"
