@@ -159,26 +159,27 @@ class DockPackTest : public FrameTest {
     // Three toolbars of 10, 6 and 4 buttons: the first two share a row on any
     // screen, and the third is made one pixel wider than the row leaves, so
     // that it wraps on any screen too (a pane sized by program is not refitted).
-    void ThreeToolbars(HWND t[3]) {
-        t[0] = Toolbar(1, 10);
-        t[1] = Toolbar(11, 6);
-        t[2] = Toolbar(17, 4);
+    // In the top dock, or in `into`.
+    void ThreeToolbars(HWND t[3], HWND into = nullptr) {
+        t[0] = Toolbar(1, 10, TBF_VISIBLE | TBF_DOCKED, into);
+        t[1] = Toolbar(11, 6, TBF_VISIBLE | TBF_DOCKED, into);
+        t[2] = Toolbar(17, 4, TBF_VISIBLE | TBF_DOCKED, into);
         const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
         const int rowRight = W(WindowRectInParent(t[0])) - 1 + W(WindowRectInParent(t[1])) - 1;
         SetWindowPos(t[2], nullptr, 0, 0, limit - rowRight + 1, H(WindowRectInParent(t[2])),
                      SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
-        RelayoutDock(dock);
+        RelayoutDock(into ? into : dock);
         Pump();
     }
     void Float(UINT index, bool floating) {
         ToolbarRecord *r = ListAt<ToolbarRecord>(record->toolbars, index);
         r->flags = (r->flags & ~(TBF_DOCKED | TBF_FLOATING)) | (floating ? TBF_FLOATING : TBF_DOCKED);
     }
-    HWND Toolbar(UINT first, UINT count, UINT flags = TBF_VISIBLE | TBF_DOCKED) {
+    HWND Toolbar(UINT first, UINT count, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND into = nullptr) {
         std::vector<UINT> ids;
         for (UINT i = 0; i < count; ++i)
             ids.push_back(first + i);
-        HWND pane = QBR_CreateToolbar("T", flags, 100, 100, 0, 0, dock, ids.data(), count);
+        HWND pane = QBR_CreateToolbar("T", flags, 100, 100, 0, 0, into ? into : dock, ids.data(), count);
         EXPECT_NE(nullptr, pane);
         Pump();
         return pane;
@@ -496,18 +497,12 @@ TEST_F(DockPackTest, BottomDockPacksAsTheTopDockAndGrowsUpwards) {
     HWND left = MakeDock(DOCK_LEFT);
     const RECT usable = Rect(0, 0, ClientRectOf(frame).right, ClientRectOf(frame).bottom - 17);
     QBR_SetUsableArea(manager, &usable);
-    std::vector<HWND> u;
-    for (UINT first : {1u, 31u, 43u}) {
-        const UINT count = first == 1 ? 30 : first == 31 ? 12 : 8;
-        std::vector<UINT> ids;
-        for (UINT i = 0; i < count; ++i)
-            ids.push_back(first + i);
-        u.push_back(QBR_CreateToolbar("B", TBF_VISIBLE | TBF_DOCKED, 100, 100, 0, 0, bottom, ids.data(), count));
-        Pump();
-        const RECT d = WindowRectInParent(bottom);
-        EXPECT_EQ(usable.bottom, d.bottom) << "it stands on the usable edge";
-        EXPECT_EQ(d.top, WindowRectInParent(left).bottom) << "the left dock ends above it";
-    }
+    HWND b[3];
+    ThreeToolbars(b, bottom);
+    const std::vector<HWND> u(b, b + 3);
+    const RECT d = WindowRectInParent(bottom);
+    EXPECT_EQ(usable.bottom, d.bottom) << "it stands on the usable edge";
+    EXPECT_EQ(d.top, WindowRectInParent(left).bottom) << "the left dock ends above it";
     for (int i = 0; i < 3; ++i)
         EXPECT_EQ(WindowRectInParent(t[i]), WindowRectInParent(u[static_cast<size_t>(i)])) << "pane " << i;
     const int height = H(WindowRectInParent(dock));
