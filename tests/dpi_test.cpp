@@ -247,7 +247,8 @@ TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
 
 // At 96 DPI a frame never sees the strips drawn for larger scales.
 TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
-    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case";
+    // Only the run at 96 DPI can show this; the runs at 144 and 192 say so.
+    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case, shown by the run at 96 DPI";
     ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
     HWND frame = CreateRecordingFrame();
     ToolbarManager *m = QBR_CreateManager(frame);
@@ -430,7 +431,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
         EXPECT_EQ((std::vector<std::string>{"Top Dock", "Docked", "Floating"}), keys);
     } else {
         EXPECT_EQ((std::vector<std::string>{"Display Scale", "Top Dock", "Docked", "Floating"}), keys);
-        EXPECT_EQ(scale, table.back().second);
+        EXPECT_EQ(scale, table.front().second);
     }
     QBR_DestroyManager(a.manager);
     DestroyWindow(a.frame);
