@@ -21,21 +21,6 @@
 
 namespace {
 
-// ---- A host's message loop ----------------------------------------------------------
-
-void PumpHost(DWORD ms = 0) {
-    const DWORD end = GetTickCount() + ms;
-    for (;;) {
-        MSG msg;
-        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
-            if (QBR_TranslateToolbarKey(&msg)) continue;
-            TranslateMessage(&msg);
-            DispatchMessageA(&msg);
-        }
-        if (static_cast<LONG>(GetTickCount() - end) >= 0) break;
-        MsgWaitForMultipleObjects(0, nullptr, FALSE, 10, QS_ALLINPUT);
-    }
-}
 
 void SendKey(WORD vk, bool up) {
     INPUT in = {};

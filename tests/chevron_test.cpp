@@ -25,20 +25,6 @@ Heard Press(UINT id) { return {kPressMessage, id & 0xFFFF, 0}; }
 Heard Release(UINT id) { return {kReleaseMessage, (id & 0xFFFF) | 0xFFFF0000u, 0}; }
 Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
 
-// A host's loop: the toolbars see every message first.
-void PumpHost(DWORD ms = 0) {
-    const DWORD end = GetTickCount() + ms;
-    for (;;) {
-        MSG msg;
-        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
-            if (QBR_TranslateToolbarKey(&msg)) continue;
-            TranslateMessage(&msg);
-            DispatchMessageA(&msg);
-        }
-        if (static_cast<LONG>(GetTickCount() - end) >= 0) break;
-        MsgWaitForMultipleObjects(0, nullptr, FALSE, 10, QS_ALLINPUT);
-    }
-}
 
 void Key(WORD vk) {
     for (DWORD flags : {DWORD{0}, DWORD{KEYEVENTF_KEYUP}}) {

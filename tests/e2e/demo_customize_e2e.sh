@@ -9,20 +9,6 @@
 set -u
 . "$(dirname "$0")/lib.sh" "$1"
 rm -f "$ini"
-# A failure may leave a dialog open, whose modal loop would not let the main
-# window close: the dialogs go first.
-fail() {
-    echo "FAIL: $*"
-    if [ -n "$demo_pid" ]; then
-        ctl close "New Toolbar"
-        ctl close "Insert Toolbar Item"
-        sleep 0.5
-        ctl close "$main"
-        sleep 1
-        kill "$demo_pid" 2>/dev/null
-    fi
-    exit 1
-}
 
 # Button geometry of the library's default metrics: a button is 24 by 22,
 # neighbours share one column, and a pane's items start 6 pixels in and 3

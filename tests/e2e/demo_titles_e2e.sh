@@ -9,20 +9,6 @@
 set -u
 . "$(dirname "$0")/lib.sh" "$1"
 titles=('   ' 'a=b' ';semi' '[brack' ' both ' 'standard' 'x,y')
-# A failure may leave a dialog open, whose modal loop would keep the main
-# window from closing: the dialogs go first.
-fail() {
-    echo "FAIL: $*"
-    if [ -n "$demo_pid" ]; then
-        ctl close "New Toolbar"
-        ctl close "Insert Toolbar Item"
-        sleep 0.5
-        ctl close "$main"
-        sleep 1
-        kill "$demo_pid" 2>/dev/null
-    fi
-    exit 1
-}
 click_child() { # WINDOW CHILD-TEXT
     local l t r b v
     read -r l t r b v <<<"$(ctl childrect "$1" "$2")"

@@ -17,9 +17,18 @@ main="Quaybar Demo"
 demo_pid=""
 
 ctl() { wine "$build/bin/qbr_ctl.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; return "${PIPESTATUS[0]}"; }
+# A failure may leave a dialog open, whose modal loop would keep the main
+# window from closing: the dialogs go first.
 fail() {
     echo "FAIL: $*"
-    [ -n "$demo_pid" ] && { ctl close "$main"; sleep 1; kill "$demo_pid" 2>/dev/null; }
+    if [ -n "$demo_pid" ]; then
+        ctl close "New Toolbar"
+        ctl close "Insert Toolbar Item"
+        sleep 0.5
+        ctl close "$main"
+        sleep 1
+        kill "$demo_pid" 2>/dev/null
+    fi
     exit 1
 }
 shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1.png"; }

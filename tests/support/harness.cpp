@@ -25,6 +25,20 @@ void PumpFor(DWORD ms) {
     Pump();
 }
 
+void PumpHost(DWORD ms) {
+    const DWORD end = GetTickCount() + ms;
+    for (;;) {
+        MSG msg;
+        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            if (QBR_TranslateToolbarKey(&msg)) continue;
+            TranslateMessage(&msg);
+            DispatchMessageA(&msg);
+        }
+        if (static_cast<LONG>(GetTickCount() - end) >= 0) break;
+        MsgWaitForMultipleObjects(0, nullptr, FALSE, 10, QS_ALLINPUT);
+    }
+}
+
 static std::vector<Heard> frameLog;
 std::vector<Heard> &FrameLog() { return frameLog; }
 void ClearFrameLog() { frameLog.clear(); }

@@ -13,6 +13,9 @@
 void Pump();
 // Pumps for at least `ms` milliseconds (lets timers fire).
 void PumpFor(DWORD ms);
+// Pumps as a host's message loop does, for at least `ms` milliseconds: the
+// toolbars see every message first (QBR_TranslateToolbarKey).
+void PumpHost(DWORD ms = 0);
 
 // A message the recording frame received.
 struct Heard {
