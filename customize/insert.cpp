@@ -67,8 +67,9 @@ void OnMeasureItem(MEASUREITEMSTRUCT *measure) {
     if (measure->CtlID != kItemList) return;
     int width, height;
     if (!ItemGetSizeAt(reinterpret_cast<ToolbarItem *>(measure->itemData), ManagerDpi(insertManager), &width, &height)) return;
-    measure->itemHeight = static_cast<UINT>(height + 2 * kLineMargin);
-    measure->itemWidth = static_cast<UINT>(width + 2 * kLineMargin);
+    const int margin = ScaleToDpi(kLineMargin, ManagerDpi(insertManager));
+    measure->itemHeight = static_cast<UINT>(height + 2 * margin);
+    measure->itemWidth = static_cast<UINT>(width + 2 * margin);
 }
 
 // The whole line is filled at every call, whatever itemAction asks, and the
@@ -97,7 +98,7 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
     if (kind == ITEM_BUTTON) {
         RECT button;
         button.left = (line.right - width + line.left) >> 1; // centred across the line
-        button.top = line.top + kLineMargin;
+        button.top = line.top + ScaleToDpi(kLineMargin, ManagerDpi(insertManager));
         button.right = button.left + width;
         button.bottom = button.top + height;
         if (!BeginButtonPaint(insertManager, dc)) return;

@@ -58,14 +58,15 @@ UINT ChevronRect(const ToolbarRecord *record, RECT *rect) {
     RECT client;
     GetClientRect(pane, &client);
     RECT chevron = client;
+    const int size = ScaleToDpi(kChevronSize, ManagerDpi(manager));
     if (across) {
         if (edge.x >= client.right || edge.x <= 0) return 0; // wholly in, or nothing of it shows
         chevron.right = edge.x;
-        chevron.left = edge.x > kChevronSize ? edge.x - kChevronSize : 0;
+        chevron.left = edge.x > size ? edge.x - size : 0;
     } else {
         if (edge.y >= client.bottom || edge.y <= 0) return 0;
         chevron.bottom = edge.y;
-        chevron.top = edge.y > kChevronSize ? edge.y - kChevronSize : 0;
+        chevron.top = edge.y > size ? edge.y - size : 0;
     }
     // Only an item cut off makes a chevron, not a margin alone.
     bool cut = false;
@@ -112,17 +113,21 @@ void PaintChevron(HWND window, HDC dc) {
     UINT side = DOCK_TOP;
     GetDockSide(GetParent(window), &side);
     const bool across = IsAcrossDock(side);
+    // At a larger display scale every pixel of it is a square of a whole
+    // number of pixels, so that it stays as sharp as the images.
     const int cx = (rect.left + rect.right) / 2, cy = (rect.top + rect.bottom) / 2;
+    const int whole = static_cast<int>(ManagerDpi(ManagerOfToolbar(window)) / 96);
+    const int px = whole > 1 ? whole : 1;
     const COLORREF ink = GetSysColor(COLOR_BTNTEXT);
     for (int head = 0; head < 2; ++head)
         for (int i = 0; i < 4; ++i) {
-            const int along = -4 + 4 * head + i; // towards the cut
+            const int along = (-4 + 4 * head + i) * px; // towards the cut
             if (across) {
-                FillSolidBox(dc, cx + along, cy - 3 + i, 2, 1, ink);
-                FillSolidBox(dc, cx + along, cy + 3 - i, 2, 1, ink);
+                FillSolidBox(dc, cx + along, cy + (-3 + i) * px, 2 * px, px, ink);
+                FillSolidBox(dc, cx + along, cy + (3 - i) * px, 2 * px, px, ink);
             } else {
-                FillSolidBox(dc, cx - 3 + i, cy + along, 1, 2, ink);
-                FillSolidBox(dc, cx + 3 - i, cy + along, 1, 2, ink);
+                FillSolidBox(dc, cx + (-3 + i) * px, cy + along, px, 2 * px, ink);
+                FillSolidBox(dc, cx + (3 - i) * px, cy + along, px, 2 * px, ink);
             }
         }
     UINT focused = 0;

@@ -60,12 +60,13 @@ static void NudgeSeparator(ToolbarManager *manager, ToolbarRecord *target, UINT 
     // dragFrame began as the item's rectangle and has moved with the cursor;
     // only the sideways part of the way counts.
     const int shift = mouseTrack.dragFrame.left - rect.left;
-    if (shift > kNudgeDeadZone) {
+    const int deadZone = ScaleToDpi(kNudgeDeadZone, ManagerDpi(manager));
+    if (shift > deadZone) {
         if (afterIsSeparator)
             RemoveItemAfter(target, item);
         else if (before && !beforeIsSeparator)
             InsertItemBefore(target, item, separator);
-    } else if (shift < -kNudgeDeadZone) {
+    } else if (shift < -deadZone) {
         if (beforeIsSeparator)
             RemoveItemBefore(target, item);
         else if (after && !afterIsSeparator)

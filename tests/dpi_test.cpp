@@ -32,6 +32,7 @@ TEST(DisplayScale, ThePrefixGivesTheScaleThisRunWasStartedFor) { EXPECT_EQ(Expec
 // ---- Sizes at the frame's scale -------------------------------------------------
 
 #include "core/core.h"
+#include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -123,6 +124,31 @@ TEST_F(ScaleTest, ItemRectanglesAndPaneSizeAtTheFramesScale) {
     RECT outer = WindowRectInParent(pane);
     EXPECT_EQ(three + bw + s.areaLeft + 2 * border, outer.right - outer.left);
     EXPECT_EQ(t + bh + s.paneBottom + 2 * GetSystemMetrics(SM_CYBORDER), outer.bottom - outer.top);
+}
+
+// The chevron of a toolbar cut off at the usable area's edge is 13 pixels
+// wide at 96 DPI and grows with the frame's scale; its » is drawn in squares
+// of a whole number of pixels (1 at 96 and 144, 2 at 192), so it stays sharp.
+TEST_F(ScaleTest, TheChevronGrowsWithTheFramesScale) {
+    const Scaled &s = Here();
+    HWND pane = Make({1, 2, 3, 4, 5, 6}, TBF_VISIBLE | TBF_DOCKED);
+    Pump();
+    RECT outer = WindowRectInParent(pane);
+    const RECT usable = Rect(0, 0, outer.left + (outer.right - outer.left) / 2, ClientRectOf(frame).bottom);
+    ASSERT_EQ(1u, QBR_SetUsableArea(manager, &usable));
+    Pump();
+    RECT chevron;
+    ASSERT_EQ(1u, ChevronRect(RecordOfWindow(pane), &chevron));
+    EXPECT_EQ(MulDiv(13, s.dpi, 96), chevron.right - chevron.left);
+    // The ink of the » fills whole squares: count its pixels in the pane.
+    const Pixels p = ReadWindowPixels(pane);
+    const COLORREF ink = GetSysColor(COLOR_BTNTEXT);
+    int inked = 0;
+    for (int y = chevron.top; y < chevron.bottom; ++y)
+        for (int x = chevron.left; x < chevron.right; ++x)
+            if (p.At(x, y) == ink) ++inked;
+    const int square = s.dpi / 96 > 1 ? s.dpi / 96 : 1;
+    EXPECT_EQ(28 * square * square, inked) << "two heads of 7 rows of 2 pixels";
 }
 
 // The floating frame: its caption band (the caption font's, at the screen's
