@@ -173,6 +173,37 @@ TEST_F(ToolbarTest, NaturalSizesColumnsAndEmptyToolbars) {
     EXPECT_EQ(0, area.bottom);
 }
 
+// A user can size a floating frame to less than its own borders, so that its
+// client area is empty and tells nothing of them: the refit still gives the
+// frame its borders as its style has them, in both directions.
+TEST_F(ToolbarTest, ARefitOfAFrameSizedBelowItsBordersKeepsTheBordersOfItsStyle) {
+    HWND pane = Make({1, 2, 3, 4}, TBF_VISIBLE | TBF_FLOATING);
+    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+    const RECT natural = WindowRectInParent(floating);
+    const int width = natural.right - natural.left, height = natural.bottom - natural.top;
+    for (SIZE collapsed : {SIZE{width, 2}, SIZE{2, height}}) {
+        SetWindowPos(floating, nullptr, 0, 0, collapsed.cx, collapsed.cy, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+        RECT client;
+        GetClientRect(floating, &client);
+        ASSERT_TRUE(client.right <= 0 || client.bottom <= 0) << "the client area collapsed";
+        RefitToolbar(pane, ROLE_FLOATING);
+        Pump();
+        const RECT after = WindowRectInParent(floating);
+        if (collapsed.cx == width) {
+            EXPECT_EQ(natural, after) << "sized below its borders in height";
+        } else {
+            // One button to a row, whatever it was before; never narrower than
+            // its borders and one button.
+            RECT borders = {0, 0, 0, 0};
+            AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(floating, GWL_STYLE)), FALSE,
+                               static_cast<DWORD>(GetWindowLongA(floating, GWL_EXSTYLE)));
+            int bw = 0;
+            GetButtonSizes(&bw, nullptr, nullptr, nullptr);
+            EXPECT_GE(after.right - after.left, bw + (borders.right - borders.left)) << "sized below its borders in width";
+        }
+    }
+}
+
 TEST_F(ToolbarTest, FourGroupsOfThreeKeepTheirRowsOnAFrame) {
     HWND pane = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, TBF_VISIBLE | TBF_FLOATING);
     ToolbarRecord *record = RecordOfWindow(pane);
