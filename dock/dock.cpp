@@ -41,7 +41,9 @@ static UINT RegisterDockClass(HINSTANCE instance) {
 // ---- Public functions -----------------------------------------------------------
 
 extern "C" HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side) {
-    if (!manager || !frame) return nullptr;
+    // A side outside the four would make a dock that no packing, keyboard
+    // walk or stored arrangement knows.
+    if (!manager || !frame || side > DOCK_BOTTOM) return nullptr;
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
     if (!RegisterDockClass(instance)) return nullptr;
     // Not WS_VISIBLE: PlaceDock alone decides whether a dock shows.
