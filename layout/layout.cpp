@@ -129,8 +129,24 @@ static void FreeEntries(LPSTR *keys, LPSTR *values, UINT count) {
     MemoryBlockFree(values);
 }
 
+static bool HasTitle(const ToolbarRecord *toolbar) {
+    HWND frame = ResolveRoleWindow(toolbar->paneWindow, ROLE_FLOATING);
+    return frame && GetWindowTextLengthA(frame) > 0;
+}
+
+// The dock's toolbars that are stored: an empty title at the end of the
+// dock's value is read as the value's end and never comes back, so such
+// toolbars are left out, and a table applied and captured again is the table
+// it was.
+static UINT StoredToolbarCount(const DockArea *dock) {
+    UINT n = PointerListCount(dock->toolbars);
+    while (n > 0 && !HasTitle(ListAt<ToolbarRecord>(dock->toolbars, n - 1)))
+        --n;
+    return n;
+}
+
 UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count) {
-    UINT n = PointerListCount(dock->toolbars) + 1;
+    UINT n = StoredToolbarCount(dock) + 1;
     *keys = *values = nullptr;
     *count = 0;
     if (!GrowArray(keys, n) || !GrowArray(values, n)) {
@@ -172,7 +188,7 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
         DockArea *dock = ListAt<DockArea>(manager->docks, d);
         // An empty bottom dock writes no line, so that a host that merely
         // offers one stores the same arrangement as a host without it.
-        if (dock->side == DOCK_BOTTOM && !PointerListCount(dock->toolbars)) continue;
+        if (dock->side == DOCK_BOTTOM && !StoredToolbarCount(dock)) continue;
         LPSTR *keys, *values;
         UINT n;
         if (!CaptureDockLayout(dock, &keys, &values, &n)) {
