@@ -114,6 +114,8 @@ UINT ButtonIsEnabled(const ButtonData *data);
 UINT ButtonSetEnabled(ButtonData *data, UINT enabled);
 UINT ButtonIsPressed(const ButtonData *data);
 UINT ButtonSetPressed(ButtonData *data, UINT pressed);
+// Whether QBR_SetRadioRange made the button one of a radio group.
+UINT ButtonIsRadio(const ButtonData *data);
 
 void RepaintItem(ToolbarManager *manager, ToolbarItem *item);
 int RequestHelpText(UINT id, UINT kind, LPSTR buffer, int size);

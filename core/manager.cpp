@@ -312,6 +312,11 @@ UINT ButtonSetPressed(ButtonData *data, UINT pressed) {
     return 1;
 }
 
+// A state bit beside the public BS_ bits: the button belongs to a radio group.
+constexpr UINT kRadioMember = 16;
+
+UINT ButtonIsRadio(const ButtonData *data) { return data && (data->state & kRadioMember) ? 1 : 0; }
+
 // ---- Button setters ---------------------------------------------------------------
 
 // The button of `id`, or null for an id outside the catalog and for a separator.
@@ -392,6 +397,9 @@ extern "C" UINT QBR_IsButtonPressed(ToolbarManager *manager, UINT id) {
 extern "C" UINT QBR_SetRadioRange(ToolbarManager *manager, UINT first, UINT last, UINT onId) {
     if (last < first) return 1;
     for (UINT id = first;; ++id) {
+        // Screen readers find the group's buttons as radio buttons.
+        if (ToolbarItem *item = FindButton(manager, id))
+            static_cast<ButtonData *>(ItemGetData(item))->state |= kRadioMember;
         if (!QBR_SetButtonState(manager, id, id == onId ? 1 : 0)) return 0;
         if (id == last) break; // also ends a range whose last id is the largest u32
     }

@@ -1,6 +1,7 @@
 // The Insert Toolbar Item dialog: a category box, a list that shows the
 // catalog's buttons as pictures, and a description. The user drags a picture
 // out of the list and drops it on any toolbar of the frame.
+#include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
 #include "customize/customize.h"
@@ -198,7 +199,9 @@ void OnListRelease() {
     UINT index = 0;
     if (!InsertionIndexAtPoint(record, p.x, p.y, &index)) return;
     if (record->flags & TBF_LOCKED_ITEMS) return;
-    InsertItemAt(record, index, insertDragItem);
+    UINT placed = 0;
+    if (InsertItemAt(record, index, insertDragItem) && IndexOfItem(record, insertDragItem, &placed))
+        AccessItemsEdited(record, EVENT_OBJECT_CREATE, placed);
 }
 
 } // namespace

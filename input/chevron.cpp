@@ -133,7 +133,7 @@ void PaintChevron(HWND window, HDC dc) {
     UINT focused = 0;
     if (AccessFocusedIndex(window, &focused) && focused == PointerListCount(record->items)) {
         InflateRect(&edge, -2, -2);
-        DrawFocusRect(dc, &edge);
+        DrawFocusFrame(dc, &edge, ManagerDpi(ManagerOfToolbar(window)));
     }
 }
 

@@ -289,7 +289,68 @@ void PaintFocusRect(const RECT *rect) {
     // colours the platform's own controls draw them with.
     const COLORREF oldText = SetTextColor(targetDC, RGB(0, 0, 0));
     const COLORREF oldBack = SetBkColor(targetDC, RGB(255, 255, 255));
-    DrawFocusRect(targetDC, &focus);
+    DrawFocusFrame(targetDC, &focus, passDpi);
     SetTextColor(targetDC, oldText);
     SetBkColor(targetDC, oldBack);
+}
+
+namespace {
+
+using SystemMetricsForDpiProc = int(WINAPI *)(int, UINT);
+
+// GetSystemMetricsForDpi came with Windows 10 version 1607; it is looked up
+// by name, once, as GetDpiForWindow is.
+SystemMetricsForDpiProc SystemMetricsForDpiCall() {
+    static bool looked = false;
+    static SystemMetricsForDpiProc call = nullptr;
+    if (!looked) {
+        looked = true;
+        if (HMODULE user = GetModuleHandleA("user32.dll")) {
+            auto found = reinterpret_cast<void (*)()>(GetProcAddress(user, "GetSystemMetricsForDpi"));
+            call = reinterpret_cast<SystemMetricsForDpiProc>(found);
+        }
+    }
+    return call;
+}
+
+// The focus border's width in one direction at `dpi`: the user's setting, as
+// at 100 %, scaled. Older systems have one scale for every window and give
+// the metric at it. (Wine answers 1 at every scale, from both calls: scaled
+// here, the line grows with the frame as on Windows.)
+int FocusBorderAt(int metric, UINT dpi) {
+    if (SystemMetricsForDpiProc call = SystemMetricsForDpiCall()) {
+        const int width = ScaleToDpi(call(metric, kBaseDpi), dpi);
+        return width > 0 ? width : 1;
+    }
+    const int width = GetSystemMetrics(metric);
+    return width > 0 ? width : 1;
+}
+
+} // namespace
+
+void DrawFocusFrame(HDC dc, const RECT *rect, UINT dpi) {
+    if (!dc || !rect) return;
+    const int cx = FocusBorderAt(SM_CXFOCUSBORDER, dpi), cy = FocusBorderAt(SM_CYFOCUSBORDER, dpi);
+    if (cx == 1 && cy == 1) {
+        DrawFocusRect(dc, rect);
+        return;
+    }
+    // Wider lines: the same dots, every other pixel of the band inverted by a
+    // checked pattern in the context's text and background colours.
+    static const WORD kChecks[8] = {0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55};
+    HBITMAP pattern = GdiTrack(CreateBitmap(8, 8, 1, 1, kChecks));
+    HBRUSH brush = pattern ? GdiTrack(CreatePatternBrush(pattern)) : nullptr;
+    if (brush) {
+        const int w = rect->right - rect->left, h = rect->bottom - rect->top;
+        const int sideX = cx < w / 2 ? cx : w / 2, sideY = cy < h / 2 ? cy : h / 2;
+        SelectScope select(dc, brush);
+        if (select.Selected()) {
+            PatBlt(dc, rect->left, rect->top, w, sideY, PATINVERT);
+            PatBlt(dc, rect->left, rect->bottom - sideY, w, sideY, PATINVERT);
+            PatBlt(dc, rect->left, rect->top + sideY, sideX, h - 2 * sideY, PATINVERT);
+            PatBlt(dc, rect->right - sideX, rect->top + sideY, sideX, h - 2 * sideY, PATINVERT);
+        }
+    }
+    GdiDelete(brush);
+    GdiDelete(pattern);
 }

@@ -38,6 +38,9 @@ void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color);
 // The keyboard's focus on the button just painted at `rect`: a dotted
 // rectangle inside its face.
 void PaintFocusRect(const RECT *rect);
+// A dotted focus rectangle on `rect`, its lines as wide as the platform's
+// focus border (SM_CXFOCUSBORDER, SM_CYFOCUSBORDER) at the display scale `dpi`.
+void DrawFocusFrame(HDC dc, const RECT *rect, UINT dpi);
 
 // ---- Surface and caption -----------------------------------------------------
 extern HFONT captionFont;

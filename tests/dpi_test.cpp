@@ -4,6 +4,7 @@
 // QBR_EXPECT_DPI telling it which scale it was started for.
 #include <cstdlib>
 
+#include "access/access.h"
 #include "harness.h"
 #include "quaybar.h"
 
@@ -540,4 +541,46 @@ TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
     EXPECT_EQ(expected, column);
     // The first button's frame ring starts right below the margin.
     EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
+}
+
+// ---- The keyboard's focus at the frame's scale --------------------------------------------
+
+// The focus rectangle's lines are the platform's focus border (1 pixel here)
+// at the frame's scale: 1 at 96, 2 at 144 and 192.
+TEST_F(ScaleTest, TheFocusRectangleLinesGrowWithTheFramesScale) {
+    const Scaled &s = Here();
+    const int width = s.dpi == 96 ? 1 : 2;
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_DOCKED);
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    PumpHost(50);
+    RECT item = {};
+    GetItemRect(RecordOfWindow(pane), 0, &item);
+    const Pixels before = ReadWindowPixels(pane);
+    for (DWORD flags : {DWORD{0}, DWORD{KEYEVENTF_KEYUP}}) {
+        INPUT in = {};
+        in.type = INPUT_KEYBOARD;
+        in.ki.wVk = VK_F6;
+        in.ki.dwFlags = flags;
+        SendInput(1, &in, sizeof in);
+        PumpHost(30);
+    }
+    UINT index = 9;
+    ASSERT_EQ(1u, AccessFocusedIndex(pane, &index)) << "F6 brought the keyboard";
+    const Pixels focused = ReadWindowPixels(pane);
+    // Rows from the top of the focus rectangle down, across its middle half:
+    // the line's rows have dots, the row below it none.
+    const int top = item.top + MulDiv(3, s.dpi, 96), left = (3 * item.left + item.right) / 4,
+              right = (item.left + 3 * item.right) / 4;
+    std::vector<int> dotted, expected;
+    for (int y = top; y <= top + width; ++y) {
+        int changed = 0;
+        for (int x = left; x < right; ++x)
+            changed += focused.At(x, y) != before.At(x, y);
+        dotted.push_back(changed > 0);
+        expected.push_back(y < top + width);
+    }
+    EXPECT_EQ(expected, dotted);
+    AccessLeaveKeyboard();
 }
