@@ -154,6 +154,11 @@ LRESULT CALLBACK StatusBarProc(HWND window, UINT message, WPARAM wParam, LPARAM 
         return OnDestroy(window);
     case WM_PAINT:
         return OnPaint(window);
+    case WM_SIZE:
+        // The panel's right and bottom edges follow the size: a new size is
+        // painted whole, or the old edges would stay where they were drawn.
+        InvalidateRect(window, nullptr, TRUE);
+        return 0;
     case WM_GETTEXT:
         return OnGetText(window, wParam, lParam);
     case WM_GETTEXTLENGTH:
