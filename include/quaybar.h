@@ -182,6 +182,11 @@ void QBR_GetLiveCounts(LONG *memoryBlocks, LONG *gdiObjects);
 void QBR_FreeLayout(void);
 UINT QBR_BeginLayout(void);
 UINT QBR_AddLayoutEntry(LPCSTR key, LPCSTR value);
+/* Builds the arrangement in the table on `frame`: one new dock (QBR_CreateDock)
+   for every dock key the table holds, and that dock's toolbars. Apply it to a
+   frame without docks, instead of making them, and then make only the docks
+   it did not make (QBR_GetDock gives 0 for those); a dock made before would
+   stand beside the new one on its side. The table is used up: free it after. */
 UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame);
 
 #ifdef __cplusplus
