@@ -541,3 +541,86 @@ TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
     // The first button's frame ring starts right below the margin.
     EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
 }
+
+// ---- Rows, places and the screen across scales -------------------------------------
+
+namespace {
+
+// A floating toolbar's stored value, its frame sized for `across` buttons at
+// `dpi` and standing at (x, y): "n,ids...,flags,left,top,right,bottom".
+std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int x, int y, UINT flags = 33) {
+    const Scaled &s = At(dpi);
+    RECT borders = {0, 0, 0, 0}; // the frame's border as a system at that scale gives it
+    AdjustWindowRectExForDpi(&borders, WS_POPUP | WS_BORDER | WS_THICKFRAME, FALSE, 0, static_cast<UINT>(dpi));
+    std::string value = std::to_string(ids.size());
+    for (UINT id : ids)
+        value += "," + std::to_string(id);
+    const int width = 2 * s.areaLeft + across * (s.buttonWidth - 1) + 1 + borders.right - borders.left;
+    value += "," + std::to_string(flags) + "," + std::to_string(x) + "," + std::to_string(y) + "," +
+             std::to_string(x + width) + "," + std::to_string(y + 100);
+    return value;
+}
+
+// Applies a table in a new frame at `dpi` and gives the frame.
+DpiFrame ApplyAt(int dpi, const std::vector<std::pair<std::string, std::string>> &table) {
+    DpiFrame made = MakeDpiFrame();
+    if (dpi != ScreenDpi()) QBR_DpiChanged(made.frame, MAKEWPARAM(dpi, dpi), 0);
+    QBR_BeginLayout();
+    for (auto &entry : table)
+        QBR_AddLayoutEntry(entry.first.c_str(), entry.second.c_str());
+    QBR_ApplyLayout(made.manager, made.frame);
+    QBR_FreeLayout();
+    Pump();
+    return made;
+}
+
+} // namespace
+
+// One row of four and three rows of three with separators between the groups
+// keep their rows when a table written at one scale is read at another, and
+// when the frame then moves to another scale; each frame is as large as its
+// rows at the scale it ends at, and so the table written back holds them too.
+TEST_F(ClientTest, RowsOfFloatingToolbarsSurviveEveryChangeOfScale) {
+    const int here = Here().dpi, other = here == 96 ? 144 : here;
+    struct Case {
+        const char *name;
+        int written, read, after; // after: a live change of the reading frame; 0 none
+    };
+    const Case cases[] = {
+        {"written at 96, read at a larger scale", 96, other, 0},
+        {"written at a larger scale, read at 96", other, 96, 0},
+        {"read at 96, frame moved to a larger scale", 96, 96, other},
+        {"read at a larger scale, frame moved to 96", other, other, 96},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        std::vector<std::pair<std::string, std::string>> table;
+        if (c.written != 96)
+            table.emplace_back("Display Scale", std::to_string(c.written) + "," +
+                                                    std::to_string(GetSystemMetrics(SM_CXSCREEN)) + "," +
+                                                    std::to_string(GetSystemMetrics(SM_CYSCREEN)));
+        table.emplace_back("Top Dock", "Row,Grid");
+        table.emplace_back("Row", FloatingValue({1, 2, 3, 4}, 4, c.written, 300, 100));
+        table.emplace_back("Grid", FloatingValue({1, 2, 3, 0, 4, 5, 6, 0, 7, 8, 9}, 3, c.written, 300, 300));
+        DpiFrame made = ApplyAt(c.read, table);
+        if (c.after) QBR_DpiChanged(made.frame, MAKEWPARAM(c.after, c.after), 0);
+        Pump();
+        const Scaled &s = At(c.after ? c.after : c.read);
+        struct Expected {
+            std::vector<UINT> breaks;
+            int across, rows;
+        };
+        const Expected expected[] = {{{}, 4, 1}, {{4, 7}, 3, 3}};
+        for (UINT i = 0; i < 2; ++i) {
+            HWND pane = QBR_GetToolbar(made.manager, i);
+            EXPECT_EQ(expected[i].breaks, BreakIds(RecordOfWindow(pane)->floatingBreaks)) << "toolbar " << i;
+            EXPECT_EQ(Rect(0, 0, 2 * s.areaLeft + expected[i].across * (s.buttonWidth - 1) + 1,
+                           captionHeight + s.frameTop + expected[i].rows * s.buttonHeight + s.frameBottom),
+                      ClientRectOf(ResolveRoleWindow(pane, ROLE_FLOATING)))
+                << "toolbar " << i;
+        }
+        QBR_DestroyManager(made.manager);
+        DestroyWindow(made.frame);
+        Pump();
+    }
+}
