@@ -365,5 +365,8 @@ extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     UINT ok = ApplyLayoutRecords(manager, frame, layoutKeys, layoutValues, layoutCount);
     RescaleManagerToolbars(manager, dpi);
     PlaceFloatingInProportion(manager, written);
+    // A table may name places on a monitor that is gone.
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        KeepFloatingFrameOnScreen(ResolveRoleWindow(record->paneWindow, ROLE_FLOATING));
     return ok;
 }

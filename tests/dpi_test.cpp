@@ -624,3 +624,63 @@ TEST_F(ClientTest, RowsOfFloatingToolbarsSurviveEveryChangeOfScale) {
         Pump();
     }
 }
+
+namespace {
+
+RECT WorkArea() {
+    RECT work;
+    SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0);
+    return work;
+}
+
+} // namespace
+
+// A floating frame with no part on any screen comes back inside the nearest
+// monitor's work area, when a layout is applied and when the display
+// changes; a frame with any part on a screen stays where it is, negative
+// coordinates and all (as on a monitor left of or above the primary one).
+TEST_F(ClientTest, FloatingFramesOffEveryScreenComeBackInsideTheWorkArea) {
+    const RECT work = WorkArea();
+    struct Case {
+        const char *name;
+        int x, y;         // where the table puts the frame
+        int wantX, wantY; // kEnd: the right edge on the work area's
+    };
+    constexpr int kEnd = -100000;
+    const Case cases[] = {
+        {"far right and above every screen", 5000, -3000, kEnd, static_cast<int>(work.top)},
+        {"left of every screen", -1500, 200, static_cast<int>(work.left), 200},
+        {"partly on the screen, left and above", -40, -20, -40, -20},
+        {"on the screen", 300, 100, 300, 100},
+    };
+    for (bool displayChange : {false, true}) {
+        std::vector<std::pair<std::string, std::string>> table = {{"Top Dock", "A,B,C,D"}};
+        const char *titles[] = {"A", "B", "C", "D"};
+        for (UINT i = 0; i < 4; ++i)
+            table.emplace_back(titles[i], FloatingValue({1, 2, 3, 4}, 4, ScreenDpi(), displayChange ? 300 : cases[i].x,
+                                                        displayChange ? 100 : cases[i].y));
+        DpiFrame made = ApplyAt(ScreenDpi(), table);
+        for (UINT i = 0; i < 4; ++i) {
+            SCOPED_TRACE(std::string(cases[i].name) + (displayChange ? ", display changed" : ", layout applied"));
+            HWND frame = ResolveRoleWindow(QBR_GetToolbar(made.manager, i), ROLE_FLOATING);
+            RECT r;
+            GetWindowRect(frame, &r);
+            if (displayChange) {
+                // The screen that held it is gone: the window system leaves it there.
+                SetWindowPos(frame, nullptr, cases[i].x, cases[i].y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+                SendMessageA(frame, WM_DISPLAYCHANGE, 32,
+                             MAKELPARAM(GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)));
+                Pump();
+            }
+            const int width = r.right - r.left;
+            GetWindowRect(frame, &r);
+            EXPECT_EQ(cases[i].wantX == kEnd ? work.right - width : cases[i].wantX, r.left);
+            EXPECT_EQ(cases[i].wantY, r.top);
+            EXPECT_EQ(width, r.right - r.left);
+            EXPECT_TRUE(IsWindowVisible(frame));
+        }
+        QBR_DestroyManager(made.manager);
+        DestroyWindow(made.frame);
+        Pump();
+    }
+}

@@ -79,6 +79,8 @@ UINT SizeToolbarWindows(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);
+// Brings a floating frame that lies on no monitor into the nearest work area.
+void KeepFloatingFrameOnScreen(HWND frame);
 // Timers of a floating frame shown while its owner was hidden: the first
 // waits for the owner to show, the second lets it settle before the frame
 // goes back above it.

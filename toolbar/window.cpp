@@ -261,6 +261,37 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     UpdateWindow(target);
 }
 
+// ---- The screen --------------------------------------------------------------------
+
+// The work area of the monitor nearest to a rectangle: the screen less the
+// taskbar and the like.
+static RECT NearestWorkArea(const RECT &rect) {
+    MONITORINFO info = {};
+    info.cbSize = sizeof info;
+    HMONITOR monitor = MonitorFromRect(&rect, MONITOR_DEFAULTTONEAREST);
+    if (monitor && GetMonitorInfoA(monitor, &info)) return info.rcWork;
+    RECT work;
+    if (!SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0))
+        work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    return work;
+}
+
+// Any part of a frame on any monitor keeps it where it is, however negative
+// its coordinates (a monitor may stand left of or above the primary one). A
+// frame on no monitor at all, stored on one that is gone or moved there
+// before the display changed, comes into the nearest work area by the
+// shortest way, its size kept.
+void KeepFloatingFrameOnScreen(HWND frame) {
+    if (!IsFloatingFrame(frame)) return;
+    RECT r;
+    GetWindowRect(frame, &r);
+    if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
+    const RECT work = NearestWorkArea(r);
+    const int x = std::max<int>(work.left, std::min<int>(r.left, work.right - Width(r)));
+    const int y = std::max<int>(work.top, std::min<int>(r.top, work.bottom - Height(r)));
+    SetWindowPos(frame, nullptr, x, y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
 // ---- Sizing and refits -------------------------------------------------------------
 
 UINT SizeToolbarWindows(HWND window) {
