@@ -2,6 +2,7 @@
 // program three times: in the build folder's own prefix (96 DPI) and in its
 // 144- and 192-DPI prefixes (dpi144_dpi_test, dpi192_dpi_test), with
 // QBR_EXPECT_DPI telling it which scale it was started for.
+#include <algorithm>
 #include <cstdlib>
 
 #include "harness.h"
@@ -683,4 +684,57 @@ TEST_F(ClientTest, FloatingFramesOffEveryScreenComeBackInsideTheWorkArea) {
         DestroyWindow(made.frame);
         Pump();
     }
+}
+
+// A floating frame is never larger than the work area: a column too tall
+// wraps into more columns, a row too wide into more rows, each with as few
+// as fit, and every button lies inside the frame, on the screen.
+TEST_F(ScaleTest, AFloatingFrameNeverOutgrowsTheWorkArea) {
+    const Scaled &s = Here();
+    const RECT work = WorkArea();
+    AddButtons(7, 54);
+    struct Case {
+        const char *name;
+        UINT count, across; // buttons, and how many across the frame is made for
+        UINT buttonText;
+    };
+    const Case cases[] = {
+        {"one column of 40", 40, 1, 0},
+        {"one row of 60", 60, 60, 0},
+        {"one column of 12 with button text", 12, 1, 1},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        QBR_SetButtonText(c.buttonText);
+        std::vector<UINT> ids;
+        for (UINT id = 1; id <= c.count; ++id)
+            ids.push_back(id);
+        const int bw = c.buttonText ? s.textWidth : s.buttonWidth, bh = c.buttonText ? s.textHeight : s.buttonHeight;
+        const int across = static_cast<int>(c.across) * (bw - 1) + 1 + 2 * s.areaLeft + 20;
+        HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_FLOATING, work.left, 200, MulDiv(across, 96, s.dpi), 0,
+                                      top, ids.data(), c.count);
+        Pump();
+        HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT outer, client = ClientRectOf(frameWindow);
+        GetWindowRect(frameWindow, &outer);
+        EXPECT_TRUE(outer.left >= work.left && outer.top >= work.top && outer.right <= work.right &&
+                    outer.bottom <= work.bottom)
+            << outer << " in " << work;
+        std::vector<LONG> lefts, tops;
+        int cutOff = 0;
+        for (const RECT &r : ItemRects(pane)) {
+            if (r.right > client.right || r.bottom > client.bottom) ++cutOff;
+            if (std::find(lefts.begin(), lefts.end(), r.left) == lefts.end()) lefts.push_back(r.left);
+            if (std::find(tops.begin(), tops.end(), r.top) == tops.end()) tops.push_back(r.top);
+        }
+        EXPECT_EQ(0, cutOff) << "buttons beyond the frame's client area " << client;
+        const int columns = static_cast<int>(lefts.size()), rows = static_cast<int>(tops.size());
+        if (c.across == 1 && columns > 1) { // one column fewer would run past the work area
+            const int rowsThen = (static_cast<int>(c.count) + columns - 2) / (columns - 1);
+            EXPECT_GT(outer.bottom - outer.top + (rowsThen - rows) * bh, work.bottom - work.top) << columns;
+        }
+        if (c.across > 1) EXPECT_GT(outer.right - outer.left + bw - 1, work.right - work.left) << columns;
+        QBR_DestroyToolbar(pane);
+    }
+    QBR_SetButtonText(0);
 }
