@@ -76,6 +76,9 @@ void MoveToolbarWindow(HWND window, int role, const RECT *rect);
 void SizeToolbarToContent(HWND window, int role, const RECT *rect);
 void RepaintToolbarWindow(HWND window, int role, const RECT *rect);
 UINT SizeToolbarWindows(HWND window);
+// Gives a pane the shape of its dock (a column at the side, a row across),
+// as a new toolbar there has: after it moved to a dock of the other kind.
+UINT ShapePaneForDock(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);

@@ -330,20 +330,36 @@ void KeepFloatingFrameOnScreen(HWND frame) {
 
 // ---- Sizing and refits -------------------------------------------------------------
 
-UINT SizeToolbarWindows(HWND window) {
-    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
-    int width, height;
-    UINT ok =
-        IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height) : NaturalSizeHorizontal(pane, &width, &height);
-    if (!ok) return 0;
-    // The margins of the item areas, plus what WS_BORDER takes around the
-    // pane and WS_THICKFRAME around the frame: each item area comes out
-    // exactly the natural size.
+// The natural size of a toolbar in its dock: one column in a side dock, one
+// row across the frame.
+static UINT NaturalSizeInDock(HWND pane, int *width, int *height) {
+    return IsSideDocked(pane) ? NaturalSizeVertical(pane, width, height) : NaturalSizeHorizontal(pane, width, height);
+}
+
+// The margins of the pane's item area, plus what WS_BORDER takes around it:
+// the item area comes out exactly the natural size.
+static void SizePaneToNatural(HWND pane, int width, int height) {
     const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
     RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
                      height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
     PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
+}
+
+UINT ShapePaneForDock(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!pane || !NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    return RefitToolbar(pane, ROLE_DOCKED);
+}
+
+UINT SizeToolbarWindows(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    // And what WS_THICKFRAME takes around the frame.
     const RECT frameMargins = AreaMargins(pane, ROLE_FLOATING);
     RECT frameSize = {0, 0, width + frameMargins.left + frameMargins.right + 2 * GetSystemMetrics(SM_CXFRAME),
                       height + frameMargins.top + frameMargins.bottom + 2 * GetSystemMetrics(SM_CYFRAME)};
