@@ -688,7 +688,8 @@ TEST_F(ClientTest, FloatingFramesOffEveryScreenComeBackInsideTheWorkArea) {
 
 // A floating frame is never larger than the work area: a column too tall
 // wraps into more columns, a row too wide into more rows, each with as few
-// as fit, and every button lies inside the frame, on the screen.
+// as fit, and every button lies inside the frame, on the screen: a frame that
+// had to be fitted low on the screen is moved up into the work area.
 TEST_F(ScaleTest, AFloatingFrameNeverOutgrowsTheWorkArea) {
     const Scaled &s = Here();
     const RECT work = WorkArea();
@@ -697,11 +698,12 @@ TEST_F(ScaleTest, AFloatingFrameNeverOutgrowsTheWorkArea) {
         const char *name;
         UINT count, across; // buttons, and how many across the frame is made for
         UINT buttonText;
+        int y; // where the frame is made
     };
     const Case cases[] = {
-        {"one column of 40", 40, 1, 0},
-        {"one row of 60", 60, 60, 0},
-        {"one column of 12 with button text", 12, 1, 1},
+        {"one column of 40, made low on the screen", 40, 1, 0, static_cast<int>(work.bottom) - 100},
+        {"one row of 60", 60, 60, 0, 200},
+        {"one column of 12 with button text", 12, 1, 1, 200},
     };
     for (const Case &c : cases) {
         SCOPED_TRACE(c.name);
@@ -711,7 +713,7 @@ TEST_F(ScaleTest, AFloatingFrameNeverOutgrowsTheWorkArea) {
             ids.push_back(id);
         const int bw = c.buttonText ? s.textWidth : s.buttonWidth, bh = c.buttonText ? s.textHeight : s.buttonHeight;
         const int across = static_cast<int>(c.across) * (bw - 1) + 1 + 2 * s.areaLeft + 20;
-        HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_FLOATING, work.left, 200, MulDiv(across, 96, s.dpi), 0,
+        HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_FLOATING, work.left, c.y, MulDiv(across, 96, s.dpi), 0,
                                       top, ids.data(), c.count);
         Pump();
         HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
