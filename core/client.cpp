@@ -121,7 +121,31 @@ GetDpiForWindowProc DpiForWindowCall() {
     return call;
 }
 
+using AdjustWindowRectExForDpiProc = BOOL(WINAPI *)(LPRECT, DWORD, BOOL, DWORD, UINT);
+
+// AdjustWindowRectExForDpi came with the same version, and is looked up alike.
+AdjustWindowRectExForDpiProc AdjustForDpiCall() {
+    static bool looked = false;
+    static AdjustWindowRectExForDpiProc call = nullptr;
+    if (!looked) {
+        looked = true;
+        if (HMODULE user = GetModuleHandleA("user32.dll")) {
+            auto found = reinterpret_cast<void (*)()>(GetProcAddress(user, "AdjustWindowRectExForDpi"));
+            call = reinterpret_cast<AdjustWindowRectExForDpiProc>(found);
+        }
+    }
+    return call;
+}
+
 } // namespace
+
+void WindowBordersAt(DWORD style, DWORD exStyle, UINT dpi, RECT *borders) {
+    *borders = RECT{0, 0, 0, 0};
+    if (AdjustWindowRectExForDpiProc call = AdjustForDpiCall())
+        if (call(borders, style, FALSE, exStyle, dpi)) return;
+    *borders = RECT{0, 0, 0, 0};
+    AdjustWindowRectEx(borders, style, FALSE, exStyle);
+}
 
 UINT WindowDpi(HWND window) {
     if (GetDpiForWindowProc call = DpiForWindowCall()) {

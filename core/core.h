@@ -83,6 +83,11 @@ UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight);
 // ScaleToDpi(value, dpi) is MulDiv(value, dpi, 96), rounded.
 constexpr UINT kBaseDpi = 96;
 UINT WindowDpi(HWND window);
+// What the window system adds around the client area of a window of this
+// style, without a menu, at a display scale (negative left and top, as
+// AdjustWindowRectEx gives them); on a system without per-scale metrics, at
+// the screen's one scale.
+void WindowBordersAt(DWORD style, DWORD exStyle, UINT dpi, RECT *borders);
 UINT ManagerDpi(const ToolbarManager *manager);
 int ScaleToDpi(int value, UINT dpi);
 // GetButtonSizes at a DPI: the client's metrics scaled.

@@ -173,6 +173,9 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
     case kPassActivation:
         PassActivationToHost(window);
         return 0;
+    case WM_DISPLAYCHANGE: // sent to every top-level window: the floating frames, not the panes
+        KeepFloatingFrameOnScreen(window);
+        return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETMINMAXINFO:
         reinterpret_cast<MINMAXINFO *>(lParam)->ptMinTrackSize = POINT{0, 0};
         return 0;

@@ -76,9 +76,14 @@ void MoveToolbarWindow(HWND window, int role, const RECT *rect);
 void SizeToolbarToContent(HWND window, int role, const RECT *rect);
 void RepaintToolbarWindow(HWND window, int role, const RECT *rect);
 UINT SizeToolbarWindows(HWND window);
+// Gives a pane the shape of its dock (a column at the side, a row across),
+// as a new toolbar there has: after it moved to a dock of the other kind.
+UINT ShapePaneForDock(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);
+// Brings a floating frame that lies on no monitor into the nearest work area.
+void KeepFloatingFrameOnScreen(HWND frame);
 // Timers of a floating frame shown while its owner was hidden: the first
 // waits for the owner to show, the second lets it settle before the frame
 // goes back above it.

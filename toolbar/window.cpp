@@ -228,27 +228,33 @@ void MoveToolbarWindow(HWND window, int role, const RECT *rect) {
     ComputeRowBreaks(target, role);
 }
 
-void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
-    if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
-    if (!target) return;
+// Whatever a window spends outside its item area stays the same whatever its
+// size: the margins inside the client area, and the borders outside it. A
+// user can size a floating frame down to less than its own borders; its
+// client area is then empty and tells nothing of them, so the borders are
+// never taken smaller than the platform gives for the window's style.
+static SIZE OutsideItemArea(HWND target, int role) {
     RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
-    if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
-    // Whatever the window spends outside its item area stays the same: the
-    // margins inside the client area, and the borders outside it. A user can
-    // size a floating frame down to less than its own borders; its client
-    // area is then empty and tells nothing of them, so the borders are never
-    // taken smaller than the platform gives for the window's style.
     GetClientRect(target, &client);
     RECT borders = {0, 0, 0, 0};
     AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
                        static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
     const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
     const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
-    RECT size = {0, 0, Width(*rect) + outsideW + Width(client) - Width(area),
-                 Height(*rect) + outsideH + Height(client) - Height(area)};
+    return SIZE{outsideW + Width(client) - Width(area), outsideH + Height(client) - Height(area)};
+}
+
+void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    RECT area;
+    GetItemArea(target, role, &area);
+    if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
+    const SIZE outside = OutsideItemArea(target, role);
+    RECT size = {0, 0, Width(*rect) + outside.cx, Height(*rect) + outside.cy};
     PlaceWindow(target, size, false, true);
 }
 
@@ -261,22 +267,99 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     UpdateWindow(target);
 }
 
+// ---- The screen --------------------------------------------------------------------
+
+// The work area of the monitor nearest to a rectangle: the screen less the
+// taskbar and the like.
+static RECT NearestWorkArea(const RECT &rect) {
+    MONITORINFO info = {};
+    info.cbSize = sizeof info;
+    HMONITOR monitor = MonitorFromRect(&rect, MONITOR_DEFAULTTONEAREST);
+    if (monitor && GetMonitorInfoA(monitor, &info)) return info.rcWork;
+    RECT work;
+    if (!SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0))
+        work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    return work;
+}
+
+// Moves a window into the nearest work area by the shortest way, its size kept.
+static void MoveIntoWorkArea(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    const RECT work = NearestWorkArea(r);
+    const int x = std::max<int>(work.left, std::min<int>(r.left, work.right - Width(r)));
+    const int y = std::max<int>(work.top, std::min<int>(r.top, work.bottom - Height(r)));
+    if (x != r.left || y != r.top)
+        SetWindowPos(window, nullptr, x, y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+// A floating frame is never larger than the work area of its monitor, so
+// that every button can be reached: a toolbar too wide for it wraps into
+// more rows, one too tall takes one more column at a time until it fits.
+// `given` is the item area the measure started from, `measured` its result,
+// measured again here when it does not fit. True when it did not.
+static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *measured) {
+    RECT outer;
+    GetWindowRect(frame, &outer);
+    const RECT work = NearestWorkArea(outer);
+    const SIZE outside = OutsideItemArea(frame, ROLE_FLOATING);
+    const int mostWidth = Width(work) - outside.cx, mostHeight = Height(work) - outside.cy;
+    if (Width(*measured) <= mostWidth && Height(*measured) <= mostHeight) return false;
+    int buttonWidth = 0;
+    GetButtonSizesAt(ManagerDpi(ManagerOfToolbar(pane)), &buttonWidth, nullptr, nullptr, nullptr);
+    const int column = std::max(buttonWidth - 1, 1); // neighbours share one pixel column
+    for (int width = std::min(Width(given), mostWidth);; width = std::min(width + column, mostWidth)) {
+        *measured = RECT{given.left, given.top, given.left + width, given.bottom};
+        MeasureToFit(pane, ROLE_FLOATING, measured);
+        if (Height(*measured) <= mostHeight || width >= mostWidth) return true;
+    }
+}
+
+// Any part of a frame on any monitor keeps it where it is, however negative
+// its coordinates (a monitor may stand left of or above the primary one). A
+// frame on no monitor at all, stored on one that is gone or moved there
+// before the display changed, comes into the nearest work area by the
+// shortest way, its size kept.
+void KeepFloatingFrameOnScreen(HWND frame) {
+    if (!IsFloatingFrame(frame)) return;
+    RECT r;
+    GetWindowRect(frame, &r);
+    if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
+    MoveIntoWorkArea(frame);
+}
+
 // ---- Sizing and refits -------------------------------------------------------------
 
-UINT SizeToolbarWindows(HWND window) {
-    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
-    int width, height;
-    UINT ok =
-        IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height) : NaturalSizeHorizontal(pane, &width, &height);
-    if (!ok) return 0;
-    // The margins of the item areas, plus what WS_BORDER takes around the
-    // pane and WS_THICKFRAME around the frame: each item area comes out
-    // exactly the natural size.
+// The natural size of a toolbar in its dock: one column in a side dock, one
+// row across the frame.
+static UINT NaturalSizeInDock(HWND pane, int *width, int *height) {
+    return IsSideDocked(pane) ? NaturalSizeVertical(pane, width, height) : NaturalSizeHorizontal(pane, width, height);
+}
+
+// The margins of the pane's item area, plus what WS_BORDER takes around it:
+// the item area comes out exactly the natural size.
+static void SizePaneToNatural(HWND pane, int width, int height) {
     const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
     RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
                      height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
     PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
+}
+
+UINT ShapePaneForDock(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!pane || !NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    return RefitToolbar(pane, ROLE_DOCKED);
+}
+
+UINT SizeToolbarWindows(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    // And what WS_THICKFRAME takes around the frame.
     const RECT frameMargins = AreaMargins(pane, ROLE_FLOATING);
     RECT frameSize = {0, 0, width + frameMargins.left + frameMargins.right + 2 * GetSystemMetrics(SM_CXFRAME),
                       height + frameMargins.top + frameMargins.bottom + 2 * GetSystemMetrics(SM_CYFRAME)};
@@ -298,9 +381,12 @@ static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
     RECT area;
     GetItemArea(target, role, &area);
     HWND pane = ResolveRoleWindow(target, ROLE_DOCKED);
+    const RECT given = area;
     UINT measured = forDrop ? MeasureAfterDrop(pane, role, dropped, &area) : MeasureToFit(pane, role, &area);
     if (!measured) return 0;
+    const bool fitted = role == ROLE_FLOATING && FitWithinWorkArea(target, pane, given, &area);
     SizeToolbarToContent(target, role, &area);
+    if (fitted) MoveIntoWorkArea(target);
     ComputeRowBreaks(target, role);
     RepaintToolbarWindow(target, role, nullptr);
     // By the toolbar's state, not the role: a refit of the hidden frame of a
