@@ -21,7 +21,7 @@
 #include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
-#include "input/input.h"
+#include "command/command.h"
 #include "quickhelp/quickhelp.h"
 #include "toolbar/toolbar.h"
 
@@ -154,9 +154,9 @@ void ShowKeyTip() {
     ToolbarRecord *record = FocusedRecord();
     RECT rect;
     if (record && ItemScreenRect(record, keyFocus.index, &rect))
-        QuickHelpForKey(ItemAt(record, keyFocus.index), &rect);
+        QuickHelpForKey(record->paneWindow, ItemAt(record, keyFocus.index), &rect);
     else
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
 }
 
 void CancelKeyPress() {
@@ -207,7 +207,7 @@ bool EnterKeyboard(HWND root) {
         keyFocus.host = root;
         keyFocus.returnTo = GetFocus();
         // Quick help follows the keyboard now, not the cursor.
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
         MoveFocus(record, index);
         return true;
     }
@@ -220,7 +220,7 @@ void LeaveKeyboard(bool giveFocusBack) {
     const KeyFocus old = keyFocus;
     keyFocus = KeyFocus{};
     RepaintFocused(old.pane, old.index);
-    QuickHelpForKey(nullptr, nullptr);
+    QuickHelpForKey(nullptr, nullptr, nullptr);
     if (giveFocusBack && old.returnTo && IsWindow(old.returnTo) && GetFocus() != old.returnTo &&
         (old.returnTo == old.host || IsChild(old.host, old.returnTo)))
         SetFocus(old.returnTo);
@@ -228,7 +228,7 @@ void LeaveKeyboard(bool giveFocusBack) {
 
 void OpenToolbarMenu(ToolbarRecord *record) {
     CancelKeyPress();
-    QuickHelpForKey(nullptr, nullptr);
+    QuickHelpForKey(nullptr, nullptr, nullptr);
     // The menu opens where a right click on the button's lower left would
     // open it.
     RECT rect;

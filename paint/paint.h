@@ -45,7 +45,8 @@ extern int captionHeight;
 
 UINT CaptionFontStart();
 void CaptionFontEnd();
-void PaintToolbar(HWND window);
 void PaintFloatingCaption(HWND window, HDC dc);
 void PaintCloseBox(HWND window, HDC dc);
 void CloseBoxRect(HWND window, RECT *rect);
+// The checkered drag frame, inverted on the screen: drawn twice, it is gone.
+void DrawDragFrame(const RECT *rect);
