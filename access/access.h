@@ -47,7 +47,5 @@ void AccessToolbarHidden(HWND window);
 HWND ItemsWindow(const ToolbarRecord *record);
 // The rectangle of the item at `index` on the screen; 0 if it has no place.
 UINT ItemScreenRect(const ToolbarRecord *record, UINT index, RECT *rect);
-// Whether the item at `index` is a button that can be pressed.
-bool IsEnabledButton(const ToolbarRecord *record, UINT index);
 // Tells the screen readers of `event` on the item at `index` (0-based).
 void NotifyItemEvent(DWORD event, const ToolbarRecord *record, UINT index);

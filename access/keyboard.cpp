@@ -21,7 +21,7 @@
 #include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
-#include "input/input.h"
+#include "command/command.h"
 #include "quickhelp/quickhelp.h"
 #include "toolbar/toolbar.h"
 
@@ -154,9 +154,9 @@ void ShowKeyTip() {
     ToolbarRecord *record = FocusedRecord();
     RECT rect;
     if (record && ItemScreenRect(record, keyFocus.index, &rect))
-        QuickHelpForKey(ItemAt(record, keyFocus.index), &rect);
+        QuickHelpForKey(record->paneWindow, ItemAt(record, keyFocus.index), &rect);
     else
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
 }
 
 void CancelKeyPress() {
@@ -207,7 +207,7 @@ bool EnterKeyboard(HWND root) {
         keyFocus.host = root;
         keyFocus.returnTo = GetFocus();
         // Quick help follows the keyboard now, not the cursor.
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
         MoveFocus(record, index);
         return true;
     }
@@ -227,7 +227,7 @@ void LeaveKeyboard(Leave how) {
     const KeyFocus old = keyFocus;
     keyFocus = KeyFocus{};
     RepaintFocused(old.pane, old.index);
-    QuickHelpForKey(nullptr, nullptr);
+    QuickHelpForKey(nullptr, nullptr, nullptr);
     if (how == Leave::Quietly) return;
     const HWND focus = GetFocus();
     if (how == Leave::GiveBack && old.returnTo && IsWindow(old.returnTo) && focus != old.returnTo &&
@@ -245,7 +245,7 @@ void AnnounceFocusAgain() {
 
 void OpenToolbarMenu(ToolbarRecord *record) {
     CancelKeyPress();
-    QuickHelpForKey(nullptr, nullptr);
+    QuickHelpForKey(nullptr, nullptr, nullptr);
     // The menu opens where a right click on the button's lower left would
     // open it.
     RECT rect;

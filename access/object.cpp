@@ -14,7 +14,7 @@
 
 #include "access/access.h"
 #include "core/core.h"
-#include "input/input.h"
+#include "command/command.h"
 #include "toolbar/toolbar.h"
 
 namespace {
@@ -411,11 +411,6 @@ UINT ItemScreenRect(const ToolbarRecord *record, UINT index, RECT *rect) {
     if (!GetItemRect(record, index, rect)) return 0;
     ClientRectToScreen(ItemsWindow(record), rect);
     return 1;
-}
-
-bool IsEnabledButton(const ToolbarRecord *record, UINT index) {
-    const ButtonData *data = DataOf(ItemAt(record, index));
-    return data && ButtonIsEnabled(data);
 }
 
 void NotifyItemEvent(DWORD event, const ToolbarRecord *record, UINT index) {

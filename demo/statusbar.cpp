@@ -29,6 +29,24 @@ constexpr int kExtraHeight = 12;
 
 HFONT statusBarFont = nullptr;
 
+// The screen's device context with a font selected, for the life of the
+// scope; the old font goes back and the context is released on every path.
+class ScreenFontDC {
+  public:
+    explicit ScreenFontDC(HFONT font) : dc_(GetDC(nullptr)), old_(dc_ && font ? SelectObject(dc_, font) : nullptr) {}
+    ~ScreenFontDC() {
+        if (old_) SelectObject(dc_, old_);
+        if (dc_) ReleaseDC(nullptr, dc_);
+    }
+    ScreenFontDC(const ScreenFontDC &) = delete;
+    ScreenFontDC &operator=(const ScreenFontDC &) = delete;
+    operator HDC() const { return dc_; }
+
+  private:
+    HDC dc_;
+    HGDIOBJ old_;
+};
+
 char *BufferOf(HWND window) { return reinterpret_cast<char *>(GetWindowLongPtrA(window, 0)); }
 
 // ExtTextOut with ETO_OPAQUE and no text is the cheapest solid fill there is:
@@ -122,12 +140,11 @@ void DeleteStatusBarFont() {
 }
 
 HWND CreateStatusBar(HWND parent) {
-    HDC screen = GetDC(nullptr);
-    HGDIOBJ oldFont = SelectObject(screen, statusBarFont);
     TEXTMETRICA metrics = {};
-    GetTextMetricsA(screen, &metrics);
-    SelectObject(screen, oldFont);
-    ReleaseDC(nullptr, screen);
+    {
+        ScreenFontDC screen(statusBarFont);
+        GetTextMetricsA(screen, &metrics);
+    }
     const int height = metrics.tmHeight - metrics.tmInternalLeading + kExtraHeight;
     return CreateWindowExA(0, kClassName, "", WS_CHILD | WS_VISIBLE, 0, 0, 0, height, parent, nullptr, moduleInstance,
                            nullptr);

@@ -7,10 +7,6 @@
 #include "input/input.h"
 #include "toolbar/toolbar.h"
 
-// The cursor has to travel more than this many pixels sideways before a drop
-// on the item's own place counts as a nudge.
-constexpr int kNudgeDeadZone = 2;
-
 static bool IsSeparatorKind(const ToolbarItem *item, bool *separator) {
     UINT kind;
     if (!ItemGetKind(item, &kind)) return false;
@@ -61,7 +57,7 @@ static void NudgeSeparator(ToolbarManager *manager, ToolbarRecord *target, UINT 
     // dragFrame began as the item's rectangle and has moved with the cursor;
     // only the sideways part of the way counts.
     const int shift = mouseTrack.dragFrame.left - rect.left;
-    const int deadZone = ScaleToDpi(kNudgeDeadZone, ManagerDpi(manager));
+    const int deadZone = ManagerMetrics(manager).nudgeDeadZone;
     // The separator's place in the list, before a removal or after an insertion.
     if (shift > deadZone) {
         if (afterIsSeparator) {

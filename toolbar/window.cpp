@@ -4,10 +4,8 @@
 #include <algorithm>
 #include <initializer_list>
 
-#include "access/access.h"
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "dock/dock.h"
-#include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -90,6 +88,12 @@ HWND DockOfToolbar(HWND window) {
     return pane ? GetParent(pane) : nullptr;
 }
 
+// The toolbar's dock packs again, through the dock room.
+static UINT RelayoutDockOf(HWND window) {
+    HWND dock = DockOfToolbar(window);
+    return roomCallbacks.relayoutDock ? roomCallbacks.relayoutDock(dock) : 1;
+}
+
 UINT IsSideDocked(HWND window) {
     UINT side;
     return GetDockSide(DockOfToolbar(window), &side) && !IsAcrossDock(side) ? 1 : 0;
@@ -103,7 +107,7 @@ HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
     if (!GetClassInfoA(instance, kToolbarClassName, &wc)) {
         wc = WNDCLASSA{};
         wc.style = CS_DBLCLKS;
-        wc.lpfnWndProc = ToolbarWindowProc;
+        wc.lpfnWndProc = roomCallbacks.toolbarWindowProc;
         wc.cbWndExtra = sizeof(LONG_PTR); // the twin window
         wc.hInstance = instance;
         wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
@@ -166,13 +170,12 @@ void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
 }
 
 RECT AreaMargins(HWND window, int role) {
-    const UINT dpi = ManagerDpi(ManagerOfToolbar(window));
-    if (role == ROLE_DOCKED)
-        return RECT{ScaleToDpi(kAreaLeft, dpi), ScaleToDpi(kPaneAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
-                    ScaleToDpi(kPaneAreaBottom, dpi)};
+    const ScaledMetrics &metrics = ManagerMetrics(ManagerOfToolbar(window));
+    if (role == ROLE_DOCKED) return metrics.paneMargins;
     // The caption band is the caption font's, which already has the screen's scale.
-    return RECT{ScaleToDpi(kAreaLeft, dpi), captionHeight + ScaleToDpi(kFrameAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
-                ScaleToDpi(kFrameAreaBottom, dpi)};
+    RECT margins = metrics.frameMargins;
+    margins.top += captionHeight;
+    return margins;
 }
 
 void GetItemArea(HWND window, int role, RECT *rect) {
@@ -371,6 +374,8 @@ UINT SizeToolbarWindows(HWND window) {
 
 // The refit of one window, with the measure that a plain refit or a drop uses.
 static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
+    // Every edit of the items comes through here.
+    if (ToolbarRecord *record = RecordOfWindow(window)) ForgetShownLayout(record, false);
     if (role == ROLE_BOTH) {
         if (!Refit(window, ROLE_FLOATING, dropped, forDrop)) return 0;
         role = ROLE_DOCKED;
@@ -391,7 +396,7 @@ static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
     RepaintToolbarWindow(target, role, nullptr);
     // By the toolbar's state, not the role: a refit of the hidden frame of a
     // docked toolbar lays the dock out too.
-    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDock(DockOfToolbar(target));
+    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDockOf(target);
     return 1;
 }
 
@@ -522,7 +527,8 @@ static HHOOK activationHook = nullptr;
 static UINT activationWatchers = 0;
 
 static void OnWindowActivating(HWND window) {
-    AccessWindowActivating(window); // the keyboard stays with the toolbars only while their frame is active
+    // The keyboard stays with the toolbars only while their frame is active.
+    if (roomCallbacks.windowActivating) roomCallbacks.windowActivating(window);
     ToolbarClient *client = CurrentClient();
     if (!client) return;
     for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i)
@@ -553,7 +559,7 @@ UINT ShowToolbarWindow(HWND window, UINT show) {
         ShowWithoutActivating(target);
     else
         ShowWindow(target, SW_HIDE);
-    return RelayoutDock(DockOfToolbar(target));
+    return RelayoutDockOf(target);
 }
 
 static UINT Switch(HWND window, bool toFloating) {
@@ -565,96 +571,8 @@ static UINT Switch(HWND window, bool toFloating) {
     if (IsWindowVisible(shown) || (QBR_GetToolbarFlags(pane) & TBF_HIDDEN)) return 1;
     ShowWindow(hidden, SW_HIDE);
     ShowWithoutActivating(shown);
-    return RelayoutDock(DockOfToolbar(pane));
+    return RelayoutDockOf(pane);
 }
 
 UINT SwitchToFloating(HWND window) { return Switch(window, true); }
 UINT SwitchToDocked(HWND window) { return Switch(window, false); }
-
-// ---- New button size ---------------------------------------------------------------
-
-UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight) {
-    if (!manager) return 0;
-    // The new size is given at 96 DPI, as the host gives its metrics.
-    const UINT dpi = ManagerDpi(manager);
-    newWidth = ScaleToDpi(newWidth, dpi);
-    newHeight = ScaleToDpi(newHeight, dpi);
-    for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
-        HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
-        for (int role : {ROLE_FLOATING, ROLE_DOCKED}) {
-            RECT area;
-            GetItemArea(pane, role, &area);
-            RewrapForMetrics(pane, role, newWidth, newHeight, &area);
-            SizeToolbarToContent(pane, role, &area);
-        }
-    }
-    return 1;
-}
-
-// Every dock is packed once, after all toolbars are refitted: packing it again
-// for each of its toolbars would move and paint its panes once per toolbar (a
-// dock of 40 took 40 packs), and only the last packing would stay on the
-// screen. The top and bottom docks go first, since the side docks lie
-// between them.
-UINT RelayoutManagerToolbars(ToolbarManager *manager) {
-    if (!manager) return 0;
-    {
-        DeferDockPacking deferred;
-        for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
-            HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
-            RefitToolbar(pane, ROLE_BOTH);
-            ComputeRowBreaks(pane, ROLE_FLOATING);
-            ComputeRowBreaks(pane, ROLE_DOCKED);
-        }
-    }
-    for (bool top : {true, false})
-        for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
-            if (IsAcrossDock(dock->side) == top) PackDock(dock);
-    return 1;
-}
-
-// ---- New display scale -----------------------------------------------------------
-
-UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
-    if (!manager || !dpi || dpi == ManagerDpi(manager)) return 0;
-    // As for a new button size: the rows come from the break lists the old
-    // scale made, so the rewrap runs at the new scale before the relayout.
-    int width = 0, height = 0;
-    GetButtonSizes(&width, &height, nullptr, nullptr);
-    manager->dpi = dpi;
-    RewrapManagerToolbars(manager, width, height);
-    if (manager->imageResource) ChooseImageStrip(manager);
-    RelayoutManagerToolbars(manager);
-    return 1;
-}
-
-extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
-    ToolbarClient *client = CurrentClient();
-    if (!client || !frame) return 0;
-    ToolbarManager *manager = nullptr;
-    for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
-        if (m->frame == frame) manager = m;
-    if (!manager) return 0;
-    RescaleManagerToolbars(manager, HIWORD(wParam));
-    if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
-        SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
-                     suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
-    return 1;
-}
-
-// Both walk every manager of the client in list order.
-static UINT ForEachManager(UINT (*action)(ToolbarManager *, int, int), int w, int h) {
-    ToolbarClient *client = CurrentClient();
-    if (!client) return 0;
-    for (UINT i = 0; i < PointerListCount(client->managers); ++i)
-        action(ListAt<ToolbarManager>(client->managers, i), w, h);
-    return 1;
-}
-
-UINT RewrapAllManagers(int newWidth, int newHeight) {
-    return ForEachManager(RewrapManagerToolbars, newWidth, newHeight);
-}
-
-UINT RelayoutAllManagers() {
-    return ForEachManager([](ToolbarManager *m, int, int) { return RelayoutManagerToolbars(m); }, 0, 0);
-}
