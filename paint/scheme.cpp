@@ -33,7 +33,7 @@ constexpr COLORREF kDark[SC_ROLES] = {
     RGB(20, 20, 20),    // dark edge
     RGB(100, 100, 100), // ring, lines
     RGB(240, 240, 240), // text
-    RGB(160, 160, 160), // disabled
+    RGB(190, 190, 190), // disabled
     RGB(180, 180, 180), // the strip's grey
     RGB(32, 32, 32),    // lists
     RGB(240, 240, 240),
@@ -166,8 +166,11 @@ HBRUSH SchemeControlColor(UINT message, HDC dc) {
     return field ? windowBrush : faceBrush;
 }
 
+// The last client's end: the next first client starts under the system's
+// scheme, as a host's settings go with its client.
 void SchemeResourcesEnd() {
     DeleteSchemeBrushes();
+    schemeChoice = schemeActive = QBR_SCHEME_SYSTEM;
     if (dwmLibrary) FreeLibrary(dwmLibrary);
     dwmLibrary = nullptr;
     setWindowAttribute = nullptr;

@@ -41,10 +41,11 @@ constexpr KeyColor kKeyColors[] = {
 
 // A colour that is no key keeps its hue in a dark scheme but is lightened,
 // a tenth of the way to white at a time, until it stands 3:1 against the
-// face: the dark blue of a "?" would vanish on a dark button otherwise.
-DWORD ReadableOnFace(DWORD entry, COLORREF face) {
+// face and the light squares of the dither of a button that is on: the dark
+// blue of a "?" would vanish on a dark button otherwise.
+DWORD ReadableOnFace(DWORD entry, COLORREF face, COLORREF light) {
     COLORREF color = RGB((entry >> 16) & 0xFF, (entry >> 8) & 0xFF, entry & 0xFF);
-    for (int step = 0; step < 10 && ContrastRatio(color, face) < 3.0; ++step)
+    for (int step = 0; step < 10 && (ContrastRatio(color, face) < 3.0 || ContrastRatio(color, light) < 3.0); ++step)
         color = RGB(GetRValue(color) + (255 - GetRValue(color) + 9) / 10,
                     GetGValue(color) + (255 - GetGValue(color) + 9) / 10,
                     GetBValue(color) + (255 - GetBValue(color) + 9) / 10);
@@ -305,7 +306,7 @@ HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource) {
                 break;
             }
         }
-        if (!key && schemeActive == QBR_SCHEME_DARK) entry = ReadableOnFace(entry, colorFace);
+        if (!key && schemeActive == QBR_SCHEME_DARK) entry = ReadableOnFace(entry, colorFace, colorHighlight);
     }
 
     const int width = info.header.biWidth;
