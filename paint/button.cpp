@@ -354,7 +354,8 @@ void PaintFocusRect(const RECT *rect) {
     const int inset = PassMetrics().focusInset;
     InflateRect(&focus, -inset, -inset);
     // The dots invert what lies under them, black and white being the
-    // colours the platform's own controls draw them with.
+    // colours the platform's own controls draw them with; inverted, they
+    // show on every scheme's face (as the drag frame, inverted on the screen).
     MaskColorsScope colors(targetDC);
     DrawFocusFrame(targetDC, &focus, PassMetrics());
 }
