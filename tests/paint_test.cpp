@@ -1118,6 +1118,7 @@ TEST_F(SurfaceTest, FollowingTheAppModeSwitchesLive) {
     EXPECT_EQ(QBR_SCHEME_DARK, QBR_GetActiveColorScheme());
     const Shown dark = show();
     EXPECT_TRUE(samePlaces(light, dark));
+    EXPECT_GT(Luminance(dark.pane.At(kAreaLeft + 3 + 6, kPaneAreaTop + 3 + 5)), 0.7) << "the strip, loaded again";
     for (const Pixels *p : {&dark.pane, &dark.dock, &dark.floating})
         EXPECT_LT(Luminance(p->At(p->width - 2, p->height - 3)), 0.05) << Hex(p->At(p->width - 2, p->height - 3));
 
