@@ -262,10 +262,9 @@ void PaintImage(const ButtonLook &b) {
 }
 
 // Every image pixel that is neither face nor highlight, flat: light one pixel
-// down right for a disabled button, then dark.
-// Outside the system's scheme the ink is one flat colour with no emboss: in
-// high contrast every glyph in every state, in the dark scheme a disabled or
-// mixed one.
+// down right for a disabled button, then dark. Outside the system's scheme the
+// ink is one colour with no emboss: in high contrast every glyph in every
+// state, in the dark scheme a disabled or mixed one.
 void PaintInk(const ButtonLook &b) {
     if (!b.disabled && !b.mixed && !b.contrast) return;
     BuildButtonMask(b.imageIndex, b.imageX, b.imageY, 1, 0);
