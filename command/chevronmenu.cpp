@@ -16,12 +16,9 @@ HBITMAP MenuImage(ToolbarManager *manager, UINT imageIndex) {
     ScreenDC screen;
     HDC memory = GdiTrackDC(CreateCompatibleDC(screen));
     HBITMAP image = GdiTrack(CreateCompatibleBitmap(screen, iw, ih));
-    if (memory && image && BeginButtonPaint(manager, memory)) {
+    if (memory && image) {
         SelectScope select(memory, image);
-        UINT column = 0, row = 0;
-        StripCellOf(imageIndex, &column, &row);
-        BitBlt(memory, 0, 0, iw, ih, stripDC, static_cast<int>(column) * iw, static_cast<int>(row) * ih, SRCCOPY);
-        EndButtonPaint();
+        PaintMenuImage(manager, memory, iw, ih, imageIndex);
     }
     GdiDeleteDC(memory);
     return image;

@@ -14,3 +14,7 @@ void FillItemList(HWND dialog);
 void ShowItemDescription(HWND dialog);
 void CenterWindowOnScreen(HWND window);
 INT_PTR CALLBACK NewToolbarDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam);
+// The open customising dialogs, painted again in the colours now in force.
+void RepaintCustomizeDialogs();
+extern HWND openInsertDialog;
+extern HWND openNewToolbarDialog;

@@ -71,9 +71,9 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
     if (draw->itemID == static_cast<UINT>(-1)) DrawFocusRect(dc, &line); // empty list with the focus
 
     const bool selected = (draw->itemState & ODS_SELECTED) != 0;
-    COLORREF back = GetSysColor(selected ? COLOR_HIGHLIGHT : COLOR_WINDOW);
+    COLORREF back = SchemeColor(selected ? SC_SELECTION : SC_WINDOW);
     // The label of a button in text mode takes the line's text colour.
-    TextColorScope text(dc, GetSysColor(selected ? COLOR_HIGHLIGHTTEXT : COLOR_WINDOWTEXT));
+    TextColorScope text(dc, SchemeColor(selected ? SC_SELECTIONTEXT : SC_WINDOWTEXT));
     {
         BkColorScope background(dc, back);
         SolidBrush brush(back);
@@ -97,7 +97,7 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
     }
     // The next draw of the line fills this frame away again.
     if ((draw->itemAction & ODA_FOCUS) && (draw->itemState & ODS_FOCUS)) {
-        SolidBrush focus(GetSysColor(COLOR_ACTIVECAPTION));
+        SolidBrush focus(SchemeColor(SC_CAPTION));
         FrameRect(dc, &line, focus);
     }
 }
@@ -250,13 +250,40 @@ void ShowItemDescription(HWND dialog) {
     SendDlgItemMessageA(dialog, kDescription, WM_SETTEXT, 0, reinterpret_cast<LPARAM>(text));
 }
 
+HWND openInsertDialog = nullptr;
+HWND openNewToolbarDialog = nullptr;
+
+void RepaintCustomizeDialogs() {
+    const UINT how = RDW_INVALIDATE | RDW_ERASE | RDW_FRAME | RDW_ALLCHILDREN;
+    if (openInsertDialog) {
+        ApplyFrameScheme(openInsertDialog);
+        RedrawWindow(openInsertDialog, nullptr, nullptr, how);
+    }
+    if (openNewToolbarDialog) {
+        ApplyFrameScheme(openNewToolbarDialog);
+        RedrawWindow(openNewToolbarDialog, nullptr, nullptr, how);
+    }
+}
+
 INT_PTR CALLBACK InsertDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
     case WM_INITDIALOG:
         insertManager = reinterpret_cast<ToolbarManager *>(lParam);
         OnInitDialog(dialog);
         CenterWindowOnScreen(dialog);
+        ApplyFrameScheme(dialog);
+        openInsertDialog = dialog;
         return TRUE;
+    case WM_DESTROY:
+        openInsertDialog = nullptr;
+        return FALSE;
+    case WM_CTLCOLORDLG:
+    case WM_CTLCOLORSTATIC:
+    case WM_CTLCOLORBTN:
+    case WM_CTLCOLOREDIT:
+    case WM_CTLCOLORLISTBOX:
+        // The scheme's colours; under the system's scheme 0, the platform's.
+        return reinterpret_cast<INT_PTR>(SchemeControlColor(message, reinterpret_cast<HDC>(wParam)));
     case WM_MEASUREITEM:
         OnMeasureItem(reinterpret_cast<MEASUREITEMSTRUCT *>(lParam));
         return TRUE;

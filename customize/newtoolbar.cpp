@@ -2,6 +2,7 @@
 // user names a toolbar, and an empty floating one appears just below the
 // Insert dialog, ready for the next drop.
 #include "customize/customize.h"
+#include "paint/paint.h"
 
 namespace {
 
@@ -54,7 +55,19 @@ INT_PTR CALLBACK NewToolbarDialogProc(HWND dialog, UINT message, WPARAM wParam, 
     switch (message) {
     case WM_INITDIALOG:
         CenterWindowOnScreen(dialog);
+        ApplyFrameScheme(dialog);
+        openNewToolbarDialog = dialog;
         return TRUE;
+    case WM_DESTROY:
+        openNewToolbarDialog = nullptr;
+        return FALSE;
+    case WM_CTLCOLORDLG:
+    case WM_CTLCOLORSTATIC:
+    case WM_CTLCOLORBTN:
+    case WM_CTLCOLOREDIT:
+    case WM_CTLCOLORLISTBOX:
+        // The scheme's colours; under the system's scheme 0, the platform's.
+        return reinterpret_cast<INT_PTR>(SchemeControlColor(message, reinterpret_cast<HDC>(wParam)));
     case WM_COMMAND:
         OnCommand(dialog, LOWORD(wParam), HIWORD(wParam));
         return TRUE;

@@ -14,6 +14,9 @@ constexpr UINT kOpenViewCommand = 122;
 constexpr UINT kAboutCommand = 151;
 constexpr UINT kExitCommand = 152;
 constexpr UINT kHelpContentsCommand = 153;
+// View > Colours: follow the system, the system's colours, dark, high contrast.
+constexpr UINT kSchemeCommandFirst = 130;
+constexpr UINT kSchemeCommandLast = 133;
 
 // Catalogs and default toolbars (tables.cpp).
 ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section);

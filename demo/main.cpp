@@ -30,8 +30,36 @@ HMENU AddToolbarsMenu(HWND frame) {
     return menu;
 }
 
+// The colour schemes in the order of View > Colours, and their names in the
+// settings file.
+struct SchemeName {
+    UINT scheme;
+    const char *name;
+};
+constexpr SchemeName kSchemes[] = {{QBR_SCHEME_FOLLOW, "follow"},
+                                   {QBR_SCHEME_SYSTEM, "system"},
+                                   {QBR_SCHEME_DARK, "dark"},
+                                   {QBR_SCHEME_HIGHCONTRAST, "high contrast"}};
+
+UINT SchemeCommand() {
+    for (UINT i = 0; i < 4; ++i)
+        if (kSchemes[i].scheme == QBR_GetColorScheme()) return kSchemeCommandFirst + i;
+    return kSchemeCommandFirst;
+}
+
+// A name the file does not know follows the system.
+void ReadColourScheme() {
+    char name[32];
+    GetPrivateProfileStringA(kGlobals, "Colour Scheme", "follow", name, sizeof(name), SettingsPath());
+    UINT scheme = QBR_SCHEME_FOLLOW;
+    for (const SchemeName &known : kSchemes)
+        if (lstrcmpiA(name, known.name) == 0) scheme = known.scheme;
+    QBR_SetColorScheme(scheme);
+}
+
 void CheckGlobals(HWND frame) {
     HMENU menu = GetMenu(frame);
+    CheckMenuRadioItem(menu, kSchemeCommandFirst, kSchemeCommandLast, SchemeCommand(), MF_BYCOMMAND);
     CheckMenuItem(menu, kQuickHelpCommand, QBR_GetQuickHelp() ? MF_CHECKED : MF_UNCHECKED);
     CheckMenuItem(menu, kButtonTextCommand, QBR_GetButtonText() ? MF_CHECKED : MF_UNCHECKED);
 }
@@ -62,6 +90,9 @@ void MainCommand(HWND window, UINT id) {
         ToggleToolbar(mainManager, id);
     } else if (id == kQuickHelpCommand || id == kButtonTextCommand) {
         ToggleGlobal(window, id);
+    } else if (id >= kSchemeCommandFirst && id <= kSchemeCommandLast) {
+        QBR_SetColorScheme(kSchemes[id - kSchemeCommandFirst].scheme);
+        CheckMenuRadioItem(menu, kSchemeCommandFirst, kSchemeCommandLast, id, MF_BYCOMMAND);
     } else if (id == kOpenViewCommand) {
         OpenViewWindow();
     } else if (id == kAboutCommand) {
@@ -75,6 +106,7 @@ void MainCommand(HWND window, UINT id) {
 
 LRESULT OnMainCreate(HWND window) {
     mainEdit = CreateEditControl(window, &mainEditFont);
+    ReadColourScheme(); // before the start, so that the first paint is in it
     if (!QBR_Initialize(moduleInstance, DemoHelpText)) return -1;
     QBR_SetNotifyMessages(WM_MENUSELECT, WM_MENUSELECT);
     QBR_SetQuickHelp(GetPrivateProfileIntA(kGlobals, "Quick Help", 1, SettingsPath()));
@@ -111,6 +143,8 @@ void DestroyMainContents() {
     WritePrivateProfileStringA(kGlobals, "Quick Help", number, SettingsPath());
     std::snprintf(number, sizeof(number), "%i", static_cast<int>(QBR_GetButtonText()));
     WritePrivateProfileStringA(kGlobals, "Button Text", number, SettingsPath());
+    WritePrivateProfileStringA(kGlobals, "Colour Scheme", kSchemes[SchemeCommand() - kSchemeCommandFirst].name,
+                               SettingsPath());
     QBR_Terminate();
     DeleteStatusBarFont();
     PostQuitMessage(0);
@@ -156,6 +190,12 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM
     case WM_DPICHANGED:
         QBR_DpiChanged(window, wParam, lParam);
         return 0;
+    case WM_SETTINGCHANGE:
+    case WM_SYSCOLORCHANGE:
+        // The app mode, high contrast or the system's colours changed: the
+        // toolbars of every window follow (the scheme is the program's).
+        QBR_ColorsChanged(window, message, wParam, lParam);
+        break;
     }
     return DefWindowProcA(window, message, wParam, lParam);
 }

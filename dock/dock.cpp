@@ -7,6 +7,7 @@
 #include "core/callbacks.h"
 #include "core/core.h"
 #include "core/gdi.h"
+#include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
 
@@ -419,7 +420,7 @@ static void PaintDock(HWND window) {
     PaintScope dc(window);
     RECT client;
     GetClientRect(window, &client);
-    SolidBrush brush(GetSysColor(COLOR_WINDOWFRAME));
+    SolidBrush brush(SchemeColor(SC_FRAME));
     if (!brush) return;
     SelectScope select(dc, brush);
     // The last pixel row, from x = 0 over the full width. Written with a
@@ -442,6 +443,15 @@ static void OnDockRightDown(HWND window, LPARAM lParam) {
 
 LRESULT CALLBACK DockWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
+    case WM_ERASEBKGND:
+        // The class brush is the system's face; another scheme fills its own.
+        if (schemeActive != QBR_SCHEME_SYSTEM) {
+            RECT client;
+            GetClientRect(window, &client);
+            FillSolidBox(reinterpret_cast<HDC>(wParam), 0, 0, client.right, client.bottom, SchemeColor(SC_FACE));
+            return 1;
+        }
+        return DefWindowProcA(window, message, wParam, lParam);
     case WM_PAINT:
         PaintDock(window);
         return 0;

@@ -97,6 +97,37 @@ void QBR_SetQuickHelp(UINT on);
 #endif
 UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam);
 UINT QBR_GetQuickHelp(void);
+
+/* Colour schemes. Every surface the library paints (docks, toolbars, floating
+   frames and their caption band, buttons in every state, the chevron and its
+   menu, the quick-help tip, the Insert Toolbar Item and New Toolbar dialogs)
+   takes its colours from one scheme:
+     QBR_SCHEME_SYSTEM        the system's button colours (the default);
+     QBR_SCHEME_DARK          light glyphs and text on dark surfaces;
+     QBR_SCHEME_HIGHCONTRAST  glyphs in one text colour on a plain face, the
+                              state of a checked or mixed button shown by an
+                              inverted face or a frame;
+     QBR_SCHEME_FOLLOW        high contrast when the system's high-contrast
+                              switch is on, else dark when the user's apps
+                              are dark (HKCU\Software\Microsoft\Windows\
+                              CurrentVersion\Themes\Personalize, value
+                              AppsUseLightTheme = 0), else the system's.
+   QBR_SetColorScheme repaints every toolbar, dock, floating frame and tip at
+   once; 0 for an unknown value. QBR_GetColorScheme gives the choice,
+   QBR_GetActiveColorScheme the scheme it stands for now.
+   A change of the system's colours or modes reaches the frame as
+   WM_SETTINGCHANGE or WM_SYSCOLORCHANGE; the host passes both on:
+       case WM_SETTINGCHANGE:
+       case WM_SYSCOLORCHANGE: QBR_ColorsChanged(window, message, wParam, lParam); break;
+   1 when the toolbars were painted again in the colours now in force. */
+#define QBR_SCHEME_SYSTEM 0u
+#define QBR_SCHEME_DARK 1u
+#define QBR_SCHEME_HIGHCONTRAST 2u
+#define QBR_SCHEME_FOLLOW 3u
+UINT QBR_SetColorScheme(UINT scheme);
+UINT QBR_GetColorScheme(void);
+UINT QBR_GetActiveColorScheme(void);
+UINT QBR_ColorsChanged(HWND frame, UINT message, WPARAM wParam, LPARAM lParam);
 void QBR_SetCustomize(UINT on);
 UINT QBR_GetCustomize(void);
 void QBR_SetButtonText(UINT on);

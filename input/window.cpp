@@ -18,6 +18,7 @@ static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
         CreateWindowExA(0, create->lpszClass, create->lpszName, kFrameStyle, CW_USEDEFAULT, CW_USEDEFAULT, create->cx,
                         create->cy, GetParent(create->hwndParent), nullptr, create->hInstance, create->lpCreateParams);
     if (!frame) return -1;
+    ApplyFrameScheme(frame);
     SetTwinWindow(frame, window);
     SetTwinWindow(window, frame);
     if (!CreateToolbarRecord(window)) {

@@ -146,10 +146,10 @@ void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, 
     // colour: face pixels first, then highlight pixels added on.
     int sourceX = 0, sourceY = 0;
     SourceOfImage(imageIndex, &sourceX, &sourceY);
-    SetBkColor(stripDC, colorFace);
+    SetBkColor(stripDC, stripFaceColor);
     BitBlt(maskDC, maskX, maskY, iw, ih, stripDC, sourceX, sourceY, SRCCOPY);
     if (!withHighlight) return;
-    SetBkColor(stripDC, colorHighlight);
+    SetBkColor(stripDC, stripHighlightColor);
     BitBlt(maskDC, maskX, maskY, iw, ih, stripDC, sourceX, sourceY, SRCPAINT);
     if (!erode) return;
     // Each bit anded with its neighbour up and left grows the zeros by one
@@ -177,6 +177,10 @@ namespace {
 // One button as it is painted now: its state and where its parts go.
 struct ButtonLook {
     bool on, mixed, pressed, disabled;
+    // High contrast shows states without relief or dither: an inverted face
+    // for a button that is on or held down, a frame for a mixed one (and a
+    // disabled one that is on), and the glyph in one colour.
+    bool contrast, inverted, framed;
     UINT imageIndex;
     int bw, bh;           // the button's cell
     int x, y, w, h;       // inside the frame ring
@@ -196,6 +200,9 @@ ButtonLook LookOf(const ButtonData *button, const RECT *rect, UINT noState, bool
     look.pressed = !noState && ButtonIsPressed(button) != 0;
     look.disabled = !noState && ButtonIsEnabled(button) == 0;
     ButtonGetImageIndex(button, &look.imageIndex);
+    look.contrast = schemeActive == QBR_SCHEME_HIGHCONTRAST;
+    look.inverted = look.contrast && (look.on || look.pressed) && !look.disabled;
+    look.framed = look.contrast && (look.mixed || (look.on && look.disabled));
     look.x = rect->left + 1;
     look.y = rect->top + 1;
     look.w = look.bw - 2;
@@ -205,8 +212,15 @@ ButtonLook LookOf(const ButtonData *button, const RECT *rect, UINT noState, bool
     return look;
 }
 
+// The colour of a glyph drawn flat and of the label, outside the system's
+// scheme, where the label keeps the target's text colour.
+COLORREF InkOf(const ButtonLook &b) {
+    if (b.disabled) return SchemeColor(SC_GRAYTEXT);
+    return SchemeColor(b.inverted ? SC_SELECTIONTEXT : SC_TEXT);
+}
+
 void PaintFaceAndFrame(const ButtonLook &b) {
-    FillSolidBox(targetDC, b.x, b.y, b.w, b.h, colorFace);
+    FillSolidBox(targetDC, b.x, b.y, b.w, b.h, b.inverted ? SchemeColor(SC_SELECTION) : colorFace);
     FillSolidBox(targetDC, b.x, b.y - 1, b.w, 1, colorFrame);
     FillSolidBox(targetDC, b.x, b.y + b.h, b.w, 1, colorFrame);
     FillSolidBox(targetDC, b.x - 1, b.y, 1, b.h, colorFrame);
@@ -218,13 +232,17 @@ void PaintFaceAndFrame(const ButtonLook &b) {
 void PaintRelief(ButtonLook &b) {
     const int x = b.x, y = b.y, w = b.w, h = b.h;
     if (b.on || b.pressed) {
+        if (b.contrast) {
+            ++b.imageX, ++b.imageY, ++b.labelDX, ++b.labelDY;
+            return;
+        }
         FillSolidBox(targetDC, x, y, 1, h, colorShadow);
         FillSolidBox(targetDC, x, y, w, 1, colorShadow);
         ++b.imageX;
         ++b.imageY;
         ++b.labelDX;
         ++b.labelDY;
-    } else {
+    } else if (!b.contrast) {
         FillSolidBox(targetDC, x, y, 1, h - 1, colorHighlight);
         FillSolidBox(targetDC, x, y, w - 1, 1, colorHighlight);
         FillSolidBox(targetDC, x + w - 1, y, 1, h, colorShadow);
@@ -237,18 +255,25 @@ void PaintRelief(ButtonLook &b) {
 // A disabled button shows only its embossed ink, unless it is held down,
 // when the image shows under the ink copies.
 void PaintImage(const ButtonLook &b) {
-    if (!b.pressed && b.disabled) return;
+    if ((!b.pressed && b.disabled) || b.contrast) return;
     int sourceX = 0, sourceY = 0;
     SourceOfImage(b.imageIndex, &sourceX, &sourceY);
     BitBlt(targetDC, b.x + b.imageX, b.y + b.imageY, b.iw, b.ih, stripDC, sourceX, sourceY, SRCCOPY);
 }
 
 // Every image pixel that is neither face nor highlight, flat: light one pixel
-// down right for a disabled button, then dark.
+// down right for a disabled button, then dark. Outside the system's scheme the
+// ink is one colour with no emboss: in high contrast every glyph in every
+// state, in the dark scheme a disabled or mixed one.
 void PaintInk(const ButtonLook &b) {
-    if (!b.disabled && !b.mixed) return;
+    if (!b.disabled && !b.mixed && !b.contrast) return;
     BuildButtonMask(b.imageIndex, b.imageX, b.imageY, 1, 0);
     MaskColorsScope colors(targetDC);
+    if (schemeActive != QBR_SCHEME_SYSTEM) {
+        SolidBrush ink(InkOf(b));
+        MaskedBrushBlt(b.x, b.y, b.bw - 2, b.bh - 2, ink, kBrushWhereMaskClear);
+        return;
+    }
     if (b.disabled) {
         SolidBrush light(colorHighlight);
         MaskedBrushBlt(b.x + 1, b.y + 1, b.bw - 2, b.bh - 2, light, kBrushWhereMaskClear);
@@ -261,7 +286,16 @@ void PaintInk(const ButtonLook &b) {
 // left alone. The brush origin stays the target's, so neighbouring buttons
 // show one unbroken pattern.
 void PaintDither(const ButtonLook &b) {
-    if (!b.on && !b.mixed) return;
+    if (b.framed) {
+        // Two pixels, the ring and the line inside it, in the selection
+        // colour (grey text for a disabled button): the glyph stays clear.
+        const COLORREF color = SchemeColor(b.disabled ? SC_GRAYTEXT : SC_SELECTION);
+        FillSolidBox(targetDC, b.x - 1, b.y - 1, b.w + 2, 2, color);
+        FillSolidBox(targetDC, b.x - 1, b.y + b.h - 1, b.w + 2, 2, color);
+        FillSolidBox(targetDC, b.x - 1, b.y - 1, 2, b.h + 2, color);
+        FillSolidBox(targetDC, b.x + b.w - 1, b.y - 1, 2, b.h + 2, color);
+    }
+    if ((!b.on && !b.mixed) || b.contrast) return;
     SelectScope select(targetDC, ditherBrush);
     if (!select.Selected()) return;
     // This mask is laid down at (x + 1, y + 1), hence one pixel up and left
@@ -275,6 +309,7 @@ void PaintDither(const ButtonLook &b) {
 
 // The label under the image, centred, in the target's own text colour.
 void PaintLabel(const ButtonLook &b, UINT id) {
+    if (schemeActive != QBR_SCHEME_SYSTEM) SetTextColor(targetDC, InkOf(b));
     BkModeScope transparent(targetDC, TRANSPARENT);
     SelectScope font(targetDC, buttonFont);
     char text[kHelpTextSize + 2];
@@ -318,7 +353,8 @@ void PaintFocusRect(const RECT *rect) {
     const int inset = PassMetrics().focusInset;
     InflateRect(&focus, -inset, -inset);
     // The dots invert what lies under them, black and white being the
-    // colours the platform's own controls draw them with.
+    // colours the platform's own controls draw them with; inverted, they
+    // show on every scheme's face (as the drag frame, inverted on the screen).
     MaskColorsScope colors(targetDC);
     DrawFocusFrame(targetDC, &focus, PassMetrics());
 }
@@ -348,4 +384,28 @@ void DrawFocusFrame(HDC dc, const RECT *rect, const ScaledMetrics &metrics) {
     }
     GdiDelete(brush);
     GdiDelete(pattern);
+}
+
+void PaintMenuImage(ToolbarManager *manager, HDC dc, int width, int height, UINT imageIndex) {
+    if (!BeginButtonPaint(manager, dc)) return;
+    UINT column = 0, row = 0;
+    StripCellOf(imageIndex, &column, &row);
+    const int sourceX = static_cast<int>(column) * width, sourceY = static_cast<int>(row) * height;
+    if (schemeActive == QBR_SCHEME_SYSTEM) {
+        BitBlt(dc, 0, 0, width, height, stripDC, sourceX, sourceY, SRCCOPY);
+    } else {
+        // The menu is the system's, in its colours whatever the scheme: the
+        // glyph goes onto them as one ink, as in high contrast.
+        FillSolidBox(dc, 0, 0, width, height, GetSysColor(COLOR_MENU));
+        PatBlt(maskDC, 0, 0, width, height, WHITENESS);
+        SetBkColor(stripDC, stripFaceColor);
+        BitBlt(maskDC, 0, 0, width, height, stripDC, sourceX, sourceY, SRCCOPY);
+        SetBkColor(stripDC, stripHighlightColor);
+        BitBlt(maskDC, 0, 0, width, height, stripDC, sourceX, sourceY, SRCPAINT);
+        MaskColorsScope colors(dc);
+        SolidBrush ink(GetSysColor(COLOR_MENUTEXT));
+        SelectScope select(dc, ink);
+        if (select.Selected()) BitBlt(dc, 0, 0, width, height, maskDC, 0, 0, kBrushWhereMaskClear);
+    }
+    EndButtonPaint();
 }

@@ -13,6 +13,8 @@ COLORREF colorFace = 0;
 COLORREF colorShadow = 0;
 COLORREF colorFrame = 0;
 HBRUSH ditherBrush = nullptr;
+COLORREF stripFaceColor = 0;
+COLORREF stripHighlightColor = 0;
 
 namespace {
 
@@ -28,14 +30,28 @@ constexpr UINT kStripColors = 16;
 // is tried only on a newer system, and it is the last one.
 struct KeyColor {
     DWORD key;
-    int systemColor;
+    UINT role; // the scheme's colour it stands for
 };
 constexpr KeyColor kKeyColors[] = {
-    {0x00000000, COLOR_BTNTEXT},      // black
-    {0x00808080, COLOR_BTNSHADOW},    // grey
-    {0x00C0C0C0, COLOR_BTNFACE},      // light grey
-    {0x00FFFFFF, COLOR_BTNHIGHLIGHT}, // white, newer systems only
+    {0x00000000, SC_TEXT},      // black
+    {0x00808080, SC_STRIPGREY}, // grey
+    {0x00C0C0C0, SC_FACE},      // light grey
+    {0x00FFFFFF, SC_HIGHLIGHT}, // white, newer systems only
 };
+
+// A colour that is no key keeps its hue in a dark scheme but is lightened,
+// a tenth of the way to white at a time, until it stands 3:1 against the
+// face and the light squares of the dither of a button that is on: the dark
+// blue of a "?" would vanish on a dark button otherwise.
+DWORD ReadableOnFace(DWORD entry, COLORREF face, COLORREF light) {
+    COLORREF color = RGB((entry >> 16) & 0xFF, (entry >> 8) & 0xFF, entry & 0xFF);
+    for (int step = 0; step < 10 && (ContrastRatio(color, face) < 3.0 || ContrastRatio(color, light) < 3.0); ++step)
+        color = RGB(GetRValue(color) + (255 - GetRValue(color) + 9) / 10,
+                    GetGValue(color) + (255 - GetGValue(color) + 9) / 10,
+                    GetBValue(color) + (255 - GetBValue(color) + 9) / 10);
+    return (static_cast<DWORD>(GetRValue(color)) << 16) | (static_cast<DWORD>(GetGValue(color)) << 8) |
+           GetBValue(color);
+}
 
 // A COLORREF holds 0x00BBGGRR; a colour-table entry read as a word is
 // 0x00RRGGBB with a zero reserved byte.
@@ -72,7 +88,7 @@ UINT PaintResourcesStart() {
     buttonFont = MakePointFont(8, VARIABLE_PITCH | FF_SWISS, nullptr);
     stripDC = GdiTrackDC(CreateCompatibleDC(nullptr));
     maskDC = GdiTrackDC(CreateCompatibleDC(nullptr));
-    return RefreshPaintColors() ? 1 : 0;
+    return ApplyColorScheme(schemeChoice) ? 1 : 0;
 }
 
 void PaintResourcesEnd() {
@@ -86,14 +102,20 @@ void PaintResourcesEnd() {
     maskDC = nullptr;
     GdiDelete(ditherBrush);
     ditherBrush = nullptr;
+    SchemeResourcesEnd();
 }
 
 UINT RefreshPaintColors() {
-    // Older systems draw the light edge in plain white whatever the scheme.
-    colorHighlight = newerSystem ? GetSysColor(COLOR_BTNHIGHLIGHT) : RGB(255, 255, 255);
-    colorFace = GetSysColor(COLOR_BTNFACE);
-    colorShadow = GetSysColor(COLOR_BTNSHADOW);
-    colorFrame = GetSysColor(COLOR_WINDOWFRAME);
+    // Older systems draw the light edge in plain white whatever the system's
+    // scheme; the library's own schemes have their own.
+    const bool system = schemeActive == QBR_SCHEME_SYSTEM;
+    colorHighlight = newerSystem || !system ? SchemeColor(SC_HIGHLIGHT) : RGB(255, 255, 255);
+    colorFace = SchemeColor(SC_FACE);
+    colorShadow = SchemeColor(SC_SHADOW);
+    colorFrame = SchemeColor(SC_FRAME);
+    const bool stored = schemeActive == QBR_SCHEME_HIGHCONTRAST;
+    stripFaceColor = stored ? RGB(192, 192, 192) : colorFace;
+    stripHighlightColor = stored ? RGB(255, 255, 255) : colorHighlight;
 
     if (ditherBrush) {
         GdiDelete(ditherBrush);
@@ -272,13 +294,19 @@ HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource) {
     info.header.biSize = sizeof(BITMAPINFOHEADER); // the copy's table follows at once
     const BYTE *bits = start + sizeof(BITMAPINFOHEADER) + (static_cast<size_t>(4) << info.header.biBitCount);
 
+    // In high contrast the strip keeps its stored colours: every glyph is
+    // drawn through its mask in one colour (paint/button.cpp).
+    const bool recolour = schemeActive != QBR_SCHEME_HIGHCONTRAST;
     for (DWORD &entry : info.colors) {
-        for (UINT row = 0; row < rowsToTry; ++row) {
+        bool key = false;
+        for (UINT row = 0; recolour && row < rowsToTry; ++row) {
             if (entry == kKeyColors[row].key) {
-                entry = TableEntryOf(GetSysColor(kKeyColors[row].systemColor));
+                entry = TableEntryOf(SchemeColor(kKeyColors[row].role));
+                key = true;
                 break;
             }
         }
+        if (!key && schemeActive == QBR_SCHEME_DARK) entry = ReadableOnFace(entry, colorFace, colorHighlight);
     }
 
     const int width = info.header.biWidth;

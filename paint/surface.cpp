@@ -10,7 +10,8 @@ void FillBox(HDC dc, const RECT &box, COLORREF color) {
     FillSolidBox(dc, box.left, box.top, box.right - box.left, box.bottom - box.top, color);
 }
 
-// The dash of the close box keeps these colours on every scheme.
+// The dash of the close box keeps these colours on every scheme: a white
+// dash outlined in black reads on a light face and a dark one alike.
 constexpr COLORREF kDashShadow = RGB(128, 128, 128);
 constexpr COLORREF kDashOutline = RGB(0, 0, 0);
 constexpr COLORREF kDashFace = RGB(255, 255, 255);
@@ -32,13 +33,13 @@ void PaintFloatingCaption(HWND window, HDC dc) {
     rect.bottom = captionHeight;
     {
         // Active caption colour whether the frame is active or not.
-        SolidBrush band(GetSysColor(COLOR_ACTIVECAPTION));
+        SolidBrush band(SchemeColor(SC_CAPTION));
         FillRect(dc, &rect, band);
     }
     {
         // The frame's left, top and right sides fall outside the client area:
         // only its bottom, the line under the band, is seen.
-        SolidBrush line(GetSysColor(COLOR_WINDOWFRAME));
+        SolidBrush line(SchemeColor(SC_FRAME));
         --rect.left;
         --rect.top;
         ++rect.right;
@@ -56,7 +57,7 @@ void PaintFloatingCaption(HWND window, HDC dc) {
             SelectScope font(dc, captionFont);
             SIZE extent = {0, 0};
             GetTextExtentPointA(dc, text, copied, &extent);
-            TextColorScope color(dc, GetSysColor(COLOR_CAPTIONTEXT));
+            TextColorScope color(dc, SchemeColor(SC_CAPTIONTEXT));
             // Drawn after the line and one pixel above the client area, so
             // descenders reach over the line; a title wider than the frame
             // starts left of it, and the close box covers that end.
@@ -74,10 +75,10 @@ void PaintCloseBox(HWND window, HDC dc) {
     CloseBoxRect(window, &box);
     // What stays of the edge colour is a line at the right and at the
     // bottom, the bottom one over the band's line.
-    FillBox(dc, box, GetSysColor(COLOR_WINDOWFRAME));
+    FillBox(dc, box, SchemeColor(SC_FRAME));
     --box.right;
     --box.bottom;
-    FillBox(dc, box, GetSysColor(COLOR_BTNFACE));
+    FillBox(dc, box, SchemeColor(SC_FACE));
     if (captionHeight < kMinDashCaption) return;
 
     // A white dash with a black outline and a grey shadow to the lower right.

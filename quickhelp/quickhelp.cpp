@@ -8,6 +8,7 @@
 
 #include "core/core.h"
 #include "core/gdi.h"
+#include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
 UINT_PTR helpTimer = 0;
@@ -24,7 +25,6 @@ constexpr UINT kHelpPeriod = 200;
 
 // The tip's offsets (kTipBelowCursor and the rest, in core/metrics.h) are
 // those of the display scale of the toolbar it stands for.
-constexpr COLORREF kTipBackground = RGB(255, 255, 128);
 
 // Help text buffers hold kHelpTextSize characters and the terminator, with
 // room to spare.
@@ -135,8 +135,9 @@ void QuickHelpPaint(HWND window) {
     GetClientRect(window, &client);
     ++client.right;
     ++client.bottom;
-    SolidBrush background(kTipBackground);
+    SolidBrush background(SchemeColor(SC_TIP));
     FillRect(dc, &client, background);
+    SetTextColor(dc, SchemeColor(SC_TIPTEXT));
     ExtTextOutA(dc, tipTextAt.x, tipTextAt.y, 0, nullptr, text, static_cast<UINT>(length), nullptr);
 }
 

@@ -379,6 +379,27 @@ TEST_F(CustomizeTest, InsertListDrawsButtonPicturesOnLinesOfButtonSize) {
     QBR_SetButtonText(0);
 }
 
+// In the dark scheme the dialog, its list and a plain line of it are dark, and
+// the button's picture is still drawn in the line.
+TEST_F(CustomizeTest, TheInsertDialogTakesTheDarkScheme) {
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_DARK));
+    COLORREF dialogGround = 0, plainCorner = 0, listBelow = 0;
+    ModalSteps::Add([&] {
+        HWND list = GetDlgItem(InsertDialog(), 5003);
+        Pixels pixels = ReadWindowPixels(list);
+        RECT second;
+        SendMessageA(list, LB_GETITEMRECT, 1, reinterpret_cast<LPARAM>(&second));
+        plainCorner = pixels.At(second.left + 1, second.top + 1);
+        listBelow = pixels.At(pixels.width / 2, pixels.height - 2); // past the last line
+        dialogGround = ReadWindowPixels(InsertDialog()).At(2, 2);
+        PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0);
+    });
+    RunInsertDialog();
+    QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
+    for (COLORREF c : {dialogGround, plainCorner, listBelow})
+        EXPECT_LT(GetRValue(c) + GetGValue(c) + GetBValue(c), 3 * 64) << std::hex << c;
+}
+
 // Drags out of the list with the real cursor, one dialog session: each drag
 // is press, two moves and a release, each handled before the next.
 TEST_F(CustomizeTest, DragFromListInsertsAtTheDropPointOnly) {

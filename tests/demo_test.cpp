@@ -141,7 +141,8 @@ TEST_F(DemoResources, MenusListTheirCommandsInOrder) {
         std::string expected;
     } const menus[] = {
         {"Main", std::string(kFileMenu) + kEditMenu +
-                     "[&View: 122 &Open Another Window;---;120 &Quick Help;121 &Button Text;]" + kStyleMenu +
+                     "[&View: 122 &Open Another Window;---;120 &Quick Help;121 &Button Text;"
+                     "[&Colours: 130 &Follow the System;131 &System Colours;132 &Dark;133 &High Contrast;]]" + kStyleMenu +
                      "[&Palette: 201 &Eraser;202 &Pen;203 &Selection;204 &Brush;205 Spra&y;206 P&aint;207 &Line;"
                      "208 E&yedrop;209 &Magnify;210 &Rectangle;211 Ro&und Rectangle;212 &Oval;]" +
                      kHelpMenu},

@@ -2,6 +2,8 @@
 // program three times: in the build folder's own prefix (96 DPI) and in its
 // 144- and 192-DPI prefixes (dpi144_dpi_test, dpi192_dpi_test), with
 // QBR_EXPECT_DPI telling it which scale it was started for.
+#include <cmath>
+#include <set>
 #include <algorithm>
 #include <cstdlib>
 
@@ -584,6 +586,111 @@ TEST_F(ScaleTest, TheFocusRectangleLinesGrowWithTheFramesScale) {
     }
     EXPECT_EQ(expected, dotted);
     AccessLeaveKeyboard();
+}
+
+// ---- Colour schemes at this scale ---------------------------------------------------
+
+namespace {
+
+// The WCAG contrast ratio of two colours.
+double Contrast(COLORREF a, COLORREF b) {
+    auto luminance = [](COLORREF c) {
+        double sum = 0;
+        const double weights[3] = {0.2126, 0.7152, 0.0722};
+        const int channels[3] = {GetRValue(c), GetGValue(c), GetBValue(c)};
+        for (int i = 0; i < 3; ++i) {
+            const double v = channels[i] / 255.0;
+            sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
+        }
+        return sum;
+    };
+    const double la = luminance(a), lb = luminance(b);
+    return (std::max(la, lb) + 0.05) / (std::min(la, lb) + 0.05);
+}
+
+// The weakest pair of a set of ink colours against a set of background colours.
+double Weakest(const std::set<COLORREF> &ink, const std::set<COLORREF> &back) {
+    double weakest = 21;
+    for (COLORREF i : ink)
+        for (COLORREF b : back)
+            weakest = std::min(weakest, Contrast(i, b));
+    return ink.empty() || back.empty() ? 0 : weakest;
+}
+
+} // namespace
+
+// Every state of a button, with and without its label, in the dark and the
+// high-contrast scheme, read back from the pane: each glyph pixel against
+// every colour the glyph's background shows (the face, the dither's squares,
+// an inverted face) at least 3:1, and the label's strongest pixel against
+// that background at least 4.5:1. Ink and background are told apart by the
+// stored strip, which the high-contrast scheme loads with its own colours.
+TEST_F(ScaleTest, EveryStateReadsClearlyInTheDarkAndHighContrastSchemes) {
+    AddButtons(7, 2);
+    // Room for eight labelled buttons in one row at 200 %.
+    SetWindowPos(frame, nullptr, 0, 0, 1000, 300, SWP_NOZORDER | SWP_NOACTIVATE);
+    const struct {
+        const char *name;
+        UINT bits;
+    } states[] = {{"normal", 0},           {"pressed", BS_PRESSED},          {"on", BS_ON},
+                  {"on pressed", BS_ON | BS_PRESSED}, {"mixed", BS_MIXED},   {"disabled", BS_DISABLED},
+                  {"disabled on", BS_DISABLED | BS_ON}, {"disabled mixed", BS_DISABLED | BS_MIXED}};
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_HIGHCONTRAST));
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    const Pixels stored = BitmapPixels(manager->imageStrip);
+    const int f = static_cast<int>(manager->imageFactor);
+    int cw = 0, ch = 0;
+    StripCellSize(manager, &cw, &ch);
+    const int columns = stored.width / (cw / f);
+    for (UINT scheme : {QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST})
+        for (UINT text : {0u, 1u}) {
+            SCOPED_TRACE(std::string(scheme == QBR_SCHEME_DARK ? "dark" : "high contrast") + (text ? ", labels" : ""));
+            QBR_SetColorScheme(scheme);
+            QBR_SetButtonText(text);
+            HWND pane = Make({1, 2, 3, 4, 5, 6, 7, 8}, TBF_VISIBLE | TBF_DOCKED);
+            for (UINT i = 0; i < 8; ++i) {
+                const UINT id = i + 1, bits = states[i].bits;
+                QBR_SetButtonState(manager, id, (bits & BS_ON) ? 1 : (bits & BS_MIXED) ? 2 : 0);
+                QBR_SetButtonEnabled(manager, id, (bits & BS_DISABLED) ? 0 : 1);
+                QBR_SetButtonPressed(manager, id, (bits & BS_PRESSED) ? 1 : 0);
+            }
+            Pump();
+            RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+            const Pixels shown = ReadWindowPixels(pane);
+            const std::vector<RECT> rects = ItemRects(pane);
+            const ScaledMetrics &m = ManagerMetrics(manager);
+            for (UINT i = 0; i < 8; ++i) {
+                SCOPED_TRACE(states[i].name);
+                UINT image = 0;
+                QBR_GetButtonImage(manager, i + 1, &image);
+                const int sx = static_cast<int>(image % columns) * (cw / f), sy = static_cast<int>(image / columns) * (ch / f);
+                const RECT &r = rects[i];
+                const int w = r.right - r.left - 2, h = r.bottom - r.top - 2;
+                const int sunk = (states[i].bits & (BS_ON | BS_PRESSED)) ? 1 : 0;
+                const int ix = r.left + 1 + ((w - cw - 1) >> 1) + sunk;
+                const int iy = r.top + 1 + (text ? m.labelImageTop : (h - ch) >> 1) + sunk;
+                std::set<COLORREF> ink, back;
+                for (int y = 0; y < ch; ++y)
+                    for (int x = 0; x < cw; ++x) {
+                        const COLORREF was = stored.At(sx + x / f, sy + y / f), now = shown.At(ix + x, iy + y);
+                        if (was == RGB(192, 192, 192))
+                            back.insert(now);
+                        else if (was != RGB(255, 255, 255))
+                            ink.insert(now);
+                    }
+                EXPECT_GE(Weakest(ink, back), 3.0) << "glyph";
+                if (!text) continue;
+                double strongest = 0; // the label's core against every background colour
+                for (int y = iy + ch; y < r.bottom - 1; ++y)
+                    for (int x = r.left + 3; x < r.right - 3; ++x)
+                        if (!back.count(shown.At(x, y))) strongest = std::max(strongest, Weakest({shown.At(x, y)}, back));
+                EXPECT_GE(strongest, 4.5) << "label";
+            }
+            QBR_DestroyToolbar(pane);
+            Pump();
+        }
+    QBR_SetButtonText(0);
+    QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
 }
 
 // ---- Rows, places and the screen across scales -------------------------------------

@@ -8,6 +8,7 @@
 // at y 10 and a grey row at y 11 (x 4..11), and in cell n a blue pixel at
 // (n, 13). Colours are the system's, read at run time.
 #include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -981,3 +982,152 @@ TEST_F(PaintTest, TextModeImageStandsFivePixelsDown) {
 }
 
 } // namespace
+
+// ---- Colour schemes ----------------------------------------------------------------
+
+namespace {
+
+double Luminance(COLORREF c) {
+    double sum = 0;
+    const double weights[3] = {0.2126, 0.7152, 0.0722};
+    const int channels[3] = {GetRValue(c), GetGValue(c), GetBValue(c)};
+    for (int i = 0; i < 3; ++i) {
+        const double v = channels[i] / 255.0;
+        sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
+    }
+    return sum;
+}
+
+// The user's app mode in this test's own prefix, put back as it was.
+class AppMode {
+  public:
+    AppMode() {
+        RegCreateKeyExA(HKEY_CURRENT_USER, kKey, 0, nullptr, 0, KEY_ALL_ACCESS, nullptr, &key_, nullptr);
+        DWORD size = sizeof(saved_);
+        had_ = RegQueryValueExA(key_, "AppsUseLightTheme", nullptr, nullptr, reinterpret_cast<BYTE *>(&saved_),
+                                &size) == ERROR_SUCCESS;
+    }
+    ~AppMode() {
+        if (had_)
+            Set(saved_ == 0);
+        else
+            RegDeleteValueA(key_, "AppsUseLightTheme");
+        RegCloseKey(key_);
+    }
+    void Set(bool dark) {
+        DWORD light = dark ? 0 : 1;
+        RegSetValueExA(key_, "AppsUseLightTheme", 0, REG_DWORD, reinterpret_cast<const BYTE *>(&light), sizeof(light));
+    }
+    void Remove() { RegDeleteValueA(key_, "AppsUseLightTheme"); }
+
+  private:
+    static constexpr const char *kKey = "Software\\Microsoft\\Windows\\CurrentVersion\\Themes\\Personalize";
+    HKEY key_ = nullptr;
+    DWORD saved_ = 1;
+    bool had_ = false;
+};
+
+// What a frame shows: its pane, the dock, a floating frame, and where
+// everything stands.
+struct Shown {
+    Pixels pane, dock, floating;
+    std::vector<RECT> places;
+    std::vector<UINT> states;
+};
+
+} // namespace
+
+// Each scheme, read back from a docked pane, its dock and a floating frame:
+// the dark one dark with light ink, high contrast white ink and lines on black,
+// and in both every surface the library paints takes the scheme's face.
+TEST_F(SurfaceTest, EverySurfaceTakesTheScheme) {
+    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
+    HWND floating = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
+    const int glyphX = kAreaLeft + 3 + 6, glyphY = kPaneAreaTop + 3 + 5; // black ink of the first image
+    for (UINT scheme : {QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST}) {
+        SCOPED_TRACE(scheme == QBR_SCHEME_DARK ? "dark" : "high contrast");
+        ASSERT_EQ(1u, QBR_SetColorScheme(scheme));
+        EXPECT_EQ(scheme, QBR_GetActiveColorScheme());
+        Pump();
+        const Pixels px = ReadWindowPixels(pane), dock = ReadWindowPixels(top), fl = ReadWindowPixels(floating);
+        const COLORREF face = px.At(2, 1), ink = px.At(glyphX, glyphY);
+        if (scheme == QBR_SCHEME_HIGHCONTRAST) {
+            EXPECT_EQ(Hex(kBlack), Hex(face));
+            EXPECT_EQ(Hex(kWhite), Hex(ink)) << "glyph ink";
+            EXPECT_EQ(Hex(kWhite), Hex(px.At(kAreaLeft + 5, kPaneAreaTop))) << "the ring around a button";
+            EXPECT_EQ(Hex(kWhite), Hex(px.At(kAreaLeft + 3 + 1, kPaneAreaTop + 3 + 1))) << "red too is drawn in the text colour";
+        } else {
+            EXPECT_LT(Luminance(face), 0.05) << Hex(face);
+            EXPECT_GT(Luminance(ink), 0.7) << Hex(ink);
+        }
+        RECT client;
+        GetClientRect(frame, &client);
+        const int dockX = std::min(dock.width, static_cast<int>(client.right)) - 2; // right of the pane
+        EXPECT_EQ(Hex(face), Hex(dock.At(dockX, 1))) << "the dock's surface";
+        EXPECT_NE(Hex(face), Hex(dock.At(dockX, dock.height - 1))) << "the dock's line";
+        EXPECT_EQ(Hex(face), Hex(fl.At(fl.width - 2, fl.height - 2))) << "the floating frame's surface";
+        EXPECT_EQ(Hex(face), Hex(fl.At(1, 1))) << "inside the close box";
+        EXPECT_LT(Luminance(fl.At(fl.width - 2, 1)), 0.05) << "the caption band";
+    }
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_SYSTEM));
+    EXPECT_EQ(0u, QBR_SetColorScheme(QBR_SCHEME_FOLLOW + 1));
+}
+
+// Following the system through the user's app mode, switched live: one
+// WM_SETTINGCHANGE ("ImmersiveColorSet") passed on repaints the pane, the dock
+// and the floating frame dark and back to exactly what they were, while rows,
+// places and states stay; another setting's change does nothing.
+TEST_F(SurfaceTest, FollowingTheAppModeSwitchesLive) {
+    AppMode mode;
+    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
+    HWND floating = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
+    QBR_SetButtonState(manager, 2, 1);
+    QBR_SetButtonEnabled(manager, 3, 0);
+    auto show = [&] {
+        Pump();
+        Shown s{ReadWindowPixels(pane), ReadWindowPixels(top), ReadWindowPixels(floating), {}, {}};
+        for (HWND w : {pane, top, floating}) {
+            RECT r;
+            GetWindowRect(w, &r);
+            s.places.push_back(r);
+        }
+        for (UINT id = 1; id <= 3; ++id) {
+            RECT r;
+            GetItemRect(RecordOfWindow(pane), id - 1, &r);
+            s.places.push_back(r);
+            s.states.push_back(QBR_GetButtonState(manager, id) | (QBR_IsButtonEnabled(manager, id) << 4));
+        }
+        return s;
+    };
+    auto samePlaces = [](const Shown &a, const Shown &b) {
+        for (size_t i = 0; i < a.places.size(); ++i)
+            if (!EqualRect(&a.places[i], &b.places[i])) return false;
+        return a.places.size() == b.places.size() && a.states == b.states;
+    };
+    const LPARAM immersive = reinterpret_cast<LPARAM>("ImmersiveColorSet");
+    mode.Remove();
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_FOLLOW));
+    EXPECT_EQ(QBR_SCHEME_SYSTEM, QBR_GetActiveColorScheme()) << "no value is the light mode";
+    const Shown light = show();
+    EXPECT_EQ(Hex(colors.face), Hex(light.pane.At(2, 1)));
+
+    mode.Set(true);
+    EXPECT_EQ(0u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, reinterpret_cast<LPARAM>("intl")));
+    EXPECT_EQ(QBR_SCHEME_SYSTEM, QBR_GetActiveColorScheme()) << "another setting";
+    EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, immersive));
+    EXPECT_EQ(QBR_SCHEME_DARK, QBR_GetActiveColorScheme());
+    const Shown dark = show();
+    EXPECT_TRUE(samePlaces(light, dark));
+    EXPECT_GT(Luminance(dark.pane.At(kAreaLeft + 3 + 6, kPaneAreaTop + 3 + 5)), 0.7) << "the strip, loaded again";
+    for (const Pixels *p : {&dark.pane, &dark.dock, &dark.floating})
+        EXPECT_LT(Luminance(p->At(p->width - 2, p->height - 3)), 0.05) << Hex(p->At(p->width - 2, p->height - 3));
+
+    mode.Set(false);
+    EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SYSCOLORCHANGE, 0, 0));
+    const Shown back = show();
+    EXPECT_TRUE(samePlaces(light, back));
+    EXPECT_TRUE(light.pane.colors == back.pane.colors && light.dock.colors == back.dock.colors &&
+                light.floating.colors == back.floating.colors)
+        << "the system's look again, to the pixel";
+    QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
+}

@@ -2,6 +2,7 @@
 // size and paint, the poll that follows the cursor from toolbar to toolbar and
 // stops when it leaves the buttons or a mouse button goes down, and the tip's
 // safety when its manager or client goes away.
+#include <algorithm>
 #include <functional>
 #include <map>
 #include <string>
@@ -459,3 +460,25 @@ TEST_F(QuickHelpTest, TheTipIsItsTextAtTwoOneInMsSansSerif) {
 }
 
 } // namespace
+
+// A tip on show follows a change of colour scheme at once: dark ground with
+// light text in the dark scheme, the yellow again under the system's.
+TEST_F(QuickHelpTest, AShownTipTakesTheColourSchemeLive) {
+    Hover(pane, At(pane, 0));
+    ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
+    auto lightest = [](const Pixels &px) {
+        int most = 0;
+        for (COLORREF c : px.colors)
+            most = std::max(most, GetRValue(c) + GetGValue(c) + GetBValue(c));
+        return most;
+    };
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_DARK));
+    Pump();
+    const Pixels dark = ReadWindowPixels(Help());
+    const COLORREF ground = dark.At(0, 0);
+    EXPECT_LT(GetRValue(ground) + GetGValue(ground) + GetBValue(ground), 3 * 64) << "a dark ground";
+    EXPECT_GT(lightest(dark), 3 * 200) << "light text";
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_SYSTEM));
+    Pump();
+    EXPECT_EQ(kTipYellow, ReadWindowPixels(Help()).At(0, 0));
+}

@@ -85,13 +85,24 @@ void PaintChevron(HWND window, HDC dc) {
     RECT rect;
     if (!record || window != record->paneWindow || !ChevronRect(record, &rect)) return;
     {
-        SolidBrush face(GetSysColor(COLOR_BTNFACE));
+        SolidBrush face(SchemeColor(SC_FACE));
         FillRect(dc, &rect, face);
     }
-    // A raised edge, as a button's, so that it reads as one.
+    // A raised edge, as a button's, so that it reads as one: the platform's
+    // own under the system's scheme, else one pixel of the scheme's edges.
     RECT edge = rect;
     InflateRect(&edge, 0, -2);
-    DrawEdge(dc, &edge, BDR_RAISEDINNER, BF_RECT);
+    if (schemeActive == QBR_SCHEME_SYSTEM) {
+        DrawEdge(dc, &edge, BDR_RAISEDINNER, BF_RECT);
+    } else {
+        const int w = edge.right - edge.left, h = edge.bottom - edge.top;
+        const COLORREF light = SchemeColor(schemeActive == QBR_SCHEME_HIGHCONTRAST ? SC_FRAME : SC_HIGHLIGHT);
+        const COLORREF dark = SchemeColor(schemeActive == QBR_SCHEME_HIGHCONTRAST ? SC_FRAME : SC_SHADOW);
+        FillSolidBox(dc, edge.left, edge.top, w, 1, light);
+        FillSolidBox(dc, edge.left, edge.top, 1, h, light);
+        FillSolidBox(dc, edge.left, edge.bottom - 1, w, 1, dark);
+        FillSolidBox(dc, edge.right - 1, edge.top, 1, h, dark);
+    }
     // The » drawn as two arrow heads, pointing the way the toolbar is cut
     // (right across a row, down along a column), with pixels rather than a
     // font's glyph, so that it looks the same under every font:
@@ -110,7 +121,7 @@ void PaintChevron(HWND window, HDC dc) {
     // number of pixels, so that it stays as sharp as the images.
     const int cx = (rect.left + rect.right) / 2, cy = (rect.top + rect.bottom) / 2;
     const int px = ManagerMetrics(ManagerOfToolbar(window)).chevronPixel;
-    const COLORREF ink = GetSysColor(COLOR_BTNTEXT);
+    const COLORREF ink = SchemeColor(SC_TEXT);
     for (int head = 0; head < 2; ++head)
         for (int i = 0; i < 4; ++i) {
             const int along = (-4 + 4 * head + i) * px; // towards the cut

@@ -13,11 +13,12 @@ void PaintToolbar(HWND window) {
     HDC dc = paint;
     if (!dc) return;
 
-    // The surface reads the system colour at every paint; the buttons keep
-    // the colours fixed when the library started.
+    // The surface reads the scheme's face at every paint (under the system's
+    // scheme, the system colour); the buttons keep the colours fixed when the
+    // scheme was last taken.
     const RECT &update = paint.UpdateRect();
     FillSolidBox(dc, update.left, update.top, update.right - update.left, update.bottom - update.top,
-                 GetSysColor(COLOR_BTNFACE));
+                 SchemeColor(SC_FACE));
     if (IsFloatingFrame(target)) PaintFloatingCaption(target, dc);
     if (BeginButtonPaint(manager, dc)) {
         PaintToolbarItems(ResolveRoleWindow(window, ROLE_DOCKED));

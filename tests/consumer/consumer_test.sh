@@ -68,7 +68,7 @@ package)
     mkdir -p plain
     x86_64-w64-mingw32-windres -I "$source_dir/demo/images" "$here/host.rc" -O coff -o plain/host-res.o
     x86_64-w64-mingw32-gcc -mwindows -I "$prefix/include" "$here/host.c" plain/host-res.o "$prefix"/lib/quaybar/*.res \
-        -L "$prefix/lib" -lquaybar -lstdc++ -lgdi32 -luser32 -luuid -loleacc -loleaut32 -lole32 -lshell32 -static -o plain/host.exe
+        -L "$prefix/lib" -lquaybar -lstdc++ -lgdi32 -luser32 -ladvapi32 -luuid -loleacc -loleaut32 -lole32 -lshell32 -static -o plain/host.exe
     hosts="host/host.exe plain/host.exe"
     # Nor does the project's own build call Python, the demo's included.
     ! grep -rqiI --include='*.make' python "$build/CMakeFiles" "$build/demo" || fail "the project's build calls Python"
