@@ -634,7 +634,7 @@ TEST_F(AccessTest, ShiftF10AndTheMenuKeyOpenTheToolbarMenu) {
         Key(key);
         PumpHost(100);
         ModalSteps::Stop();
-        EXPECT_EQ("Tools*:201 | Other*:202 | -- | Insert Item...:101", seen);
+        EXPECT_EQ("Tools*:201 | Other*:202 | -- | Insert Item...:101 | -- | Lock the Toolbars:103", seen);
         Key("Esc");
     }
 }
@@ -722,7 +722,7 @@ TEST_F(AccessTest, KeysTheToolbarsDoNotUseGoOnToTheHost) {
         UINT used;
     } rows[] = {
         {WM_KEYDOWN, VK_CONTROL, 0}, {WM_KEYDOWN, 'S', 0}, {WM_KEYUP, 'S', 0},
-        {WM_KEYDOWN, VK_DELETE, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1},
+        {WM_KEYDOWN, VK_INSERT, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1},
     };
     for (const auto &row : rows) {
         MSG msg = {frame, row.message, row.key, 1, 0, {0, 0}};

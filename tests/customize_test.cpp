@@ -115,14 +115,19 @@ TEST(CustomizeTemplates, InsertAndNewToolbarTemplatesReadBackExactly) {
          148,
          "Insert Toolbar Item",
          {
-             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 5, 50, 69},
+             {-1, "static", "&Category:", kShown | WS_GROUP, 4, 2, 50, 8},
+             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 11, 50, 69},
+             {-1, "static", "&Find:", kShown | WS_GROUP, 4, 27, 50, 8},
+             {5009, "edit", "", kShown | ES_AUTOHSCROLL | WS_BORDER | WS_TABSTOP, 4, 36, 50, 12},
              {5003, "list box", "",
-              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL | WS_TABSTOP,
-              5, 19, 48, 124},
+              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_HASSTRINGS | LBS_NOINTEGRALHEIGHT | WS_BORDER |
+                  WS_VSCROLL | WS_TABSTOP,
+              5, 51, 48, 92},
              {-1, "button", "Description", kShown | BS_GROUPBOX, 62, 4, 123, 37},
              {5005, "static", "", kShown | WS_GROUP, 67, 17, 108, 17},
-             {1, "button", "Close", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 6, 44, 14},
+             {1, "button", "Close", kShown | WS_TABSTOP, 194, 6, 44, 14},
              {5007, "button", "&New...", kShown | WS_TABSTOP, 194, 25, 44, 14},
+             {5008, "button", "&Insert", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 44, 44, 14},
              {5002, "static",
               "At any time, items can be moved or removed from a toolbar by dragging with the right mouse "
               "button.To remove an item simply drag it off the toolbar.",
@@ -163,6 +168,7 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
     const std::string all = "Alpha*:201 | Beta:202 | Gamma*:203";
     const std::string insert = " | -- | Insert Item...:101";
     const std::string del = " | Delete Toolbar...:102";
+    const std::string lock = " | -- | Lock the Toolbars:103";
     struct Case {
         const char *name;
         std::function<void()> prepare;
@@ -170,18 +176,30 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
         std::string expected;
     };
     const Case cases[] = {
-        {"user's toolbar, pressed on its floating frame", [] {}, [&] { return FrameOf(gamma); }, all + insert + del},
-        {"host's toolbar", [] {}, [&] { return alpha; }, all + insert},
-        {"customising off", [] { QBR_SetCustomize(0); }, [&] { return gamma; }, all + del},
-        {"dock press, after a press on the user's toolbar", [] {}, [] { return HWND(nullptr); }, all + insert},
-        {"the check follows the flag, not the window", [&] { ShowWindow(alpha, SW_HIDE); }, [&] { return alpha; },
-         all + insert},
+        {"user's toolbar, pressed on its floating frame", [] {}, [&] { return FrameOf(gamma); },
+         all + insert + del + lock},
+        {"host's toolbar", [] {}, [&] { return alpha; }, all + insert + lock},
+        {"customising off", [] { QBR_SetCustomize(0); }, [&] { return gamma; }, all + del + lock},
+        {"dock press, after a press on the user's toolbar", [] {}, [] { return HWND(nullptr); }, all + insert + lock},
+        {"locked: checked, and a default arrangement offers the reset",
+         [&] {
+             QBR_SetLocked(1);
+             QBR_SetDefaultToolbars(manager, [](ToolbarManager *, HWND) -> UINT { return 1; });
+         },
+         [&] { return alpha; }, all + insert + " | -- | Lock the Toolbars*:103 | Reset Toolbars...:104"},
+        {"the check follows the flag, not the window",
+         [&] {
+             QBR_SetLocked(0);
+             QBR_SetDefaultToolbars(manager, nullptr);
+             ShowWindow(alpha, SW_HIDE);
+         },
+         [&] { return alpha; }, all + insert + lock},
         {"nothing shown: nothing to insert into",
          [&] {
              QBR_SetToolbarFlags(alpha, TBF_HIDDEN);
              QBR_SetToolbarFlags(gamma, TBF_HIDDEN);
          },
-         [&] { return gamma; }, "Alpha:201 | Beta:202 | Gamma:203" + del},
+         [&] { return gamma; }, "Alpha:201 | Beta:202 | Gamma:203" + del + lock},
     };
     ToolbarRecord *gammaRecord = RecordOfWindow(gamma);
     for (size_t i = 0; i < std::size(cases); ++i) {
