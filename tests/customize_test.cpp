@@ -35,6 +35,8 @@ std::vector<UINT> ListIds(HWND list) {
     return out;
 }
 
+UINT CALLBACK MakeNothing(ToolbarManager *, HWND) { return 1; }
+
 std::vector<std::string> ListTexts(HWND list) {
     std::vector<std::string> out;
     for (LRESULT i = 0; i < SendMessageA(list, LB_GETCOUNT, 0, 0); ++i) {
@@ -58,7 +60,10 @@ void Type(const std::string &keys) {
     };
     for (size_t i = 0; i < keys.size(); ++i) {
         const bool alt = keys[i] == '@';
-        if (alt) send(VK_MENU, false), ++i;
+        if (alt) {
+            send(VK_MENU, false);
+            ++i;
+        }
         const char c = keys[i];
         const WORD vk = c == '\b' ? VK_BACK : c == '\n' ? VK_RETURN : static_cast<WORD>(c);
         send(vk, false);
@@ -216,7 +221,7 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
         {"locked: checked, and a default arrangement offers the reset",
          [&] {
              QBR_SetLocked(1);
-             QBR_SetDefaultToolbars(manager, [](ToolbarManager *, HWND) -> UINT { return 1; });
+             QBR_SetDefaultToolbars(manager, MakeNothing);
          },
          [&] { return alpha; }, all + insert + " | -- | Lock the Toolbars*:103 | Reset Toolbars...:104"},
         {"the check follows the flag, not the window",
