@@ -33,6 +33,9 @@ void AccessWindowPosChanged(HWND window, const WINDOWPOS *pos);
 UINT AccessIsFocused(const ToolbarRecord *record, UINT index);
 // The keyboard's focus on a toolbar window's items: 1 and the index, or 0.
 UINT AccessFocusedIndex(HWND window, UINT *index);
+// The pane of the toolbar of `manager`'s frame that has the keyboard, and the
+// focused place in its list (its item count for the chevron); null if none.
+HWND AccessKeyboardToolbar(const ToolbarManager *manager, UINT *index);
 // The toolbars give the keyboard back (a mouse press, the frame deactivated).
 void AccessLeaveKeyboard();
 // The window system is about to activate `window` (the thread's CBT hook).

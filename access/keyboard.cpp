@@ -12,6 +12,9 @@
 //   Tab/Shift+Tab the next/previous shown toolbar
 //   Space/Enter   press on key down, release and command on key up
 //   Shift+F10, the context-menu key: the toolbar menu
+//   Ctrl+Left/Ctrl+Right, Delete: with customising on and the toolbars not
+//                 locked, the focused button moves one place that way (over
+//                 a separator it goes into the next group), or is removed
 //
 // Toolbars are taken in one order: the top dock, the left, the right, each in
 // its packing order, then the floating toolbars in the manager's order.
@@ -291,6 +294,57 @@ void NavigateKey(ToolbarRecord *record, UINT key) {
 }
 
 bool Shifted() { return GetKeyState(VK_SHIFT) < 0; }
+bool ControlDown() { return GetKeyState(VK_CONTROL) < 0; }
+
+// Whether the user may change the items of `record` from the keyboard now.
+bool MayEditItems(const ToolbarRecord *record) {
+    return QBR_GetCustomize() && !QBR_GetLocked() && !(RecordFlags(record) & TBF_LOCKED_ITEMS);
+}
+
+// Ctrl+Left and Ctrl+Right while items may change, and Delete: the keys that
+// customise. Otherwise Ctrl+arrow walks as the arrow does and Delete is the
+// host's.
+bool IsCustomizeKey(UINT key) {
+    if (key == VK_DELETE) return true;
+    return (key == VK_LEFT || key == VK_RIGHT) && ControlDown();
+}
+
+// The focused button steps over its neighbour `step` places away; the
+// separators left leading, trailing or doubled go as after a mouse move.
+// Readers hear the item leave its place and arrive at the new one, as from a
+// drag, and the focus follows the button.
+void MoveFocusedItem(ToolbarRecord *record, int step) {
+    const UINT from = keyFocus.index, count = PointerListCount(record->items);
+    if (AtChevron(record) || (step < 0 && from == 0) || (step > 0 && from + 1 >= count)) return;
+    ToolbarItem *item = ItemAt(record, from);
+    const UINT to = step < 0 ? from - 1 : from + 1;
+    if (!PointerListRemoveAt(record->items, from)) return;
+    PointerListInsertAt(record->items, to, ListValue(item));
+    CleanSeparators(record);
+    RefitToolbar(record->paneWindow, ROLE_BOTH);
+    UINT placed = to;
+    IndexOfItem(record, item, &placed);
+    AccessItemsEdited(record, EVENT_OBJECT_DESTROY, from);
+    AccessItemsEdited(record, EVENT_OBJECT_CREATE, placed);
+    MoveFocus(record, placed);
+}
+
+// The focused button leaves the toolbar (it stays in the catalog); the focus
+// goes to the button that took its place, else the one before, else on.
+void RemoveFocusedItem(ToolbarRecord *record) {
+    const UINT from = keyFocus.index;
+    ToolbarItem *item = AtChevron(record) ? nullptr : ItemAt(record, from);
+    if (!item || !RemoveItem(record, item)) return;
+    AccessItemsEdited(record, EVENT_OBJECT_DESTROY, from);
+    const UINT count = PointerListCount(record->items);
+    const UINT start = from < count ? from : (count ? count - 1 : 0);
+    UINT index = 0;
+    keyFocus.index = start; // the old place may be past the end now
+    if (StepToEnabled(record, start, 1, false, true, &index) || StepToEnabled(record, start, -1, false, true, &index))
+        MoveFocus(record, index);
+    else
+        MoveToToolbar(1);
+}
 
 // The keys the toolbars use while they have the keyboard. Any other key, a
 // host's accelerator such as Ctrl+S among them, goes on to the host's loop.
@@ -318,6 +372,14 @@ void OnKeyDown(UINT key, LPARAM lParam) {
     ToolbarRecord *record = FocusedRecord();
     if (!record) {
         LeaveKeyboard(Leave::GiveBack);
+        return;
+    }
+    if (IsCustomizeKey(key) && MayEditItems(record)) {
+        CancelKeyPress();
+        if (key == VK_DELETE)
+            RemoveFocusedItem(record);
+        else
+            MoveFocusedItem(record, key == VK_LEFT ? -1 : 1);
         return;
     }
     switch (key) {
@@ -416,7 +478,8 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
     }
     switch (msg->message) {
     case WM_KEYDOWN:
-        if (!IsToolbarKey(key)) return 0;
+        if (key == VK_DELETE && !(FocusedRecord() && MayEditItems(FocusedRecord()))) return 0;
+        if (!IsToolbarKey(key) && key != VK_DELETE) return 0;
         OnKeyDown(key, msg->lParam);
         return 1;
     case WM_KEYUP:
@@ -450,6 +513,12 @@ UINT AccessFocusedIndex(HWND window, UINT *index) {
     if (!keyFocus.host || !record || record->paneWindow != keyFocus.pane) return 0;
     if (index) *index = keyFocus.index;
     return 1;
+}
+
+HWND AccessKeyboardToolbar(const ToolbarManager *manager, UINT *index) {
+    if (!manager || !keyFocus.host || keyFocus.host != manager->frame || !FocusedRecord()) return nullptr;
+    if (index) *index = keyFocus.index;
+    return keyFocus.pane;
 }
 
 void AccessLeaveKeyboard() { LeaveKeyboard(Leave::Announce); }

@@ -25,6 +25,8 @@ constexpr UINT kActionCheckText = 5110;
 constexpr UINT kActionUncheckText = 5111;
 constexpr UINT kChevronText = 5113; // "More buttons"
 constexpr UINT kActionOpenText = 5114;
+constexpr UINT kLockedText = 5118;   // a locked toolbar's description
+constexpr UINT kCustomizeKeys = 5119; // a button's keys while items may change
 
 // Help texts and titles are read into buffers of this size.
 constexpr int kTextBuffer = 256;
@@ -148,6 +150,8 @@ class ToolbarAccessible final : public IAccessible {
     HRESULT STDMETHODCALLTYPE get_accDescription(VARIANT child, BSTR *description) override {
         return Property(child, description, [](const ToolbarRecord *record, LONG id, BSTR *out) {
             char text[kTextBuffer] = "";
+            // A reader tells the toolbar is locked before the user tries to drag it.
+            if (id == CHILDID_SELF && QBR_GetLocked()) return TextResult(LoadLibraryText(kLockedText), out);
             if (id != CHILDID_SELF) ButtonText(ItemOf(record, id), HELP_DESCRIPTION, text);
             return TextResult(text, out);
         });
@@ -175,7 +179,13 @@ class ToolbarAccessible final : public IAccessible {
         return Property(child, file, [](const ToolbarRecord *, LONG, BSTR *) { return S_FALSE; });
     }
     HRESULT STDMETHODCALLTYPE get_accKeyboardShortcut(VARIANT child, BSTR *shortcut) override {
-        return Property(child, shortcut, [](const ToolbarRecord *, LONG, BSTR *) { return S_FALSE; });
+        // The keys that move and remove a focused button, while they do.
+        return Property(child, shortcut, [](const ToolbarRecord *record, LONG id, BSTR *out) {
+            if (id == CHILDID_SELF || !DataOf(ItemOf(record, id)) || !QBR_GetCustomize() || QBR_GetLocked() ||
+                (RecordFlags(record) & TBF_LOCKED_ITEMS))
+                return S_FALSE;
+            return TextResult(LoadLibraryText(kCustomizeKeys), out);
+        });
     }
     HRESULT STDMETHODCALLTYPE get_accDefaultAction(VARIANT child, BSTR *action) override {
         return Property(child, action, [](const ToolbarRecord *record, LONG id, BSTR *out) {

@@ -47,6 +47,9 @@ void FinishKeyPress(HWND window, UINT id, bool completed);
 // ---- Menus ---------------------------------------------------------------------
 void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar);
 void OnToolbarCommand(HWND window, UINT id);
+// The reset to the host's default arrangement, after a Yes to the question
+// owned by `owner` (none asked when it is null); 1 when it was made.
+UINT AskAndResetToolbars(ToolbarManager *manager, HWND owner);
 // The chevron's menu of the buttons that cannot be seen; a line chosen is a
 // completed click of its button.
 UINT ShowChevronMenu(HWND window);

@@ -1,6 +1,8 @@
 // The toolbar menu: a right press on a toolbar's empty space or on a dock
 // lists every toolbar of the frame, to show or hide it, offers the Insert
-// Toolbar Item dialog and, for a toolbar the user made, its deletion.
+// Toolbar Item dialog and, for a toolbar the user made, its deletion; then
+// the lock of every toolbar and, when the host told its default arrangement,
+// the reset to it.
 #include "command/command.h"
 #include "core/callbacks.h"
 #include "core/core.h"
@@ -12,6 +14,8 @@ namespace {
 // index of the toolbar in the manager's list.
 constexpr UINT kInsertItemCommand = 101;
 constexpr UINT kDeleteToolbarCommand = 102;
+constexpr UINT kLockCommand = 103;
+constexpr UINT kResetCommand = 104;
 constexpr UINT kFirstToolbarCommand = 201;
 
 // Library strings of the menu and the delete question.
@@ -19,6 +23,8 @@ constexpr UINT kInsertItemText = 5101;
 constexpr UINT kDeleteToolbarText = 5102;
 constexpr UINT kDeleteQuestionFormat = 5103;
 constexpr UINT kDeleteQuestionCaption = 5104;
+constexpr UINT kLockText = 5115;
+constexpr UINT kResetText = 5116;
 
 constexpr int kTextBufferSize = 256;
 
@@ -81,10 +87,12 @@ void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar) {
         AppendToolbarEntry(menu, record, n);
         if (record->flags & TBF_VISIBLE) anyVisible = 1;
     }
-    // Inserting needs a toolbar on screen to drop on.
+    // Inserting needs a toolbar on screen to drop on. Locked toolbars keep
+    // their items, and the user's own toolbars stay: both entries are greyed.
+    const UINT locked = QBR_GetLocked() ? MF_GRAYED : 0;
     if (anyVisible && QBR_GetCustomize()) {
         AppendMenuA(menu, MF_SEPARATOR, 0, nullptr);
-        AppendMenuA(menu, MF_STRING, kInsertItemCommand, LoadLibraryText(kInsertItemText));
+        AppendMenuA(menu, MF_STRING | locked, kInsertItemCommand, LoadLibraryText(kInsertItemText));
     }
     // The delete command arrives after the menu is gone; the pressed toolbar
     // is kept for it. A menu from a dock keeps the last one and offers no
@@ -92,8 +100,11 @@ void ShowToolbarMenu(HWND owner, int x, int y, HWND toolbar) {
     if (toolbar) {
         mouseTrack.menuToolbar = RecordOfWindow(toolbar);
         if (mouseTrack.menuToolbar && (mouseTrack.menuToolbar->flags & TBF_USER_CREATED))
-            AppendMenuA(menu, MF_STRING, kDeleteToolbarCommand, LoadLibraryText(kDeleteToolbarText));
+            AppendMenuA(menu, MF_STRING | locked, kDeleteToolbarCommand, LoadLibraryText(kDeleteToolbarText));
     }
+    AppendMenuA(menu, MF_SEPARATOR, 0, nullptr);
+    AppendMenuA(menu, locked ? MF_CHECKED : MF_STRING, kLockCommand, LoadLibraryText(kLockText));
+    if (manager->defaultToolbars) AppendMenuA(menu, MF_STRING, kResetCommand, LoadLibraryText(kResetText));
 
     TrackPopupMenu(menu, TPM_RIGHTBUTTON, x, y, 0, owner, nullptr);
     DestroyMenu(menu);
@@ -108,7 +119,14 @@ void OnToolbarCommand(HWND window, UINT id) {
         if (manager && roomCallbacks.insertDialog) roomCallbacks.insertDialog(window, manager);
         break;
     case kDeleteToolbarCommand:
-        AskAndDeleteToolbar(window);
+        if (!QBR_GetLocked()) AskAndDeleteToolbar(window);
+        break;
+    case kLockCommand:
+        QBR_SetLocked(QBR_GetLocked() ? 0 : 1);
+        break;
+    case kResetCommand:
+        // The reset takes this very pane away: nothing touches it afterwards.
+        AskAndResetToolbars(manager, window);
         break;
     default:
         ToggleToolbar(manager, id);

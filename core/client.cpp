@@ -134,6 +134,11 @@ extern "C" UINT QBR_GetCustomize(void) {
     return client ? client->customize : 0;
 }
 
+extern "C" UINT QBR_GetLocked(void) {
+    ToolbarClient *client = CurrentClient();
+    return client ? client->locked : 0;
+}
+
 extern "C" UINT QBR_GetButtonText(void) {
     ToolbarClient *client = CurrentClient();
     return client ? client->buttonText : 0;

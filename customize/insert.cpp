@@ -1,6 +1,10 @@
-// The Insert Toolbar Item dialog: a category box, a list that shows the
-// catalog's buttons as pictures, and a description. The user drags a picture
-// out of the list and drops it on any toolbar of the frame.
+// The Insert Toolbar Item dialog: a category box, a filter box, a list that
+// shows the catalog's buttons as pictures, and a description. The user drags
+// a picture out of the list and drops it on any toolbar of the frame, or
+// presses Insert (Enter): the item goes into the toolbar that had the
+// keyboard when the dialog opened, at the focused button's place.
+#include <cstring>
+
 #include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
@@ -19,6 +23,8 @@ constexpr int kItemList = 5003;
 constexpr int kCategoryBox = 5004;
 constexpr int kDescription = 5005;
 constexpr int kNewButton = 5007;
+constexpr int kInsertButton = 5008;
+constexpr int kFilterBox = 5009;
 
 constexpr UINT kAllItemsText = 5105;
 
@@ -30,6 +36,17 @@ ToolbarItem *insertDragItem = nullptr;
 RECT insertDragFrame = {};
 int insertDragLastX = 0;
 int insertDragLastY = 0;
+WNDPROC filterPrevProc = nullptr;
+// A line being added: an owner-drawn list with strings measures it before
+// its item data is set.
+ToolbarItem *measuringItem = nullptr;
+// Where Insert puts the next item: a toolbar's pane and a place in its list
+// (past the end: at its end). Each insertion moves the place behind the new
+// item, so that items inserted one after another keep their order.
+HWND insertTargetPane = nullptr;
+UINT insertTargetIndex = 0;
+
+LRESULT CALLBACK FilterBoxProc(HWND box, UINT message, WPARAM wParam, LPARAM lParam);
 
 void DeleteInsertFont() {
     GdiDelete(insertFont);
@@ -40,6 +57,10 @@ void OnInitDialog(HWND dialog) {
     HWND list = GetDlgItem(dialog, kItemList);
     insertListPrevProc = reinterpret_cast<WNDPROC>(GetWindowLongPtrA(list, GWLP_WNDPROC));
     SetWindowLongPtrA(list, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(InsertListProc));
+    HWND filter = GetDlgItem(dialog, kFilterBox);
+    filterPrevProc = reinterpret_cast<WNDPROC>(GetWindowLongPtrA(filter, GWLP_WNDPROC));
+    SetWindowLongPtrA(filter, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(FilterBoxProc));
+    EnableWindow(GetDlgItem(dialog, kInsertButton), insertTargetPane && !QBR_GetLocked() ? TRUE : FALSE);
 
     // A font left behind by a dialog that ended without its Close button.
     DeleteInsertFont();
@@ -55,8 +76,8 @@ void OnInitDialog(HWND dialog) {
 void OnMeasureItem(MEASUREITEMSTRUCT *measure) {
     if (measure->CtlID != kItemList) return;
     int width, height;
-    if (!ItemGetSizeAt(reinterpret_cast<ToolbarItem *>(measure->itemData), ManagerMetrics(insertManager), &width,
-                       &height)) return;
+    const auto *item = measuringItem ? measuringItem : reinterpret_cast<ToolbarItem *>(measure->itemData);
+    if (!ItemGetSizeAt(item, ManagerMetrics(insertManager), &width, &height)) return;
     const int margin = ManagerMetrics(insertManager).lineMargin;
     measure->itemHeight = static_cast<UINT>(height + 2 * margin);
     measure->itemWidth = static_cast<UINT>(width + 2 * margin);
@@ -102,8 +123,33 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
     }
 }
 
+ToolbarItem *SelectedItem(HWND dialog) {
+    LRESULT line = SendDlgItemMessageA(dialog, kItemList, LB_GETCURSEL, 0, 0);
+    if (line == LB_ERR) return nullptr;
+    return reinterpret_cast<ToolbarItem *>(SendDlgItemMessageA(dialog, kItemList, LB_GETITEMDATA, line, 0));
+}
+
+// Insert, or Enter: the selected item into the keyboard's toolbar. Refused,
+// like a drop, while the toolbars are locked, by a toolbar whose items are
+// locked and by one that has the button already.
+void OnInsert(HWND dialog) {
+    ToolbarRecord *record = insertTargetPane ? RecordOfWindow(insertTargetPane) : nullptr;
+    ToolbarItem *item = SelectedItem(dialog);
+    if (!record || !item || QBR_GetLocked() || (record->flags & TBF_LOCKED_ITEMS)) return;
+    UINT placed = 0;
+    if (!InsertItemAt(record, insertTargetIndex, item) || !IndexOfItem(record, item, &placed)) return;
+    AccessItemsEdited(record, EVENT_OBJECT_CREATE, placed);
+    insertTargetIndex = placed + 1;
+}
+
 void OnCommand(HWND dialog, UINT id, UINT code) {
     switch (id) {
+    case kInsertButton:
+        OnInsert(dialog);
+        break;
+    case kFilterBox:
+        if (code == EN_CHANGE) FillItemList(dialog);
+        break;
     case IDOK:
     case IDCANCEL:
         DeleteInsertFont();
@@ -187,10 +233,53 @@ void OnListRelease() {
     ScreenToClient(target, &p);
     UINT index = 0;
     if (!InsertionIndexAtPoint(record, p.x, p.y, &index)) return;
-    if (record->flags & TBF_LOCKED_ITEMS) return;
+    if ((record->flags & TBF_LOCKED_ITEMS) || QBR_GetLocked()) return;
     UINT placed = 0;
     if (InsertItemAt(record, index, insertDragItem) && IndexOfItem(record, insertDragItem, &placed))
         AccessItemsEdited(record, EVENT_OBJECT_CREATE, placed);
+}
+
+// Down in the filter box goes on to the list, its first line selected.
+LRESULT CALLBACK FilterBoxProc(HWND box, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_KEYDOWN && wParam == VK_DOWN) {
+        HWND dialog = GetParent(box);
+        HWND list = GetDlgItem(dialog, kItemList);
+        if (SendMessageA(list, LB_GETCOUNT, 0, 0) > 0) {
+            if (SendMessageA(list, LB_GETCURSEL, 0, 0) == LB_ERR) {
+                SendMessageA(list, LB_SETCURSEL, 0, 0);
+                ShowItemDescription(dialog);
+            }
+            SendMessageA(dialog, WM_NEXTDLGCTL, reinterpret_cast<WPARAM>(list), TRUE);
+        }
+        return 0;
+    }
+    return CallWindowProcA(filterPrevProc, box, message, wParam, lParam);
+}
+
+// Whether `text` holds `part`, without regard to case.
+bool ContainsFolded(LPSTR text, LPSTR part) {
+    CharUpperA(text);
+    CharUpperA(part);
+    return std::strstr(text, part) != nullptr;
+}
+
+// Where Insert puts items: the keyboard's toolbar of this frame at its focused
+// button, else the toolbar whose menu opened the dialog, else the first one
+// shown; these two at their end.
+void ChooseInsertTarget(HWND owner, ToolbarManager *manager) {
+    insertTargetPane = AccessKeyboardToolbar(manager, &insertTargetIndex);
+    if (insertTargetPane) return;
+    insertTargetIndex = static_cast<UINT>(-1);
+    ToolbarRecord *record = RecordOfWindow(owner);
+    if (record && ManagerOfToolbar(owner) == manager && RecordIsVisible(record)) {
+        insertTargetPane = record->paneWindow;
+        return;
+    }
+    for (UINT i = 0; (record = ListAt<ToolbarRecord>(manager->toolbars, i)) != nullptr; ++i)
+        if (RecordIsVisible(record)) {
+            insertTargetPane = record->paneWindow;
+            return;
+        }
 }
 
 } // namespace
@@ -217,21 +306,36 @@ void FillCategoryCombo(HWND dialog) {
     SendDlgItemMessageA(dialog, kCategoryBox, CB_SETCURSEL, 0, 0); // the first category, not "All Items"
 }
 
+// With text in the filter box, every item of the catalog whose quick-help
+// text holds it is listed, whatever the category; with the box empty, the
+// chosen category's items. Each line's string is the item's quick-help text.
 void FillItemList(HWND dialog) {
     SendDlgItemMessageA(dialog, kItemList, LB_RESETCONTENT, 0, 0);
     if (!insertManager) return;
+    char filter[kHelpTextSize + 2] = "";
+    GetDlgItemTextA(dialog, kFilterBox, filter, kHelpTextSize);
     LRESULT line = SendDlgItemMessageA(dialog, kCategoryBox, CB_GETCURSEL, 0, 0);
-    if (line != CB_ERR) {
-        const bool allPass = static_cast<UINT>(line) >= insertManager->categoryCount;
-        const UINT filter = allPass ? 0 : insertManager->categories[line];
+    if (line != CB_ERR || filter[0]) {
+        const bool allPass = filter[0] || static_cast<UINT>(line) >= insertManager->categoryCount;
+        const UINT wanted = allPass ? 0 : insertManager->categories[line];
         // The shared separator is never offered: separators come from the
         // sideways nudge on a toolbar.
         for (ToolbarItem *item = ItemNext(insertManager->items, nullptr); item;
              item = ItemNext(insertManager->items, item)) {
             UINT kind, category;
             if (!ItemGetKind(item, &kind) || kind == ITEM_SEPARATOR) continue;
-            if (!allPass && (!ItemGetCategory(item, &category) || category != filter)) continue;
-            SendDlgItemMessageA(dialog, kItemList, LB_ADDSTRING, 0, reinterpret_cast<LPARAM>(item));
+            if (!allPass && (!ItemGetCategory(item, &category) || category != wanted)) continue;
+            UINT id = 0;
+            char name[kHelpTextSize + 2] = "", folded[kHelpTextSize + 2];
+            if (ItemGetId(item, &id) && RequestHelpText(id, HELP_QUICK, name, kHelpTextSize) <= 0) name[0] = '\0';
+            lstrcpyA(folded, name);
+            if (filter[0] && !ContainsFolded(folded, filter)) continue;
+            measuringItem = item;
+            LRESULT added = SendDlgItemMessageA(dialog, kItemList, LB_ADDSTRING, 0, reinterpret_cast<LPARAM>(name));
+            measuringItem = nullptr;
+            if (added >= 0)
+                SendDlgItemMessageA(dialog, kItemList, LB_SETITEMDATA, static_cast<WPARAM>(added),
+                                    reinterpret_cast<LPARAM>(item));
         }
     }
     SendDlgItemMessageA(dialog, kItemList, LB_SETCURSEL, 0, 0);
@@ -324,5 +428,18 @@ LRESULT CALLBACK InsertListProc(HWND list, UINT message, WPARAM wParam, LPARAM l
 }
 
 void ShowInsertDialog(HWND owner, ToolbarManager *manager) {
+    // Asked before the dialog takes the activation, which gives the keyboard back.
+    ChooseInsertTarget(owner, manager);
     DialogBoxParamA(moduleInstance, "QBR_Insert", owner, InsertDialogProc, reinterpret_cast<LPARAM>(manager));
+    insertTargetPane = nullptr;
+}
+
+extern "C" void QBR_ShowInsertDialog(ToolbarManager *manager) {
+    if (manager) ShowInsertDialog(manager->frame, manager);
+}
+
+extern "C" void QBR_ShowNewToolbarDialog(ToolbarManager *manager) {
+    if (!manager) return;
+    insertManager = manager;
+    DialogBoxParamA(moduleInstance, "QBR_NewToolbar", manager->frame, NewToolbarDialogProc, 0);
 }

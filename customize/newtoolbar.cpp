@@ -27,10 +27,15 @@ void OnOk(HWND dialog) {
     LRESULT length =
         SendDlgItemMessageA(dialog, kTitleBox, WM_GETTEXT, kTitleBufferSize - 1, reinterpret_cast<LPARAM>(title));
     if (length > 0) {
-        RECT insertRect;
+        // Below the Insert dialog; opened from the host's menu, where this
+        // dialog stands, as the frame's bottom may lie off the screen.
+        RECT insertRect, own;
         GetWindowRect(GetParent(dialog), &insertRect);
+        GetWindowRect(dialog, &own);
+        const bool fromHost = GetParent(dialog) == insertManager->frame;
         HWND dock = QBR_GetDock(insertManager, DOCK_TOP);
-        QBR_CreateToolbar(title, kNewToolbarFlags, insertRect.left, insertRect.bottom, 0, 0, dock, nullptr, 0);
+        QBR_CreateToolbar(title, kNewToolbarFlags, fromHost ? own.left : insertRect.left,
+                          fromHost ? own.top : insertRect.bottom, 0, 0, dock, nullptr, 0);
     }
     EndDialog(dialog, IDOK);
 }

@@ -11,6 +11,12 @@ constexpr UINT kToolbarsMenuBase = 8500;
 constexpr UINT kQuickHelpCommand = 120;
 constexpr UINT kButtonTextCommand = 121;
 constexpr UINT kOpenViewCommand = 122;
+// The toolbar menu's own commands, offered in the Toolbars submenu too, so
+// that a user who hid every toolbar still reaches them.
+constexpr UINT kNewToolbarCommand = 123;
+constexpr UINT kInsertItemCommand = 124;
+constexpr UINT kLockCommand = 125;
+constexpr UINT kResetCommand = 126;
 constexpr UINT kAboutCommand = 151;
 constexpr UINT kExitCommand = 152;
 constexpr UINT kHelpContentsCommand = 153;
@@ -48,5 +54,6 @@ void FillToolbarsMenu(ToolbarManager *manager, HMENU menu);
 HWND CreateEditControl(HWND frame, HFONT *font);
 void SizeFrameContents(HWND frame, ToolbarManager *manager, HWND statusBar, HWND edit);
 void ToggleToolbar(ToolbarManager *manager, UINT id);
+bool ToolbarsMenuCommand(ToolbarManager *manager, UINT id);
 void ToggleGlobal(HWND frame, UINT command);
 INT_PTR CALLBACK AboutDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam);

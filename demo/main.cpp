@@ -88,6 +88,7 @@ void MainCommand(HWND window, UINT id) {
         CheckMenuRadio(menu, 304, 307, id);
     } else if (id >= kToolbarsMenuBase && id < kToolbarsMenuBase + QBR_GetToolbarCount(mainManager)) {
         ToggleToolbar(mainManager, id);
+    } else if (ToolbarsMenuCommand(mainManager, id)) {
     } else if (id == kQuickHelpCommand || id == kButtonTextCommand) {
         ToggleGlobal(window, id);
     } else if (id >= kSchemeCommandFirst && id <= kSchemeCommandLast) {
@@ -112,6 +113,7 @@ LRESULT OnMainCreate(HWND window) {
     QBR_SetQuickHelp(GetPrivateProfileIntA(kGlobals, "Quick Help", 1, SettingsPath()));
     // No manager exists yet, so this only stores the setting.
     QBR_SetButtonText(GetPrivateProfileIntA(kGlobals, "Button Text", 0, SettingsPath()));
+    QBR_SetLocked(GetPrivateProfileIntA(kGlobals, "Locked", 0, SettingsPath()));
     mainManager = BuildMainToolbars(window, kMainLayout);
     mainStatusBar = CreateStatusBar(window);
     ShowWindow(window, SW_SHOWNORMAL);
@@ -145,6 +147,8 @@ void DestroyMainContents() {
     WritePrivateProfileStringA(kGlobals, "Button Text", number, SettingsPath());
     WritePrivateProfileStringA(kGlobals, "Colour Scheme", kSchemes[SchemeCommand() - kSchemeCommandFirst].name,
                                SettingsPath());
+    std::snprintf(number, sizeof(number), "%i", static_cast<int>(QBR_GetLocked()));
+    WritePrivateProfileStringA(kGlobals, "Locked", number, SettingsPath());
     QBR_Terminate();
     DeleteStatusBarFont();
     PostQuitMessage(0);
@@ -279,6 +283,7 @@ void ViewCommand(HWND window, UINT id) {
         CheckMenuRadio(GetMenu(window), 304, 307, id);
     } else if (id >= kToolbarsMenuBase && id < kToolbarsMenuBase + QBR_GetToolbarCount(manager)) {
         ToggleToolbar(manager, id);
+    } else if (ToolbarsMenuCommand(manager, id)) {
     } else if (id == kQuickHelpCommand || id == kButtonTextCommand) {
         ToggleGlobal(window, id);
     } else if (id == kAboutCommand) {
@@ -364,6 +369,31 @@ void FillToolbarsMenu(ToolbarManager *manager, HMENU menu) {
         QBR_GetToolbarTitle(toolbar, title, 254);
         AppendMenuA(menu, QBR_IsToolbarVisible(toolbar) ? MF_CHECKED : MF_STRING, kToolbarsMenuBase + i, title);
     }
+    // What the toolbar menu offers besides, reachable with every toolbar hidden.
+    const UINT locked = QBR_GetLocked() ? MF_GRAYED : 0;
+    AppendMenuA(menu, MF_SEPARATOR, 0, nullptr);
+    AppendMenuA(menu, MF_STRING | locked, kNewToolbarCommand, "&New Toolbar...");
+    AppendMenuA(menu, MF_STRING | locked, kInsertItemCommand, "&Insert Item...");
+    AppendMenuA(menu, QBR_GetLocked() ? MF_CHECKED : MF_STRING, kLockCommand, "&Lock the Toolbars");
+    AppendMenuA(menu, MF_STRING, kResetCommand, "&Reset Toolbars...");
+}
+
+bool ToolbarsMenuCommand(ToolbarManager *manager, UINT id) {
+    switch (id) {
+    case kNewToolbarCommand:
+        if (!QBR_GetLocked()) QBR_ShowNewToolbarDialog(manager);
+        return true;
+    case kInsertItemCommand:
+        if (!QBR_GetLocked()) QBR_ShowInsertDialog(manager);
+        return true;
+    case kLockCommand:
+        QBR_SetLocked(QBR_GetLocked() ? 0 : 1);
+        return true;
+    case kResetCommand:
+        QBR_ResetToolbars(manager, 1);
+        return true;
+    }
+    return false;
 }
 
 void ToggleToolbar(ToolbarManager *manager, UINT id) {

@@ -235,7 +235,13 @@ void SaveLayout(ToolbarManager *manager, LPCSTR section) {
         QBR_GetLayoutEntry(i, key.data(), value.data());
         table.emplace_back(key.data(), value.data());
     }
-    WritePrivateProfileStringA(section, nullptr, nullptr, SettingsPath());
+    // The old keys go one by one, not with their section: a section taken
+    // away and written again would move to the file's end, and a file written
+    // over (after a reset, say) would no longer be the same bytes as a first
+    // run's. An emptied section keeps its place, and the new keys fill it.
+    std::vector<char> oldKeys = ReadProfile(section, nullptr);
+    for (const char *old = oldKeys.data(); *old; old += lstrlenA(old) + 1)
+        WritePrivateProfileStringA(section, old, nullptr, SettingsPath());
     for (const auto &entry : FileEntries(table))
         WritePrivateProfileStringA(section, entry.first.c_str(), entry.second.c_str(), SettingsPath());
     QBR_FreeLayout();

@@ -61,17 +61,31 @@ void SetBehaviours(ToolbarManager *manager, UINT first, UINT last, UINT behaviou
         QBR_SetButtonBehaviour(manager, id, behaviour);
 }
 
-// A stored arrangement, which makes its own docks, or else a top dock with
-// the default toolbars: never both, or two docks would stand on one side.
-template <size_t N>
-ToolbarManager *RestoreOrDefault(ToolbarManager *manager, HWND frame, LPCSTR section,
-                                 const DefaultToolbar (&toolbars)[N]) {
-    if (RestoreLayout(manager, frame, section)) return manager;
+// The default toolbars in a new top dock.
+template <size_t N> UINT MakeDefaults(ToolbarManager *manager, HWND frame, const DefaultToolbar (&toolbars)[N]) {
     HWND dock = QBR_CreateDock(manager, frame, DOCK_TOP);
-    if (!dock) return nullptr;
+    if (!dock) return 0;
     for (const DefaultToolbar &t : toolbars)
         QBR_CreateToolbar(t.title, t.flags, t.x, t.y, t.width, t.height, dock, t.ids, t.count);
-    return manager;
+    return 1;
+}
+
+// The first run's arrangements, which the library makes again on a reset.
+// The main window's ends with an empty bottom dock: an empty one is not
+// written, so the default arrangement's file is as without it.
+UINT CALLBACK MainDefaults(ToolbarManager *manager, HWND frame) {
+    return MakeDefaults(manager, frame, kMainToolbars) && QBR_CreateDock(manager, frame, DOCK_BOTTOM) ? 1 : 0;
+}
+UINT CALLBACK ViewDefaults(ToolbarManager *manager, HWND frame) {
+    return MakeDefaults(manager, frame, kViewToolbars);
+}
+
+// A stored arrangement, which makes its own docks, or else the defaults:
+// never both, or two docks would stand on one side.
+ToolbarManager *RestoreOrDefault(ToolbarManager *manager, HWND frame, LPCSTR section, DefaultToolbarsProc defaults) {
+    QBR_SetDefaultToolbars(manager, defaults);
+    if (RestoreLayout(manager, frame, section)) return manager;
+    return defaults(manager, frame) ? manager : nullptr;
 }
 
 } // namespace
@@ -91,9 +105,8 @@ ToolbarManager *BuildMainToolbars(HWND frame, LPCSTR section) {
     QBR_SetButtonBehaviour(manager, 151, BTN_LATCH);
     QBR_SetButtonEnabled(manager, 107, 0);
     QBR_SetButtonState(manager, 301, 2);
-    if (!RestoreOrDefault(manager, frame, section, kMainToolbars)) return nullptr;
-    // A bottom dock, empty unless the stored arrangement filled it: an empty
-    // one is not written, so the default arrangement's file is as before.
+    if (!RestoreOrDefault(manager, frame, section, MainDefaults)) return nullptr;
+    // A bottom dock, empty unless the stored arrangement filled it.
     if (!QBR_GetDock(manager, DOCK_BOTTOM) && !QBR_CreateDock(manager, frame, DOCK_BOTTOM)) return nullptr;
     return manager;
 }
@@ -105,7 +118,7 @@ ToolbarManager *BuildViewToolbars(HWND frame, LPCSTR section) {
         return nullptr;
     SetBehaviours(manager, 301, 307, BTN_CHECK);
     QBR_SetButtonBehaviour(manager, 151, BTN_LATCH);
-    return RestoreOrDefault(manager, frame, section, kViewToolbars);
+    return RestoreOrDefault(manager, frame, section, ViewDefaults);
 }
 
 // Every text is a string resource: the description under the id, quick help

@@ -40,6 +40,7 @@ typedef struct ToolbarClient {
     UINT pressMessage;
     UINT releaseMessage;
     HWND helpWindow;
+    UINT locked; /* QBR_SetLocked: no toolbar moves or changes its items */
 } ToolbarClient;
 
 /* One frame window's docks, toolbars, catalog, categories and image strip. */
@@ -58,6 +59,7 @@ struct ToolbarManager {
     UINT imageFactor; /* the whole factor it was enlarged by since; 0 is 1 */
     RECT usableArea; /* from QBR_SetUsableArea, frame client coordinates */
     UINT hasUsableArea;
+    DefaultToolbarsProc defaultToolbars; /* QBR_SetDefaultToolbars; null: no reset */
 };
 
 typedef struct ToolbarItem {

@@ -69,8 +69,12 @@ typedef struct ToolbarManager ToolbarManager;
    length; 0 or less means there is no such text. */
 typedef int(CALLBACK *HelpTextProc)(UINT id, UINT kind, LPSTR buffer, int size);
 
+/* The host's default arrangement of a frame: makes the docks and toolbars a
+   first run makes (QBR_CreateDock, QBR_CreateToolbar) and gives 1. */
+typedef UINT(CALLBACK *DefaultToolbarsProc)(ToolbarManager *manager, HWND frame);
+
 /* Instance that holds the library's resources (window classes, dialog
-   templates, strings 5101 to 5113). The host stores its own instance here
+   templates, strings 5101 to 5119). The host stores its own instance here
    before it creates anything; the resources are linked into the host. */
 extern HINSTANCE moduleInstance;
 
@@ -130,6 +134,14 @@ UINT QBR_GetActiveColorScheme(void);
 UINT QBR_ColorsChanged(HWND frame, UINT message, WPARAM wParam, LPARAM lParam);
 void QBR_SetCustomize(UINT on);
 UINT QBR_GetCustomize(void);
+/* Locks every toolbar of the client against the user's gestures: while on,
+   no toolbar is dragged, docked, floated, sized by its border or double
+   clicked to another place, and no item is moved, removed or inserted, with
+   the mouse, the keyboard or the Insert dialog. Buttons still press and the
+   keyboard still walks. The toolbar menu offers the same switch ("Lock the
+   Toolbars"); a host keeps it with its other global settings. */
+void QBR_SetLocked(UINT on);
+UINT QBR_GetLocked(void);
 void QBR_SetButtonText(UINT on);
 UINT QBR_GetButtonText(void);
 
@@ -161,6 +173,19 @@ UINT QBR_GetButtonState(ToolbarManager *manager, UINT id);
 UINT QBR_IsButtonEnabled(ToolbarManager *manager, UINT id);
 UINT QBR_IsButtonPressed(ToolbarManager *manager, UINT id);
 UINT QBR_GetToolbarCount(ToolbarManager *manager);
+
+/* The default arrangement, told once per manager: with it the toolbar menu
+   offers "Reset Toolbars...". A reset takes every toolbar and dock of the
+   frame away, the user's own toolbars too, and calls `proc` to make the
+   first run's again. QBR_ResetToolbars does it from the host's own menu;
+   with `ask` it first asks the user (Yes/No). 1 when the reset was made. */
+UINT QBR_SetDefaultToolbars(ToolbarManager *manager, DefaultToolbarsProc proc);
+UINT QBR_ResetToolbars(ToolbarManager *manager, UINT ask);
+/* The customising dialogs from the host's own menu, modal over the frame:
+   Insert Toolbar Item (the toolbar that has the keyboard, or else the first
+   shown one, receives its Insert button's items) and New Toolbar. */
+void QBR_ShowInsertDialog(ToolbarManager *manager);
+void QBR_ShowNewToolbarDialog(ToolbarManager *manager);
 HWND QBR_GetToolbar(ToolbarManager *manager, UINT index);
 
 /* Toolbars. A toolbar is named by the handle of its docked pane. x and y

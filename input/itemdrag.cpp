@@ -25,7 +25,9 @@ void OnToolbarRightDown(HWND window, int x, int y, UINT keys) {
         ShowToolbarMenu(pane, x, y, window);
         return;
     }
-    if (!QBR_GetCustomize()) return;
+    // Locked toolbars keep their items: a right press on a button does what
+    // it does with customising off, nothing.
+    if (!QBR_GetCustomize() || QBR_GetLocked()) return;
     bool separator;
     if (!IsSeparatorKind(mouseTrack.hitItem, &separator) || separator) return;
 

@@ -131,7 +131,7 @@ void OnToolbarLeftDown(HWND window, int x, int y, UINT) {
         HitTestToolbar(ResolveRoleWindow(window, ROLE_DOCKED), x, y, &mouseTrack.hitItemId, &mouseTrack.hitRect);
     if (mouseTrack.hitItem)
         BeginButtonPress(window);
-    else
+    else if (!QBR_GetLocked())
         BeginToolbarDrag(window, x, y); // empty space, separator or caption
 }
 

@@ -108,12 +108,21 @@ static LRESULT OnNcLeftDown(HWND window, WPARAM hitCode, LPARAM lParam) {
     return result;
 }
 
+// A locked floating frame cannot be sized: its border answers as a plain
+// border, which gives neither a sizing cursor nor a sizing loop.
+static LRESULT OnNcHitTest(HWND window, LPARAM lParam) {
+    LRESULT hit = DefWindowProcA(window, WM_NCHITTEST, 0, lParam);
+    if (QBR_GetLocked() && hit >= HTLEFT && hit <= HTBOTTOMRIGHT) return HTBORDER;
+    return hit;
+}
+
 static void OnDoubleClick(HWND window, LPARAM lParam) {
     int x = static_cast<int>(LOWORD(lParam)), y = static_cast<int>(HIWORD(lParam));
     HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
     if (HitTestToolbar(pane, x, y, nullptr, nullptr)) return; // on a button: the click did it all
     if (InChevron(window, x, y)) return;                       // the chevron: a second menu, nothing more
-    UINT flags = QBR_GetToolbarFlags(pane);
+    // A locked toolbar stays where it is; its close box still hides it.
+    UINT flags = QBR_GetToolbarFlags(pane) | (QBR_GetLocked() ? TBF_LOCKED_PLACE : 0);
     if (IsFloatingFrame(window)) {
         RECT box;
         CloseBoxRect(window, &box);
@@ -170,6 +179,8 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         return 0;
     case WM_WINDOWPOSCHANGED:
         return OnWindowPosChanged(window, wParam, lParam);
+    case WM_NCHITTEST:
+        return OnNcHitTest(window, lParam);
     case WM_NCLBUTTONDOWN:
         return OnNcLeftDown(window, wParam, lParam);
     case WM_COMMAND:

@@ -39,15 +39,17 @@ void Key(const std::string &name) {
         WORD vk;
     } kKeys[] = {{"F6", VK_F6},       {"Esc", VK_ESCAPE},   {"Left", VK_LEFT}, {"Right", VK_RIGHT}, {"Up", VK_UP},
                  {"Down", VK_DOWN},   {"Home", VK_HOME},    {"End", VK_END},   {"Tab", VK_TAB},     {"F10", VK_F10},
-                 {"Space", VK_SPACE}, {"Enter", VK_RETURN}, {"Apps", VK_APPS}, {"A", 'A'}};
-    const bool shift = name[0] == '+';
-    const std::string key = shift ? name.substr(1) : name;
+                 {"Space", VK_SPACE}, {"Enter", VK_RETURN}, {"Apps", VK_APPS}, {"A", 'A'},
+                 {"Delete", VK_DELETE}};
+    // "+" holds Shift, "^" Ctrl.
+    const WORD held = name[0] == '+' ? VK_SHIFT : name[0] == '^' ? VK_CONTROL : 0;
+    const std::string key = held ? name.substr(1) : name;
     for (const auto &k : kKeys) {
         if (key != k.name) continue;
-        if (shift) SendKey(VK_SHIFT, false);
+        if (held) SendKey(held, false);
         SendKey(k.vk, false);
         SendKey(k.vk, true);
-        if (shift) SendKey(VK_SHIFT, true);
+        if (held) SendKey(held, true);
         return;
     }
     ADD_FAILURE() << "no key " << name;
@@ -634,7 +636,7 @@ TEST_F(AccessTest, ShiftF10AndTheMenuKeyOpenTheToolbarMenu) {
         Key(key);
         PumpHost(100);
         ModalSteps::Stop();
-        EXPECT_EQ("Tools*:201 | Other*:202 | -- | Insert Item...:101", seen);
+        EXPECT_EQ("Tools*:201 | Other*:202 | -- | Insert Item...:101 | -- | Lock the Toolbars:103", seen);
         Key("Esc");
     }
 }
@@ -722,7 +724,7 @@ TEST_F(AccessTest, KeysTheToolbarsDoNotUseGoOnToTheHost) {
         UINT used;
     } rows[] = {
         {WM_KEYDOWN, VK_CONTROL, 0}, {WM_KEYDOWN, 'S', 0}, {WM_KEYUP, 'S', 0},
-        {WM_KEYDOWN, VK_DELETE, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1},
+        {WM_KEYDOWN, VK_INSERT, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1},
     };
     for (const auto &row : rows) {
         MSG msg = {frame, row.message, row.key, 1, 0, {0, 0}};
@@ -806,6 +808,71 @@ TEST_F(AccessTest, CustomisingAnnouncesTheItemsAndTheNewOrder) {
     }
     EXPECT_EQ((std::vector<UINT>{2, 1, 4}), ToolbarIds(a));
     EXPECT_EQ((std::vector<UINT>{4, 5}), ToolbarIds(b));
+}
+
+// With customising on, Ctrl+Left/Right move the focused button and Delete
+// removes it: a reader finds the new order, hears each change, and is told
+// the keys as each button's shortcut. Locked, Ctrl+arrows only walk, Delete is
+// the host's, and the toolbar reads as locked.
+TEST_F(AccessTest, CtrlArrowsMoveAndDeleteRemovesTheFocusedButton) {
+    QBR_SetCustomize(1);
+    HWND pane = Make("Tools", {1, 2, 0, 3});
+    Reader reader(pane);
+    UnhookWinEvent(hook);
+    hook = SetWinEventHook(EVENT_OBJECT_CREATE, EVENT_OBJECT_REORDER, nullptr, OnWinEvent, GetCurrentProcessId(), 0,
+                           WINEVENT_OUTOFCONTEXT);
+    // The items as a reader names them: "Q<id>" for a button, 0 for a separator.
+    auto readIds = [&] {
+        std::vector<UINT> ids;
+        for (LONG c = 1; c <= reader.Count(); ++c) {
+            const std::string name = reader.Name(c);
+            ids.push_back(name[0] == 'Q' ? static_cast<UINT>(std::stoul(name.substr(1))) : 0u);
+        }
+        return ids;
+    };
+    auto shortcut = [&](LONG child) {
+        BSTR text = nullptr;
+        HRESULT hr = reader.object->get_accKeyboardShortcut(Reader::Child(child), &text);
+        return Reader::Text(hr, text);
+    };
+    const std::string keys = "Ctrl+Left, Ctrl+Right, Delete";
+    HWND w = ResolveRoleWindow(pane, ROLE_ACTIVE);
+    auto moved = [&](LONG from, LONG to) {
+        return std::vector<Event>{{EVENT_OBJECT_DESTROY, w, OBJID_CLIENT, from},
+                                  {EVENT_OBJECT_REORDER, w, OBJID_CLIENT, 0},
+                                  {EVENT_OBJECT_CREATE, w, OBJID_CLIENT, to},
+                                  {EVENT_OBJECT_REORDER, w, OBJID_CLIENT, 0}};
+    };
+    Key("F6");
+    const struct Row {
+        const char *key;
+        UINT locked;
+        std::vector<UINT> ids;
+        std::string focus, shortcut, description;
+        std::vector<Event> heard;
+    } rows[] = {
+        {"^Right", 0, {2, 1, 0, 3}, "Tools 1", keys, "(none)", moved(1, 2)},
+        {"^Right", 0, {2, 0, 1, 3}, "Tools 2", keys, "(none)", moved(2, 3)}, // into the next group
+        {"^Left", 0, {2, 1, 0, 3}, "Tools 1", keys, "(none)", moved(3, 2)},
+        {"^Left", 0, {1, 2, 0, 3}, "Tools 0", keys, "(none)", moved(2, 1)},
+        {"^Left", 0, {1, 2, 0, 3}, "Tools 0", keys, "(none)", {}}, // the first place: nowhere to go
+        {"Delete", 1, {1, 2, 0, 3}, "Tools 0", "(none)", "Locked", {}},
+        {"^Right", 1, {1, 2, 0, 3}, "Tools 1", "(none)", "Locked", {}}, // walks as Right does
+        {"Delete", 0, {1, 0, 3}, "Tools 2", keys, "(none)",
+         {{EVENT_OBJECT_DESTROY, w, OBJID_CLIENT, 2}, {EVENT_OBJECT_REORDER, w, OBJID_CLIENT, 0}}},
+        {"^Left", 0, {1, 3}, "Tools 1", keys, "(none)", moved(3, 2)}, // the separator left trailing goes
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(std::string(row.key) + (row.locked ? " locked" : ""));
+        QBR_SetLocked(row.locked);
+        events.clear();
+        Key(row.key);
+        EXPECT_EQ(row.ids, readIds());
+        EXPECT_EQ(row.focus, Focus());
+        EXPECT_EQ(row.shortcut, shortcut(1));
+        EXPECT_EQ(row.description, reader.Description(CHILDID_SELF));
+        EXPECT_EQ(row.heard, events);
+    }
 }
 
 } // namespace

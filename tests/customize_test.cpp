@@ -35,6 +35,43 @@ std::vector<UINT> ListIds(HWND list) {
     return out;
 }
 
+UINT CALLBACK MakeNothing(ToolbarManager *, HWND) { return 1; }
+
+std::vector<std::string> ListTexts(HWND list) {
+    std::vector<std::string> out;
+    for (LRESULT i = 0; i < SendMessageA(list, LB_GETCOUNT, 0, 0); ++i) {
+        char text[64] = "";
+        SendMessageA(list, LB_GETTEXT, i, reinterpret_cast<LPARAM>(text));
+        out.push_back(text);
+    }
+    return out;
+}
+
+// Real key strokes: each character of `keys` is its virtual key ('Q', '5',
+// '\x28' Down, '\x1b' Esc), but '\b' Backspace and '\n' Enter; '@' before
+// one holds Alt.
+void Type(const std::string &keys) {
+    auto send = [](WORD vk, bool up) {
+        INPUT in = {};
+        in.type = INPUT_KEYBOARD;
+        in.ki.wVk = vk;
+        in.ki.dwFlags = up ? KEYEVENTF_KEYUP : 0;
+        SendInput(1, &in, sizeof in);
+    };
+    for (size_t i = 0; i < keys.size(); ++i) {
+        const bool alt = keys[i] == '@';
+        if (alt) {
+            send(VK_MENU, false);
+            ++i;
+        }
+        const char c = keys[i];
+        const WORD vk = c == '\b' ? VK_BACK : c == '\n' ? VK_RETURN : static_cast<WORD>(c);
+        send(vk, false);
+        send(vk, true);
+        if (alt) send(VK_MENU, true);
+    }
+}
+
 RECT ScreenLineRect(HWND list, int line) {
     RECT r = {};
     SendMessageA(list, LB_GETITEMRECT, line, reinterpret_cast<LPARAM>(&r));
@@ -115,14 +152,19 @@ TEST(CustomizeTemplates, InsertAndNewToolbarTemplatesReadBackExactly) {
          148,
          "Insert Toolbar Item",
          {
-             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 5, 50, 69},
+             {-1, "static", "&Category:", kShown | WS_GROUP, 4, 2, 50, 8},
+             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 11, 50, 69},
+             {-1, "static", "&Find:", kShown | WS_GROUP, 4, 27, 50, 8},
+             {5009, "edit", "", kShown | ES_AUTOHSCROLL | WS_BORDER | WS_TABSTOP, 4, 36, 50, 12},
              {5003, "list box", "",
-              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL | WS_TABSTOP,
-              5, 19, 48, 124},
+              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_HASSTRINGS | LBS_NOINTEGRALHEIGHT | WS_BORDER |
+                  WS_VSCROLL | WS_TABSTOP,
+              5, 51, 48, 92},
              {-1, "button", "Description", kShown | BS_GROUPBOX, 62, 4, 123, 37},
              {5005, "static", "", kShown | WS_GROUP, 67, 17, 108, 17},
-             {1, "button", "Close", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 6, 44, 14},
+             {1, "button", "Close", kShown | WS_TABSTOP, 194, 6, 44, 14},
              {5007, "button", "&New...", kShown | WS_TABSTOP, 194, 25, 44, 14},
+             {5008, "button", "&Insert", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 44, 44, 14},
              {5002, "static",
               "At any time, items can be moved or removed from a toolbar by dragging with the right mouse "
               "button.To remove an item simply drag it off the toolbar.",
@@ -163,6 +205,7 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
     const std::string all = "Alpha*:201 | Beta:202 | Gamma*:203";
     const std::string insert = " | -- | Insert Item...:101";
     const std::string del = " | Delete Toolbar...:102";
+    const std::string lock = " | -- | Lock the Toolbars:103";
     struct Case {
         const char *name;
         std::function<void()> prepare;
@@ -170,18 +213,30 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
         std::string expected;
     };
     const Case cases[] = {
-        {"user's toolbar, pressed on its floating frame", [] {}, [&] { return FrameOf(gamma); }, all + insert + del},
-        {"host's toolbar", [] {}, [&] { return alpha; }, all + insert},
-        {"customising off", [] { QBR_SetCustomize(0); }, [&] { return gamma; }, all + del},
-        {"dock press, after a press on the user's toolbar", [] {}, [] { return HWND(nullptr); }, all + insert},
-        {"the check follows the flag, not the window", [&] { ShowWindow(alpha, SW_HIDE); }, [&] { return alpha; },
-         all + insert},
+        {"user's toolbar, pressed on its floating frame", [] {}, [&] { return FrameOf(gamma); },
+         all + insert + del + lock},
+        {"host's toolbar", [] {}, [&] { return alpha; }, all + insert + lock},
+        {"customising off", [] { QBR_SetCustomize(0); }, [&] { return gamma; }, all + del + lock},
+        {"dock press, after a press on the user's toolbar", [] {}, [] { return HWND(nullptr); }, all + insert + lock},
+        {"locked: checked, and a default arrangement offers the reset",
+         [&] {
+             QBR_SetLocked(1);
+             QBR_SetDefaultToolbars(manager, MakeNothing);
+         },
+         [&] { return alpha; }, all + insert + " | -- | Lock the Toolbars*:103 | Reset Toolbars...:104"},
+        {"the check follows the flag, not the window",
+         [&] {
+             QBR_SetLocked(0);
+             QBR_SetDefaultToolbars(manager, nullptr);
+             ShowWindow(alpha, SW_HIDE);
+         },
+         [&] { return alpha; }, all + insert + lock},
         {"nothing shown: nothing to insert into",
          [&] {
              QBR_SetToolbarFlags(alpha, TBF_HIDDEN);
              QBR_SetToolbarFlags(gamma, TBF_HIDDEN);
          },
-         [&] { return gamma; }, "Alpha:201 | Beta:202 | Gamma:203" + del},
+         [&] { return gamma; }, "Alpha:201 | Beta:202 | Gamma:203" + del + lock},
     };
     ToolbarRecord *gammaRecord = RecordOfWindow(gamma);
     for (size_t i = 0; i < std::size(cases); ++i) {
@@ -256,7 +311,7 @@ TEST_F(CustomizeTest, DockPressOpensMenuOwnedByFirstToolbarWithoutDelete) {
     Pump();
     ModalSteps::Stop();
     Pump();
-    EXPECT_EQ("Alpha*:201 | Beta:202 | Gamma*:203 | -- | Insert Item...:101", seen);
+    EXPECT_EQ("Alpha*:201 | Beta:202 | Gamma*:203 | -- | Insert Item...:101 | -- | Lock the Toolbars:103", seen);
     EXPECT_TRUE(QBR_IsToolbarVisible(beta)) << "the command reached the first toolbar's pane";
 }
 
@@ -344,6 +399,60 @@ TEST_F(CustomizeTest, InsertDialogCentresAndListsCategoriesItemsAndDescriptions)
     EXPECT_EQ((GetSystemMetrics(SM_CXSCREEN) - width) / 2, dialogRect.left);
     EXPECT_EQ((GetSystemMetrics(SM_CYSCREEN) - height) / 3, dialogRect.top);
     EXPECT_EQ(gdiBefore, LiveGdiObjects()) << "the dialog's font and the drawing brushes are gone";
+}
+
+// Without a mouse: Alt+F reaches the filter box, typing keeps the items whose
+// quick help holds the text (any case, any category), Down goes into the list,
+// and Enter inserts the selected item into the toolbar that had the keyboard,
+// before its focused button; the lines carry the names a reader speaks.
+TEST_F(CustomizeTest, InsertDialogFindsAndInsertsFromTheKeyboard) {
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    Pump();
+    MSG f6 = {frame, WM_KEYDOWN, VK_F6, 1, 0, {0, 0}}, right = {frame, WM_KEYDOWN, VK_RIGHT, 1, 0, {0, 0}};
+    QBR_TranslateToolbarKey(&f6);
+    QBR_TranslateToolbarKey(&right); // Alpha's button 2
+    const struct Row {
+        const char *keys;
+        std::vector<std::string> lines;
+        bool inList;
+        UINT locked;
+        std::vector<UINT> alpha;
+    } rows[] = {
+        {"@F", {"Q1", "Q2", "Q3"}, false, 0, {1, 2}}, // empty: the first category
+        {"Q", {"Q1", "Q2", "Q3", "Q4", "Q5", "Q6", "Q7", "Q8"}, false, 0, {1, 2}},
+        {"5", {"Q5"}, false, 0, {1, 2}},
+        {"\x28\n", {"Q5"}, true, 0, {1, 5, 2}},
+        {"\n", {"Q5"}, true, 0, {1, 5, 2}}, // already there
+        {"@F\b\bX", {}, false, 0, {1, 5, 2}},
+        {"\bQ6\x28\n", {"Q6"}, true, 1, {1, 5, 2}}, // locked
+        {"@F\b7\x28\n", {"Q7"}, true, 0, {1, 5, 7, 2}}, // behind the one inserted before
+    };
+    std::vector<std::vector<std::string>> lines;
+    std::vector<std::vector<UINT>> alphaIds;
+    std::vector<bool> inList;
+    for (const Row &row : rows) {
+        ModalSteps::Add([&] {
+            QBR_SetLocked(row.locked);
+            Type(row.keys);
+        });
+        ModalSteps::Add([&] {
+            HWND list = GetDlgItem(InsertDialog(), 5003);
+            lines.push_back(ListTexts(list));
+            inList.push_back(GetFocus() == list);
+            alphaIds.push_back(Ids(alpha));
+        });
+    }
+    ModalSteps::Add([] { Type("\x1b"); }); // Esc closes
+    RunInsertDialog();
+    EXPECT_EQ(nullptr, InsertDialog());
+    ASSERT_EQ(std::size(rows), lines.size());
+    for (size_t i = 0; i < std::size(rows); ++i) {
+        SCOPED_TRACE(rows[i].keys);
+        EXPECT_EQ(rows[i].lines, lines[i]);
+        EXPECT_EQ(rows[i].inList, inList[i]);
+        EXPECT_EQ(rows[i].alpha, alphaIds[i]);
+    }
 }
 
 TEST_F(CustomizeTest, InsertListDrawsButtonPicturesOnLinesOfButtonSize) {

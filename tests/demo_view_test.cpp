@@ -257,7 +257,9 @@ TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
     HMENU toolbars = GetSubMenu(viewPopup, GetMenuItemCount(viewPopup) - 1);
     ASSERT_NE(toolbars, nullptr);
     SendMessageA(a, WM_INITMENUPOPUP, reinterpret_cast<WPARAM>(toolbars), 2);
-    EXPECT_EQ(DescribeMenu(toolbars), "Standard*:8500 | Style*:8501");
+    // Then what the toolbar menu offers, so that hiding every toolbar strands no one.
+    EXPECT_EQ(DescribeMenu(toolbars), "Standard*:8500 | Style*:8501 | -- | &New Toolbar...:123 | &Insert Item...:124 | "
+                                      "&Lock the Toolbars:125 | &Reset Toolbars...:126");
     // Its entry hides that view's toolbar, not the other view's.
     SendMessageA(a, WM_COMMAND, kToolbarsMenuBase + 1, 0);
     Pump();

@@ -69,8 +69,8 @@ read -r l t r b v <<<"$(ctl childrect "$main" Standard)"
 xdotool mousemove $((l + 2)) $(((t + b) / 2)) click 3
 sleep 0.6
 shot customize-menu
-# The last entry is "Insert Item..." (customising is on unless a host turns it off).
-xdotool key Up Return
+# "Insert Item..." stands above "Lock the Toolbars" and "Reset Toolbars..." (customising is on unless a host turns it off).
+xdotool key Up Up Up Return
 ctl wait "Insert Toolbar Item" 5000 || fail "the toolbar menu did not open the Insert Toolbar Item dialog"
 sleep 0.5
 
@@ -98,9 +98,9 @@ read -r l t r b v <<<"$(ctl rect Mine)"
     echo "note: the main window stands above the Insert dialog after New Toolbar"
 
 # The list box, from the dialog-unit geometry of the New button (194, 25,
-# 44 by 14): the list stands at (5, 19), 48 wide, with a one-pixel border.
+# 44 by 14): the list stands at (5, 51), 48 wide, with a one-pixel border.
 list_x=$(( nl + ((5 - 194) * (nr - nl) + 48 / 2 * (nr - nl)) / 44 ))
-list_top=$(( nt + (19 - 25) * (nb - nt) / 14 + 1 ))
+list_top=$(( nt + (51 - 25) * (nb - nt) / 14 + 1 ))
 for n in 0 1 2; do
     read -r l t r b v <<<"$(ctl rect Mine)"
     # The first drop goes anywhere in the empty toolbar; later ones behind

@@ -27,7 +27,7 @@ read -r l t r b v <<<"$(ctl childrect "$main" Standard)"
 [ "$v" = 1 ] || fail "no Standard pane"
 xdotool mousemove $((l + 2)) $(((t + b) / 2)) click 3 # the toolbar menu
 sleep 0.6
-xdotool key Up Return # its last entry, "Insert Item..."
+xdotool key Up Up Up Return # "Insert Item...", above "Lock the Toolbars" and "Reset Toolbars..."
 ctl wait "Insert Toolbar Item" 5000 || fail "no Insert Toolbar Item dialog"
 sleep 0.5
 for title in "${titles[@]}"; do
