@@ -9,18 +9,25 @@
 namespace {
 
 // The image of button `imageIndex` as a bitmap of its own for a menu line,
-// taken from the manager's recoloured strip; the caller deletes it.
+// at the frame's scale: the strip's cell (the strip of that scale, or a
+// smaller one enlarged) centred on the face colour, as a button shows it.
+// The caller deletes it.
 HBITMAP MenuImage(ToolbarManager *manager, UINT imageIndex) {
-    int iw = 0, ih = 0;
-    if (!GetButtonSizes(nullptr, nullptr, &iw, &ih) || iw <= 0 || ih <= 0) return nullptr;
+    const ScaledMetrics &metrics = ManagerMetrics(manager);
+    const int iw = metrics.imageWidth, ih = metrics.imageHeight;
+    int cw = 0, ch = 0;
+    StripCellSize(manager, &cw, &ch);
+    if (iw <= 0 || ih <= 0 || cw <= 0 || ch <= 0) return nullptr;
     ScreenDC screen;
     HDC memory = GdiTrackDC(CreateCompatibleDC(screen));
     HBITMAP image = GdiTrack(CreateCompatibleBitmap(screen, iw, ih));
     if (memory && image && BeginButtonPaint(manager, memory)) {
         SelectScope select(memory, image);
+        FillSolidBox(memory, 0, 0, iw, ih, colorFace);
         UINT column = 0, row = 0;
         StripCellOf(imageIndex, &column, &row);
-        BitBlt(memory, 0, 0, iw, ih, stripDC, static_cast<int>(column) * iw, static_cast<int>(row) * ih, SRCCOPY);
+        BitBlt(memory, (iw - cw) / 2, (ih - ch) / 2, cw, ch, stripDC, static_cast<int>(column) * cw,
+               static_cast<int>(row) * ch, SRCCOPY);
         EndButtonPaint();
     }
     GdiDeleteDC(memory);

@@ -6,6 +6,8 @@
 #include <cstdlib>
 
 #include "access/access.h"
+#include "command/command.h"
+#include "modal.h"
 #include "harness.h"
 #include "quaybar.h"
 
@@ -270,6 +272,62 @@ TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
         }
         QBR_DestroyToolbar(pane);
         Pump();
+    }
+}
+
+// Each line of the chevron's menu shows its own button's image at the frame's
+// scale: as large as the scale's images, and pixel for pixel a picture that
+// the same button shows on a toolbar where it can be seen.
+TEST_F(ScaleTest, TheChevronsMenuShowsEachButtonsOwnImageAtTheFramesScale) {
+    const Scaled &s = Here();
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2, 3, 4, 5, 6}, TBF_VISIBLE | TBF_DOCKED);
+    HWND whole = Make({1, 2, 3, 4, 5, 6}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    RECT outer = WindowRectInParent(pane);
+    const RECT usable = Rect(0, 0, outer.left + (outer.right - outer.left) / 2, ClientRectOf(frame).bottom);
+    ASSERT_EQ(1u, QBR_SetUsableArea(manager, &usable));
+    Pump();
+    struct Line {
+        UINT index;
+        Pixels image;
+    };
+    std::vector<Line> lines;
+    ModalSteps::Until([&] {
+        HMENU menu = OpenMenu();
+        if (!menu) return false;
+        for (int i = 0; i < GetMenuItemCount(menu); ++i) {
+            MENUITEMINFOA info = {};
+            info.cbSize = sizeof info;
+            info.fMask = MIIM_BITMAP | MIIM_ID;
+            GetMenuItemInfoA(menu, static_cast<UINT>(i), TRUE, &info);
+            if (info.hbmpItem) lines.push_back({info.wID - 1, BitmapPixels(info.hbmpItem)});
+        }
+        EndMenu();
+        return true;
+    });
+    ShowChevronMenu(pane);
+    ModalSteps::Stop();
+    ASSERT_GE(lines.size(), 2u);
+    HWND floatingFrame = ResolveRoleWindow(whole, ROLE_FLOATING);
+    RedrawWindow(floatingFrame, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+    const Pixels shown = ReadWindowPixels(floatingFrame);
+    const std::vector<RECT> buttons = ItemRects(whole);
+    for (const Line &line : lines) {
+        SCOPED_TRACE(line.index);
+        ASSERT_EQ(s.imageWidth, line.image.width);
+        ASSERT_EQ(s.imageHeight, line.image.height);
+        const RECT &b = buttons[line.index];
+        bool found = false;
+        for (int y = b.top; y + s.imageHeight <= b.bottom && !found; ++y)
+            for (int x = b.left; x + s.imageWidth <= b.right && !found; ++x) {
+                bool same = true;
+                for (int dy = 0; dy < s.imageHeight && same; ++dy)
+                    for (int dx = 0; dx < s.imageWidth && same; ++dx)
+                        same = shown.At(x + dx, y + dy) == line.image.At(dx, dy);
+                found = same;
+            }
+        EXPECT_TRUE(found) << "the menu line's image is not the button's";
     }
 }
 
