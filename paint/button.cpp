@@ -276,7 +276,7 @@ void PaintDither(const ButtonLook &b) {
 // The label under the image, centred, in the target's own text colour.
 void PaintLabel(const ButtonLook &b, UINT id) {
     BkModeScope transparent(targetDC, TRANSPARENT);
-    SelectScope font(targetDC, buttonFont);
+    SelectScope font(targetDC, ButtonFontAt(PassMetrics().dpi));
     char text[kHelpTextSize + 2];
     text[0] = '\0';
     int length = RequestHelpText(id, HELP_BUTTON_TEXT, text, kHelpTextSize);
