@@ -237,8 +237,9 @@ class ToolbarAccessible final : public IAccessible {
         } else if (IsChevron(record, id)) {
             ChevronRect(record, &rect);
             ClientRectToScreen(record->paneWindow, &rect);
-        } else if (!ItemScreenRect(record, static_cast<UINT>(id - 1), &rect)) {
-            return S_FALSE; // a separator the floating frame leaves out has no place
+        } else if (SightOf(record, static_cast<UINT>(id - 1)) != Sight::Shown ||
+                   !ItemScreenRect(record, static_cast<UINT>(id - 1), &rect)) {
+            return S_FALSE; // nothing on the screen to point at
         }
         *left = rect.left;
         *top = rect.top;
@@ -253,7 +254,7 @@ class ToolbarAccessible final : public IAccessible {
         if (!record) return kGone;
         RECT outer;
         POINT p = {x, y};
-        if (!GetWindowRect(ItemsWindow(record), &outer) || !PtInRect(&outer, p)) return S_FALSE;
+        if (!InUse(record) || !GetWindowRect(window_, &outer) || !PtInRect(&outer, p)) return S_FALSE;
         // The chevron lies over the items it cuts off, and wins as for a click.
         POINT inPane = p;
         ScreenToClient(record->paneWindow, &inPane);
@@ -265,7 +266,8 @@ class ToolbarAccessible final : public IAccessible {
         // first item that holds the point wins, as for a click.
         for (UINT i = 0; i < PointerListCount(record->items); ++i) {
             RECT rect;
-            if (ItemScreenRect(record, i, &rect) && PointInRectInclusive(&rect, x, y)) {
+            if (SightOf(record, i) == Sight::Shown && ItemScreenRect(record, i, &rect) &&
+                PointInRectInclusive(&rect, x, y)) {
                 SetChild(found, static_cast<LONG>(i + 1));
                 return S_OK;
             }
@@ -339,6 +341,24 @@ class ToolbarAccessible final : public IAccessible {
 
     const ToolbarRecord *Record() const { return IsWindow(window_) ? RecordOfWindow(window_) : nullptr; }
 
+    // Whether this object's window is the one showing the toolbar's items
+    // now: the docked copy of a floating toolbar (or the hidden frame of a
+    // docked one) shows none of them.
+    bool InUse(const ToolbarRecord *record) const {
+        return window_ == ItemsWindow(record) && IsWindowVisible(window_);
+    }
+
+    // How an item stands for a reader: on the screen; cut off behind the
+    // chevron, on no part of the screen a user can see (off screen); or not
+    // shown at all: its window is not in use, or the flow leaves it out (a
+    // separator the floating frame does not draw, or drops at a wrap).
+    enum class Sight { Shown, OffScreen, Invisible };
+    Sight SightOf(const ToolbarRecord *record, UINT index) const {
+        RECT rect;
+        if (!InUse(record) || !GetItemRect(record, index, &rect)) return Sight::Invisible;
+        return IsItemCutOff(record, index) ? Sight::OffScreen : Sight::Shown;
+    }
+
     // The record and the child id a call names; an error for a gone toolbar
     // or a child that is not there.
     HRESULT Resolve(const VARIANT &child, const ToolbarRecord **record, LONG *id) const {
@@ -384,10 +404,15 @@ class ToolbarAccessible final : public IAccessible {
     }
 
     DWORD StateOf(const ToolbarRecord *record, LONG id) const {
-        // A toolbar's items are on the screen only while its window is.
-        const DWORD hidden = IsWindowVisible(id == CHILDID_SELF ? window_ : ItemsWindow(record))
-                                 ? 0
-                                 : static_cast<DWORD>(STATE_SYSTEM_INVISIBLE);
+        DWORD hidden = 0;
+        if (id == CHILDID_SELF || IsChevron(record, id)) {
+            if (!(id == CHILDID_SELF ? IsWindowVisible(window_) : InUse(record))) hidden = STATE_SYSTEM_INVISIBLE;
+        } else {
+            const Sight sight = SightOf(record, static_cast<UINT>(id - 1));
+            hidden = sight == Sight::Invisible   ? STATE_SYSTEM_INVISIBLE
+                     : sight == Sight::OffScreen ? STATE_SYSTEM_OFFSCREEN
+                                                 : 0;
+        }
         if (IsChevron(record, id))
             return hidden | STATE_SYSTEM_FOCUSABLE | STATE_SYSTEM_HASPOPUP |
                    (AccessIsFocused(record, static_cast<UINT>(id - 1)) ? STATE_SYSTEM_FOCUSED : 0);

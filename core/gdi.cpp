@@ -14,13 +14,14 @@ extern "C" void QBR_GetLiveCounts(LONG *memoryBlocks, LONG *gdiObjects) {
     if (gdiObjects) *gdiObjects = LiveGdiObjects();
 }
 
-HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName) {
+HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName, UINT dpi) {
     LOGFONTA font;
     BlockFill(&font, 0, sizeof(font));
-    {
+    if (!dpi) {
         ScreenDC screen;
-        font.lfHeight = -MulDiv(points, GetDeviceCaps(screen, LOGPIXELSY), 72);
+        dpi = static_cast<UINT>(GetDeviceCaps(screen, LOGPIXELSY));
     }
+    font.lfHeight = -MulDiv(points, static_cast<int>(dpi), 72);
     font.lfWeight = 400;
     font.lfPitchAndFamily = pitchAndFamily;
     if (faceName) lstrcpynA(font.lfFaceName, faceName, LF_FACESIZE);

@@ -32,8 +32,8 @@ inline void GdiDeleteDC(HDC dc) {
 // A font from a LOGFONT with every field zero except the point size, weight
 // 400, variable-pitch and the given family bits, and an optional face name.
 // Several windows of the library and the demonstration host make theirs
-// this way.
-HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName);
+// this way. The size is at the display scale `dpi`; 0 is the screen's.
+HFONT MakePointFont(int points, BYTE pitchAndFamily, const char *faceName, UINT dpi = 0);
 
 // The screen's device context for the life of the scope.
 class ScreenDC {

@@ -15,7 +15,9 @@ static UINT RegisterDockClass(HINSTANCE instance) {
     WNDCLASSA existing;
     if (GetClassInfoA(instance, kDockClassName, &existing)) return 1;
     WNDCLASSA wc = {};
-    wc.style = CS_DBLCLKS;
+    // A dock that changes its height paints itself whole: its line lies on
+    // its last row, which a resize alone would leave where it was.
+    wc.style = CS_DBLCLKS | CS_HREDRAW | CS_VREDRAW;
     wc.lpfnWndProc = DockWindowProc;
     wc.cbClsExtra = 0;
     wc.cbWndExtra = sizeof(LONG_PTR);

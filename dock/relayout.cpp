@@ -75,6 +75,10 @@ extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
     if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
         SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
                      suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
+    // Moved and measured again, the frame may have come up over its floating
+    // toolbars on some window systems (seen once here while a tip showed): they
+    // go back above it, as after an activation.
+    KeepFloatingFramesAbove(manager);
     return 1;
 }
 

@@ -311,7 +311,7 @@ void PaintDither(const ButtonLook &b) {
 void PaintLabel(const ButtonLook &b, UINT id) {
     if (schemeActive != QBR_SCHEME_SYSTEM) SetTextColor(targetDC, InkOf(b));
     BkModeScope transparent(targetDC, TRANSPARENT);
-    SelectScope font(targetDC, buttonFont);
+    SelectScope font(targetDC, ButtonFontAt(PassMetrics().dpi));
     char text[kHelpTextSize + 2];
     text[0] = '\0';
     int length = RequestHelpText(id, HELP_BUTTON_TEXT, text, kHelpTextSize);
@@ -387,25 +387,31 @@ void DrawFocusFrame(HDC dc, const RECT *rect, const ScaledMetrics &metrics) {
 }
 
 void PaintMenuImage(ToolbarManager *manager, HDC dc, int width, int height, UINT imageIndex) {
-    if (!BeginButtonPaint(manager, dc)) return;
+    // The strip's cell (the strip of the frame's scale, or a smaller one
+    // enlarged) centred in the image of that scale, as a button shows it.
+    int cw = 0, ch = 0;
+    StripCellSize(manager, &cw, &ch);
+    if (cw <= 0 || ch <= 0 || !BeginButtonPaint(manager, dc)) return;
     UINT column = 0, row = 0;
     StripCellOf(imageIndex, &column, &row);
-    const int sourceX = static_cast<int>(column) * width, sourceY = static_cast<int>(row) * height;
+    const int sourceX = static_cast<int>(column) * cw, sourceY = static_cast<int>(row) * ch;
+    const int x = (width - cw) / 2, y = (height - ch) / 2;
     if (schemeActive == QBR_SCHEME_SYSTEM) {
-        BitBlt(dc, 0, 0, width, height, stripDC, sourceX, sourceY, SRCCOPY);
+        FillSolidBox(dc, 0, 0, width, height, colorFace);
+        BitBlt(dc, x, y, cw, ch, stripDC, sourceX, sourceY, SRCCOPY);
     } else {
         // The menu is the system's, in its colours whatever the scheme: the
         // glyph goes onto them as one ink, as in high contrast.
         FillSolidBox(dc, 0, 0, width, height, GetSysColor(COLOR_MENU));
-        PatBlt(maskDC, 0, 0, width, height, WHITENESS);
+        PatBlt(maskDC, 0, 0, cw, ch, WHITENESS);
         SetBkColor(stripDC, stripFaceColor);
-        BitBlt(maskDC, 0, 0, width, height, stripDC, sourceX, sourceY, SRCCOPY);
+        BitBlt(maskDC, 0, 0, cw, ch, stripDC, sourceX, sourceY, SRCCOPY);
         SetBkColor(stripDC, stripHighlightColor);
-        BitBlt(maskDC, 0, 0, width, height, stripDC, sourceX, sourceY, SRCPAINT);
+        BitBlt(maskDC, 0, 0, cw, ch, stripDC, sourceX, sourceY, SRCPAINT);
         MaskColorsScope colors(dc);
         SolidBrush ink(GetSysColor(COLOR_MENUTEXT));
         SelectScope select(dc, ink);
-        if (select.Selected()) BitBlt(dc, 0, 0, width, height, maskDC, 0, 0, kBrushWhereMaskClear);
+        if (select.Selected()) BitBlt(dc, x, y, cw, ch, maskDC, 0, 0, kBrushWhereMaskClear);
     }
     EndButtonPaint();
 }

@@ -99,8 +99,19 @@ void PaintFocusRect(const RECT *rect);
 void DrawFocusFrame(HDC dc, const RECT *rect, const ScaledMetrics &metrics);
 
 // ---- Surface and caption -----------------------------------------------------
+// The caption font and its band height at the screen's scale, made at start;
+// the *At calls give them (and the label font) at any scale, those of another
+// scale (a frame moved to another monitor) made on first use and kept until
+// the last client ends, so that a frame moved to a scale looks as one
+// started there.
 extern HFONT captionFont;
 extern int captionHeight;
+HFONT CaptionFontAt(UINT dpi);
+int CaptionHeightAt(UINT dpi);
+HFONT ButtonFontAt(UINT dpi);
+// The display scale of a toolbar window's host frame (a floating frame is
+// owned by it, a pane is its grandchild); the screen's for none.
+UINT ToolbarWindowDpi(HWND window);
 
 UINT CaptionFontStart();
 void CaptionFontEnd();

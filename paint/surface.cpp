@@ -28,9 +28,10 @@ constexpr int kMinDashCaption = 5;
 //   +---+-----------------------------------------+   <- line, row captionHeight - 1
 //    close box: (0, 0, captionHeight + 1, captionHeight)
 void PaintFloatingCaption(HWND window, HDC dc) {
+    const UINT dpi = ToolbarWindowDpi(window);
     RECT rect;
     GetClientRect(window, &rect);
-    rect.bottom = captionHeight;
+    rect.bottom = CaptionHeightAt(dpi);
     {
         // Active caption colour whether the frame is active or not.
         SolidBrush band(SchemeColor(SC_CAPTION));
@@ -54,7 +55,7 @@ void PaintFloatingCaption(HWND window, HDC dc) {
         const int copied = GetWindowTextA(window, text, length + 1);
         {
             BkModeScope transparent(dc, TRANSPARENT);
-            SelectScope font(dc, captionFont);
+            SelectScope font(dc, CaptionFontAt(dpi));
             SIZE extent = {0, 0};
             GetTextExtentPointA(dc, text, copied, &extent);
             TextColorScope color(dc, SchemeColor(SC_CAPTIONTEXT));
@@ -79,10 +80,11 @@ void PaintCloseBox(HWND window, HDC dc) {
     --box.right;
     --box.bottom;
     FillBox(dc, box, SchemeColor(SC_FACE));
-    if (captionHeight < kMinDashCaption) return;
+    const int height = CaptionHeightAt(ToolbarWindowDpi(window));
+    if (height < kMinDashCaption) return;
 
     // A white dash with a black outline and a grey shadow to the lower right.
-    const int t = ((captionHeight - 1) >> 1) + box.top;
+    const int t = ((height - 1) >> 1) + box.top;
     RECT dash = {box.left + 3, t, box.right - 1, t + 3};
     FillBox(dc, dash, kDashShadow);
     OffsetRect(&dash, -1, -1);

@@ -322,6 +322,53 @@ TEST_F(AccessTest, LocationsHitTestsAndNavigationAgreeWithTheItems) {
     }
 }
 
+// Items a user cannot see are read so, and have no place a hit test would
+// contradict: cut off behind the chevron (off screen), on the docked copy of
+// a floating toolbar, or a separator the floating frame does not draw
+// (invisible). Every item with a place is what a hit test finds there.
+TEST_F(AccessTest, ItemsOutOfSightAreReadSoAndHaveNoPlace) {
+    const LONG O = STATE_SYSTEM_OFFSCREEN, I = STATE_SYSTEM_INVISIBLE;
+    struct Row {
+        const char *what;
+        UINT flags;
+        int role;     // the window read
+        bool cut;     // the usable area ends just past the first button
+        LONG seen[4]; // the state's visibility bits of 1, |, 2, 3
+    } const rows[] = {
+        {"docked, cut off", TBF_VISIBLE | TBF_DOCKED, ROLE_DOCKED, true, {0, O, O, O}},
+        {"the docked copy of a floating toolbar", TBF_VISIBLE | TBF_FLOATING, ROLE_DOCKED, false, {I, I, I, I}},
+        {"floating without separators", TBF_VISIBLE | TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS, ROLE_FLOATING, false,
+         {0, I, 0, 0}},
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(row.what);
+        HWND pane = Make("Tools", {1, 0, 2, 3}, row.flags);
+        RECT usable = ClientRectOf(frame);
+        if (row.cut) {
+            POINT edge = {ScreenItem(pane, 0).right + MulDiv(13, ManagerDpi(manager), 96), 0};
+            ScreenToClient(frame, &edge);
+            usable.right = edge.x;
+        }
+        QBR_SetUsableArea(manager, &usable);
+        Pump();
+        Reader reader(ResolveRoleWindow(pane, row.role));
+        ASSERT_NE(nullptr, reader.object);
+        for (LONG child = 1; child <= 4; ++child) {
+            SCOPED_TRACE(child);
+            EXPECT_EQ(row.seen[child - 1], reader.State(child) & (O | I));
+            const RECT place = reader.Location(child);
+            EXPECT_EQ(row.seen[child - 1] == 0, !IsRectEmpty(&place)) << place;
+            const RECT item = ScreenItem(pane, UINT(child - 1));
+            const POINT centre = {(item.left + item.right) / 2, (item.top + item.bottom) / 2};
+            if (row.seen[child - 1] == 0)
+                EXPECT_EQ(child, reader.HitTest(centre));
+            else
+                EXPECT_NE(child, reader.HitTest(centre));
+        }
+        QBR_DestroyToolbar(pane);
+    }
+}
+
 TEST_F(AccessTest, DefaultActionIsACompletedClick) {
     QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
     QBR_SetButtonEnabled(manager, 3, 0);

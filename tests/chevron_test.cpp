@@ -280,6 +280,65 @@ TEST_F(ChevronTest, TheKeyboardAndScreenReadersReachTheChevron) {
     object->Release();
 }
 
+// A toolbar wholly past the edge, behind "Tools" in its row, has no chevron
+// of its own: the chevron of "Tools" offers its buttons as a submenu under
+// its title (and stands at the end of "Tools" when nothing of "Tools" is cut
+// off). The keyboard never stops on it; its buttons are clicked from there.
+TEST_F(ChevronTest, AToolbarWhollyPastTheEdgeIsReachedThroughTheChevronBeforeIt) {
+    const UINT ids[] = {7, 8};
+    HWND farPane = QBR_CreateToolbar("Far", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 2);
+    Pump();
+    POINT farStart = {0, 0};
+    MapWindowPoints(farPane, pane, &farStart, 1);
+    ASSERT_EQ(WindowRectInParent(pane).top, WindowRectInParent(farPane).top) << "one row";
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    struct Case {
+        int edge;
+        const char *menu;
+    } const cases[] = {
+        {Item(1).right + kChevronSize, "Q3:4 | Q4*:5 | -- | Q5:7 | Q6*:8 | -- | Far:4294967295"},
+        {static_cast<int>(farStart.x), "Q6*:8 | -- | Far:4294967295"},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.edge);
+        CutAt(c.edge);
+        ClearFrameLog();
+        RECT r;
+        EXPECT_EQ(0u, ChevronRect(RecordOfWindow(farPane), &r));
+        // F6, then Tab: the keyboard goes round "Tools" alone.
+        PumpHost(50);
+        Key(VK_F6);
+        Key(VK_TAB);
+        EXPECT_EQ(0u, AccessFocusedIndex(farPane, nullptr));
+        ASSERT_EQ(1u, AccessFocusedIndex(pane, nullptr));
+        Key(VK_END);
+        std::string seen, inFar;
+        ModalSteps::Until([&] {
+            HMENU menu = OpenMenu();
+            if (!menu) return false;
+            seen = DescribeMenu(menu);
+            HMENU sub = GetSubMenu(menu, GetMenuItemCount(menu) - 1);
+            inFar = DescribeMenu(sub);
+            ClickMenuEntry(menu, "Far");
+            ModalSteps::Until([sub] {
+                RECT shown;
+                if (!GetMenuItemRect(nullptr, sub, 0, &shown)) return false;
+                ClickMenuEntry(sub, "Q8");
+                return true;
+            });
+            return true;
+        });
+        Key(VK_RETURN);
+        PumpHost(100);
+        ModalSteps::Stop();
+        AccessLeaveKeyboard();
+        EXPECT_EQ(c.menu, seen);
+        EXPECT_EQ("Q7:1025 | Q8:1026", inFar);
+        EXPECT_EQ((std::vector<Heard>{Press(8), Release(8), Command(8)}), FrameLog()) << Describe(FrameLog());
+    }
+}
+
 // In a side dock the chevron lies across the column, above the bottom dock
 // (or the usable area's bottom edge), and the buttons below it are cut off.
 TEST_F(ChevronTest, ASideDockedToolbarIsCutOffAboveTheBottomDock) {

@@ -8,6 +8,8 @@
 #include <cstdlib>
 
 #include "access/access.h"
+#include "command/command.h"
+#include "modal.h"
 #include "harness.h"
 #include "quaybar.h"
 
@@ -275,6 +277,62 @@ TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
     }
 }
 
+// Each line of the chevron's menu shows its own button's image at the frame's
+// scale: as large as the scale's images, and pixel for pixel a picture that
+// the same button shows on a toolbar where it can be seen.
+TEST_F(ScaleTest, TheChevronsMenuShowsEachButtonsOwnImageAtTheFramesScale) {
+    const Scaled &s = Here();
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2, 3, 4, 5, 6}, TBF_VISIBLE | TBF_DOCKED);
+    HWND whole = Make({1, 2, 3, 4, 5, 6}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    RECT outer = WindowRectInParent(pane);
+    const RECT usable = Rect(0, 0, outer.left + (outer.right - outer.left) / 2, ClientRectOf(frame).bottom);
+    ASSERT_EQ(1u, QBR_SetUsableArea(manager, &usable));
+    Pump();
+    struct Line {
+        UINT index;
+        Pixels image;
+    };
+    std::vector<Line> lines;
+    ModalSteps::Until([&] {
+        HMENU menu = OpenMenu();
+        if (!menu) return false;
+        for (int i = 0; i < GetMenuItemCount(menu); ++i) {
+            MENUITEMINFOA info = {};
+            info.cbSize = sizeof info;
+            info.fMask = MIIM_BITMAP | MIIM_ID;
+            GetMenuItemInfoA(menu, static_cast<UINT>(i), TRUE, &info);
+            if (info.hbmpItem) lines.push_back({info.wID - 1, BitmapPixels(info.hbmpItem)});
+        }
+        EndMenu();
+        return true;
+    });
+    ShowChevronMenu(pane);
+    ModalSteps::Stop();
+    ASSERT_GE(lines.size(), 2u);
+    HWND floatingFrame = ResolveRoleWindow(whole, ROLE_FLOATING);
+    RedrawWindow(floatingFrame, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+    const Pixels shown = ReadWindowPixels(floatingFrame);
+    const std::vector<RECT> buttons = ItemRects(whole);
+    for (const Line &line : lines) {
+        SCOPED_TRACE(line.index);
+        ASSERT_EQ(s.imageWidth, line.image.width);
+        ASSERT_EQ(s.imageHeight, line.image.height);
+        const RECT &b = buttons[line.index];
+        bool found = false;
+        for (int y = b.top; y + s.imageHeight <= b.bottom && !found; ++y)
+            for (int x = b.left; x + s.imageWidth <= b.right && !found; ++x) {
+                bool same = true;
+                for (int dy = 0; dy < s.imageHeight && same; ++dy)
+                    for (int dx = 0; dx < s.imageWidth && same; ++dx)
+                        same = shown.At(x + dx, y + dy) == line.image.At(dx, dy);
+                found = same;
+            }
+        EXPECT_TRUE(found) << "the menu line's image is not the button's";
+    }
+}
+
 // At 96 DPI a frame never sees the strips drawn for larger scales.
 TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
     // Only the run at 96 DPI can show this; the runs at 144 and 192 say so.
@@ -400,7 +458,7 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
     GetWindowRect(floatingFrame, &frameAfter);
     EXPECT_EQ(frameBefore.left, frameAfter.left);
     EXPECT_EQ(frameBefore.top, frameAfter.top);
-    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, CaptionHeightAt(s.dpi) + s.frameTop + 3 * bh + s.frameBottom),
               ClientRectOf(floatingFrame));
     // The strip was chosen again for the new scale.
     int cw = 0, ch = 0;
@@ -413,6 +471,150 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleMeasuresItsToolbarsAgain) {
     QBR_DestroyManager(m);
     DestroyWindow(frame);
     Pump();
+}
+
+namespace {
+
+// What a frame shows of its toolbars: the rectangle (in the frame's client
+// coordinates) and the pixels of every dock, pane and floating frame.
+struct FrameLook {
+    std::vector<RECT> rects;
+    std::vector<Pixels> pixels;
+};
+
+// The size of the ink of `text` in a font of `points` at `dpi`, as the
+// platform draws it: what a label or a caption at that scale measures.
+SIZE InkOfText(const char *text, int points, int dpi) {
+    HDC screen = GetDC(nullptr);
+    HDC dc = CreateCompatibleDC(screen);
+    HBITMAP bitmap = CreateCompatibleBitmap(screen, 200, 100);
+    ReleaseDC(nullptr, screen);
+    HGDIOBJ oldBitmap = SelectObject(dc, bitmap);
+    HFONT font = CreateFontA(-MulDiv(points, dpi, 72), 0, 0, 0, 400, 0, 0, 0, 0, 0, 0, 0, VARIABLE_PITCH | FF_SWISS,
+                             nullptr);
+    HGDIOBJ oldFont = SelectObject(dc, font);
+    RECT all = {0, 0, 200, 100};
+    FillRect(dc, &all, static_cast<HBRUSH>(GetStockObject(WHITE_BRUSH)));
+    TextOutA(dc, 10, 10, text, lstrlenA(text));
+    LONG left = 200, top = 100, right = -1, bottom = -1;
+    for (int y = 0; y < 100; ++y)
+        for (int x = 0; x < 200; ++x)
+            if (GetPixel(dc, x, y) != RGB(255, 255, 255)) {
+                left = std::min<LONG>(left, x), right = std::max<LONG>(right, x);
+                top = std::min<LONG>(top, y), bottom = std::max<LONG>(bottom, y);
+            }
+    SelectObject(dc, oldFont);
+    SelectObject(dc, oldBitmap);
+    DeleteObject(font);
+    DeleteObject(bitmap);
+    DeleteDC(dc);
+    return SIZE{right - left + 1, bottom - top + 1};
+}
+
+// The ink size of what differs from `face` in a part of a picture.
+SIZE InkIn(const Pixels &p, RECT part, COLORREF face) {
+    LONG left = part.right, top = part.bottom, right = part.left - 1, bottom = part.top - 1;
+    for (int y = part.top; y < part.bottom; ++y)
+        for (int x = part.left; x < part.right; ++x)
+            if (p.At(x, y) != face) {
+                left = std::min<LONG>(left, x), right = std::max<LONG>(right, x);
+                top = std::min<LONG>(top, y), bottom = std::max<LONG>(bottom, y);
+            }
+    return SIZE{right - left + 1, bottom - top + 1};
+}
+
+FrameLook LookOf(HWND frame, ToolbarManager *m) {
+    FrameLook look;
+    std::vector<HWND> windows;
+    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(m->docks, i); ++i)
+        windows.push_back(dock->window);
+    for (UINT i = 0; HWND pane = QBR_GetToolbar(m, i); ++i)
+        windows.push_back(ResolveRoleWindow(pane, ROLE_ACTIVE));
+    for (HWND w : windows) {
+        RedrawWindow(w, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_ALLCHILDREN);
+        RECT r;
+        GetWindowRect(w, &r);
+        ScreenRectToClient(frame, &r);
+        look.rects.push_back(r);
+        look.pixels.push_back(ReadWindowPixels(w));
+    }
+    return look;
+}
+
+} // namespace
+
+// A frame moved to another scale looks as one started there: every dock,
+// pane and floating frame has the same rectangle and the same pixels (the
+// caption band, the labels of button text, the dock's line), and the
+// floating frames stay above the frame.
+TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneStartedThere) {
+    const int other = OtherDpi(Here().dpi);
+    QBR_SetButtonText(1);
+    QBR_SetQuickHelp(0);
+    auto makeToolbars = [](DpiFrame f) {
+        QBR_SetImageStrip(f.manager, "SINGLE");
+        HWND top = QBR_CreateDock(f.manager, f.frame, DOCK_TOP);
+        const UINT docked[] = {1, 2, 0, 3}, floating[] = {4, 5, 6};
+        QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 4);
+        QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 300, 0, 0, top, floating, 3);
+        Pump();
+    };
+    FrameLook looks[2];
+    for (int fresh = 0; fresh < 2; ++fresh) {
+        DpiFrame f = MakeDpiFrame();
+        if (fresh) QBR_DpiChanged(f.frame, MAKEWPARAM(other, other), 0);
+        makeToolbars(f);
+        if (!fresh) QBR_DpiChanged(f.frame, MAKEWPARAM(other, other), 0);
+        Pump();
+        SCOPED_TRACE(fresh ? "made at the scale" : "moved to the scale");
+        looks[fresh] = LookOf(f.frame, f.manager);
+        HWND floatingFrame = ResolveRoleWindow(QBR_GetToolbar(f.manager, 1), ROLE_FLOATING);
+        EXPECT_EQ(floatingFrame, TopmostOfTwo(floatingFrame, f.frame));
+        // The caption band is as tall as a 7-point font's ascent and a line
+        // at this scale; the label of button 1 is in an 8-point font at it.
+        const Pixels &band = looks[fresh].pixels[2];
+        int line = 0;
+        while (line < band.height && band.At(band.width - 2, line) != GetSysColor(COLOR_WINDOWFRAME))
+            ++line;
+        HDC screen = GetDC(nullptr);
+        HFONT font = CreateFontA(-MulDiv(7, other, 72), 0, 0, 0, 400, 0, 0, 0, 0, 0, 0, 0, VARIABLE_PITCH | FF_SWISS,
+                                 nullptr);
+        HGDIOBJ old = SelectObject(screen, font);
+        TEXTMETRICA metrics = {};
+        GetTextMetricsA(screen, &metrics);
+        SelectObject(screen, old);
+        DeleteObject(font);
+        ReleaseDC(nullptr, screen);
+        EXPECT_EQ(metrics.tmAscent, line) << "the caption band's line";
+        RECT button = {};
+        GetItemRect(RecordOfWindow(QBR_GetToolbar(f.manager, 0)), 0, &button);
+        // Inside the face, clear of the raised edges, below the image.
+        const RECT labelPart = {button.left + 3, (button.top + button.bottom) / 2 + 1, button.right - 4,
+                                button.bottom - 4};
+        const SIZE label = InkIn(looks[fresh].pixels[1], labelPart, GetSysColor(COLOR_BTNFACE)),
+                   wanted = InkOfText("B1", 8, other);
+        EXPECT_EQ(wanted.cx, label.cx) << "the label's ink";
+        EXPECT_EQ(wanted.cy, label.cy) << "the label's ink";
+        QBR_DestroyManager(f.manager);
+        DestroyWindow(f.frame);
+        Pump();
+    }
+    QBR_SetButtonText(0);
+    const char *names[] = {"the top dock", "the docked toolbar", "the floating frame"};
+    ASSERT_EQ(3u, looks[0].rects.size());
+    ASSERT_EQ(looks[1].rects.size(), looks[0].rects.size());
+    for (size_t i = 0; i < looks[0].rects.size(); ++i) {
+        SCOPED_TRACE(names[i]);
+        EXPECT_EQ(looks[1].rects[i], looks[0].rects[i]);
+        const Pixels &moved = looks[0].pixels[i], &fresh = looks[1].pixels[i];
+        ASSERT_EQ(fresh.width, moved.width);
+        ASSERT_EQ(fresh.height, moved.height);
+        int differ = 0, firstX = -1, firstY = -1;
+        for (int y = 0; y < fresh.height; ++y)
+            for (int x = 0; x < fresh.width; ++x)
+                if (moved.At(x, y) != fresh.At(x, y) && differ++ == 0) firstX = x, firstY = y;
+        EXPECT_EQ(0, differ) << "pixels differ, the first at " << firstX << "," << firstY;
+    }
 }
 
 // ---- The layout table across scales -------------------------------------------------
@@ -488,7 +690,7 @@ TEST_F(ClientTest, ALayoutWrittenAtOneScaleRestoresAtAnother) {
     EXPECT_EQ(placeBefore.left, placeAfter.left);
     EXPECT_EQ(placeBefore.top, placeAfter.top);
     const int l = s.areaLeft, bw = s.buttonWidth, bh = s.buttonHeight;
-    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, captionHeight + s.frameTop + 3 * bh + s.frameBottom),
+    EXPECT_EQ(Rect(0, 0, 2 * l + 3 * bw - 2, CaptionHeightAt(s.dpi) + s.frameTop + 3 * bh + s.frameBottom),
               ClientRectOf(floatingFrame));
     EXPECT_EQ((std::vector<UINT>{1, 0, 2}), ToolbarIds(QBR_GetToolbar(b.manager, 0)));
     QBR_DestroyManager(b.manager);
@@ -766,7 +968,7 @@ TEST_F(ClientTest, RowsOfFloatingToolbarsSurviveEveryChangeOfScale) {
             HWND pane = QBR_GetToolbar(made.manager, i);
             EXPECT_EQ(expected[i].breaks, BreakIds(RecordOfWindow(pane)->floatingBreaks)) << "toolbar " << i;
             EXPECT_EQ(Rect(0, 0, 2 * s.areaLeft + expected[i].across * (s.buttonWidth - 1) + 1,
-                           captionHeight + s.frameTop + expected[i].rows * s.buttonHeight + s.frameBottom),
+                           CaptionHeightAt(s.dpi) + s.frameTop + expected[i].rows * s.buttonHeight + s.frameBottom),
                       ClientRectOf(ResolveRoleWindow(pane, ROLE_FLOATING)))
                 << "toolbar " << i;
         }

@@ -29,19 +29,20 @@ bool UsableArea(const ToolbarManager *manager, RECT *area) {
     return true;
 }
 
-} // namespace
-
-UINT ChevronRect(const ToolbarRecord *record, RECT *rect) {
-    if (!record || !rect || RecordIsFloating(record) || !(RecordFlags(record) & TBF_VISIBLE)) return 0;
+// A shown docked pane's dock side, and where the usable area ends along its
+// row (top and bottom docks: an x) or its column (side docks: a y), in the
+// pane's client coordinates. False without a usable area.
+bool UsableEdge(const ToolbarRecord *record, bool *across, int *edgeAlong) {
+    if (!record || RecordIsFloating(record) || !(RecordFlags(record) & TBF_VISIBLE)) return false;
     HWND pane = record->paneWindow;
     ToolbarManager *manager = ManagerOfToolbar(pane);
     RECT area;
-    if (!pane || !IsWindowVisible(pane) || !UsableArea(manager, &area)) return 0;
+    if (!pane || !IsWindowVisible(pane) || !UsableArea(manager, &area)) return false;
     UINT side = DOCK_TOP;
-    if (!GetDockSide(GetParent(pane), &side)) return 0;
-    const bool across = IsAcrossDock(side);
+    if (!GetDockSide(GetParent(pane), &side)) return false;
+    *across = IsAcrossDock(side);
     POINT edge = {area.right, area.bottom};
-    if (!across) {
+    if (!*across) {
         // The side docks end above the bottom dock, shown or not.
         if (HWND bottom = DockWindowForSide(manager, DOCK_BOTTOM)) {
             RECT b;
@@ -52,27 +53,81 @@ UINT ChevronRect(const ToolbarRecord *record, RECT *rect) {
         }
     }
     MapWindowPoints(manager->frame, pane, &edge, 1);
+    *edgeAlong = *across ? edge.x : edge.y;
+    return true;
+}
+
+// A docked toolbar of which nothing lies inside the usable area: it stands
+// wholly past the edge, in a row (or column) that the toolbar before it runs
+// out of. Its buttons are offered by that toolbar's chevron.
+bool WhollyPastEdge(const ToolbarRecord *record) {
+    bool across = true;
+    int edge = 0;
+    return UsableEdge(record, &across, &edge) && edge <= 0;
+}
+
+// The places of two panes of one dock: whether they stand in one row (or,
+// across a side dock, one column); rows are packed with a common top.
+bool SameLine(HWND a, HWND b, bool across) {
+    RECT ra, rb;
+    GetWindowRect(a, &ra);
+    GetWindowRect(b, &rb);
+    return across ? ra.top == rb.top : ra.left == rb.left;
+}
+
+} // namespace
+
+std::vector<ToolbarRecord *> ToolbarsBehindChevron(const ToolbarRecord *record) {
+    std::vector<ToolbarRecord *> behind;
+    bool across = true;
+    int edge = 0;
+    if (!UsableEdge(record, &across, &edge) || edge <= 0) return behind;
+    DockArea *dock = FindDockRecord(GetParent(record->paneWindow));
+    UINT at = 0;
+    if (!dock || !PointerListFind(dock->toolbars, ListValue(record), &at)) return behind;
+    for (UINT i = at + 1; ToolbarRecord *next = ListAt<ToolbarRecord>(dock->toolbars, i); ++i) {
+        if (RecordIsFloating(next) || !(RecordFlags(next) & TBF_VISIBLE) || !next->paneWindow ||
+            !SameLine(record->paneWindow, next->paneWindow, across))
+            continue;
+        // A later toolbar of the row that shows: the row's chevron is its.
+        if (!WhollyPastEdge(next)) return {};
+        behind.push_back(next);
+    }
+    return behind;
+}
+
+UINT ChevronRect(const ToolbarRecord *record, RECT *rect) {
+    bool across = true;
+    int edge = 0;
+    if (!rect || !UsableEdge(record, &across, &edge)) return 0;
+    if (edge <= 0) return 0; // nothing of it shows: the toolbar before it offers its buttons
+    HWND pane = record->paneWindow;
     RECT client;
     GetClientRect(pane, &client);
+    const int end = across ? client.right : client.bottom;
+    // The last toolbar that shows in its row carries the chevron for the ones
+    // wholly past the edge, at its own end if it is not cut off itself.
+    const bool carries = !ToolbarsBehindChevron(record).empty();
+    if (edge >= end && !carries) return 0;
+    if (edge > end) edge = end;
     RECT chevron = client;
-    const int size = ManagerMetrics(manager).chevronSize;
+    const int size = ManagerMetrics(ManagerOfToolbar(pane)).chevronSize;
     if (across) {
-        if (edge.x >= client.right || edge.x <= 0) return 0; // wholly in, or nothing of it shows
-        chevron.right = edge.x;
-        chevron.left = edge.x > size ? edge.x - size : 0;
+        chevron.right = edge;
+        chevron.left = edge > size ? edge - size : 0;
     } else {
-        if (edge.y >= client.bottom || edge.y <= 0) return 0;
-        chevron.bottom = edge.y;
-        chevron.top = edge.y > size ? edge.y - size : 0;
+        chevron.bottom = edge;
+        chevron.top = edge > size ? edge - size : 0;
     }
     // Only an item cut off makes a chevron, not a margin alone.
     POINT extent = {0, 0};
-    if (!ShownItemsExtent(record, &extent) || !(across ? extent.x > edge.x : extent.y > edge.y)) return 0;
+    if (!carries && (!ShownItemsExtent(record, &extent) || !(across ? extent.x > edge : extent.y > edge))) return 0;
     *rect = chevron;
     return 1;
 }
 
 bool IsItemCutOff(const ToolbarRecord *record, UINT index) {
+    if (WhollyPastEdge(record)) return index < PointerListCount(record->items);
     RECT chevron, item;
     if (!ChevronRect(record, &chevron) || !GetItemRect(record, index, &item)) return false;
     UINT side = DOCK_TOP;

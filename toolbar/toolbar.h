@@ -2,6 +2,8 @@
 // windows of each toolbar. What the rest of the library may call.
 #pragma once
 
+#include <vector>
+
 #include "core/core.h"
 
 // Which window of a toolbar's pair an operation means.
@@ -123,6 +125,11 @@ RECT AreaMargins(HWND window, int role);
 // whether a point of `window` is on it.
 UINT ChevronRect(const ToolbarRecord *record, RECT *rect);
 bool IsItemCutOff(const ToolbarRecord *record, UINT index);
+// The toolbars of `record`'s row (column, in a side dock) that stand wholly
+// past the usable edge, in packing order, when `record` is the last one of
+// the row that shows: its chevron offers their buttons too. Every item of
+// such a toolbar is cut off.
+std::vector<ToolbarRecord *> ToolbarsBehindChevron(const ToolbarRecord *record);
 void PaintChevron(HWND window, HDC dc);
 UINT InChevron(HWND window, int x, int y);
 

@@ -172,9 +172,9 @@ void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
 RECT AreaMargins(HWND window, int role) {
     const ScaledMetrics &metrics = ManagerMetrics(ManagerOfToolbar(window));
     if (role == ROLE_DOCKED) return metrics.paneMargins;
-    // The caption band is the caption font's, which already has the screen's scale.
+    // The caption band is the caption font's at the frame's scale.
     RECT margins = metrics.frameMargins;
-    margins.top += captionHeight;
+    margins.top += CaptionHeightAt(metrics.dpi);
     return margins;
 }
 

@@ -1,16 +1,22 @@
 # Shared by the end-to-end scripts: the Wine environment of a build folder,
 # the control tool, starting and ending the demonstration program.
-# Source it with the build folder as $1.
+# Source it with the build folder as $1 and, for a script that runs at a
+# display scale, the DPI as $2 (96 when absent): the program then runs in the
+# build folder's prefix of that scale (wine-env.sh BUILD_DIR DPI).
 build=$(cd "$1" && pwd)
+dpi=${2:-96}
+suffix=""
+[ "$dpi" != 96 ] && suffix="-$dpi"
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
-"$here/scripts/wine-env.sh" start "$build" || exit 1
-. "$build/wine-env/exports.sh"
+"$here/scripts/wine-env.sh" start "$build" "$dpi" || exit 1
+. "$build/wine-env$suffix/exports.sh"
 out="$build/e2e"
 mkdir -p "$out"
-# Each script runs the program from a folder of its own, BUILD/e2e/<script>/,
-# so the settings file it reads and writes ($ini) is that folder's and the
-# user's own build/bin/qbrdemo.INI is never touched.
-run="$out/$(basename "$0" .sh)"
+# Each script runs the program from a folder of its own, BUILD/e2e/<script>/
+# (BUILD/e2e/<script>-DPI/ at another scale), so the settings file it reads
+# and writes ($ini) is that folder's and the user's own build/bin/qbrdemo.INI
+# is never touched.
+run="$out/$(basename "$0" .sh)$suffix"
 mkdir -p "$run"
 ini="$run/qbrdemo.INI"
 main="Quaybar Demo"
@@ -31,7 +37,7 @@ fail() {
     fi
     exit 1
 }
-shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1.png"; }
+shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1$suffix.png"; }
 
 # Starts the program and waits for its main window and its first paint.
 start_demo() {

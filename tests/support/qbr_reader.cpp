@@ -86,7 +86,8 @@ std::string State(IAccessible *object, LONG id) {
                   {STATE_SYSTEM_PRESSED, "pressed"},
                   {STATE_SYSTEM_FOCUSABLE, "focusable"},
                   {STATE_SYSTEM_FOCUSED, "focused"},
-                  {STATE_SYSTEM_INVISIBLE, "invisible"}};
+                  {STATE_SYSTEM_INVISIBLE, "invisible"},
+                  {STATE_SYSTEM_OFFSCREEN, "offscreen"}};
     const LONG bits = StateBits(object, id);
     std::string out;
     for (const auto &n : kNames)
