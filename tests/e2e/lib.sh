@@ -44,7 +44,9 @@ start_demo() {
     cp "$build/bin/qbrdemo.exe" "$build/bin/QBRDEMO.TXT" "$run/" || fail "cannot copy the program to $run"
     wine "$run/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
     demo_pid=$!
-    ctl wait "$main" 20000 || fail "the main window did not appear ($1)"
+    # Generous: a start under a loaded machine (Wine's process start-up, the
+    # desktop) once took longer than 20 s; a program that hangs still fails.
+    ctl wait "$main" 60000 || fail "the main window did not appear ($1)"
     sleep 1
 }
 
