@@ -343,20 +343,6 @@ TEST_F(AccessTest, DefaultActionIsACompletedClick) {
     EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
 }
 
-TEST_F(AccessTest, ACallAfterTheToolbarIsGoneAnswersAnError) {
-    HWND pane = Make("Tools", {1, 2});
-    Reader reader(pane);
-    ASSERT_NE(nullptr, reader.object);
-    QBR_DestroyToolbar(pane);
-    Pump();
-    LONG count = 7;
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->get_accChildCount(&count));
-    EXPECT_EQ(0, count);
-    VARIANT v;
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->get_accState(Reader::Child(1), &v));
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->accDoDefaultAction(Reader::Child(1)));
-}
-
 TEST_F(AccessTest, EveryStateChangeShowAndHideIsAnEvent) {
     QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
     HWND pane = Make("Tools", {1, 2, 3});
@@ -434,38 +420,6 @@ TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     EXPECT_EQ(expected, trail);
     EXPECT_EQ(frame, GetFocus()) << "the keyboard went back to the host's window";
     EXPECT_EQ(frame, GetActiveWindow()) << "no toolbar took the activation";
-}
-
-TEST_F(AccessTest, EachFrameWalksItsOwnToolbars) {
-    Make("Main", {1, 2});
-    HWND view = CreateRecordingFrame(120, 120, 400, 300);
-    ToolbarManager *viewManager = QBR_CreateManager(view);
-    ASSERT_NE(nullptr, viewManager);
-    std::vector<UINT> ids = {5, 6};
-    QBR_AddButtons(viewManager, ids.data(), 2);
-    QBR_SetImageStrip(viewManager, "TESTSTRIP");
-    HWND viewPane = QBR_CreateToolbar("View", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0,
-                                      QBR_CreateDock(viewManager, view, DOCK_TOP), ids.data(), 2);
-    SetForegroundWindow(view);
-    SetFocus(view);
-    PumpHost(50);
-    Key("F6");
-    Key("Right");
-    UINT index = 9;
-    EXPECT_EQ(1u, AccessFocusedIndex(viewPane, &index));
-    EXPECT_EQ(1u, index);
-    EXPECT_EQ("host", Focus()) << "the main frame's toolbars stay as they were";
-    // The other frame activated: the keyboard goes back there, and F6 walks
-    // that frame's toolbars.
-    SetForegroundWindow(frame);
-    SetFocus(frame);
-    PumpHost(50);
-    EXPECT_EQ(0u, AccessFocusedIndex(viewPane, &index));
-    Key("F6");
-    EXPECT_EQ("Main 0", Focus());
-    QBR_DestroyManager(viewManager);
-    DestroyWindow(view);
-    PumpHost(50);
 }
 
 TEST_F(AccessTest, UpAndDownGoToTheNearestButtonInTheNextRow) {

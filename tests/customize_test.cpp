@@ -8,7 +8,6 @@
 
 #include "core/core.h"
 #include "customize/customize.h"
-#include "dialog_template.h"
 #include "harness.h"
 #include "input/input.h"
 #include "modal.h"
@@ -98,64 +97,6 @@ class CustomizeTest : public FrameTest {
 
 // ---- The dialog templates, as stored ---------------------------------------------------
 
-constexpr DWORD kShown = WS_CHILD | WS_VISIBLE;
-constexpr DWORD kModalBox = WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT;
-
-// Both customising dialogs, read back from this program's resources, in
-// dialog units: frame, font and every control in order.
-TEST(CustomizeTemplates, InsertAndNewToolbarTemplatesReadBackExactly) {
-    struct Dialog {
-        const char *name;
-        int cx, cy;
-        const char *caption;
-        std::vector<DialogControl> controls;
-    } const dialogs[] = {
-        {"QBR_Insert",
-         243,
-         148,
-         "Insert Toolbar Item",
-         {
-             {5004, "combo box", "", kShown | CBS_DROPDOWNLIST | WS_VSCROLL | WS_TABSTOP, 4, 5, 50, 69},
-             {5003, "list box", "",
-              kShown | LBS_NOTIFY | LBS_OWNERDRAWVARIABLE | LBS_NOINTEGRALHEIGHT | WS_BORDER | WS_VSCROLL | WS_TABSTOP,
-              5, 19, 48, 124},
-             {-1, "button", "Description", kShown | BS_GROUPBOX, 62, 4, 123, 37},
-             {5005, "static", "", kShown | WS_GROUP, 67, 17, 108, 17},
-             {1, "button", "Close", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 194, 6, 44, 14},
-             {5007, "button", "&New...", kShown | WS_TABSTOP, 194, 25, 44, 14},
-             {5002, "static",
-              "At any time, items can be moved or removed from a toolbar by dragging with the right mouse "
-              "button.To remove an item simply drag it off the toolbar.",
-              kShown | WS_GROUP, 62, 89, 127, 43},
-             {5001, "static",
-              "Choose a category, then click on an item to see its description. Insert the item by dragging it "
-              "to the toolbar. Note that an item can exist only once on a given toolbar.",
-              kShown | WS_GROUP, 62, 48, 127, 36},
-         }},
-        {"QBR_NewToolbar",
-         197,
-         44,
-         "New Toolbar",
-         {
-             {-1, "static", "&Enter a title for the new toolbar:", kShown | WS_GROUP, 7, 8, 126, 10},
-             {5006, "edit", "", kShown | ES_AUTOHSCROLL | WS_BORDER | WS_TABSTOP, 6, 18, 121, 13},
-             {1, "button", "OK", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP | WS_DISABLED, 145, 6, 44, 14},
-             {2, "button", "Cancel", kShown | WS_TABSTOP, 145, 23, 44, 14},
-         }},
-    };
-    for (const Dialog &d : dialogs) {
-        SCOPED_TRACE(d.name);
-        const DialogLayout layout = ReadDialogTemplate(GetModuleHandleA(nullptr), d.name);
-        EXPECT_EQ(static_cast<DWORD>(kModalBox), layout.style);
-        EXPECT_EQ((std::vector<int>{0, 0, d.cx, d.cy}), (std::vector<int>{layout.x, layout.y, layout.cx, layout.cy}));
-        EXPECT_EQ(d.caption, layout.caption);
-        EXPECT_EQ(8, layout.points);
-        EXPECT_EQ("MS Sans Serif", layout.face);
-        ASSERT_EQ(d.controls.size(), layout.controls.size());
-        for (size_t i = 0; i < d.controls.size(); ++i)
-            EXPECT_EQ(d.controls[i], layout.controls[i]) << "control " << i;
-    }
-}
 
 // ---- The toolbar menu -------------------------------------------------------------
 
@@ -224,40 +165,6 @@ TEST_F(CustomizeTest, MenuEntryTogglesShowAndKeepsThePlace) {
     OnToolbarCommand(beta, 201 + 4);
     OnToolbarCommand(beta, 0);
     EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, QBR_GetToolbarFlags(beta));
-}
-
-TEST_F(CustomizeTest, DockPressOpensMenuOwnedByFirstToolbarWithoutDelete) {
-    // The dock may reach past the frame's client area; press inside both.
-    RECT dock, client = ClientRectOf(frame);
-    GetWindowRect(top, &dock);
-    MapWindowPoints(frame, nullptr, reinterpret_cast<POINT *>(&client), 2);
-    POINT press = {std::min(dock.right, client.right) - 4, (dock.top + dock.bottom) / 2};
-    ASSERT_EQ(nullptr, FindToolbarAtPoint(manager, press.x, press.y));
-    ASSERT_EQ(top, WindowFromPoint(press));
-    std::string seen;
-    bool menuSeen = false;
-    PlaceCursorStep(press);
-    ModalSteps::Add([] { SendButton(MOUSEEVENTF_RIGHTDOWN); });
-    // The press opens the menu inside a dispatch of the loop below; the next
-    // steps run in the menu's own loop.
-    ModalSteps::Add([&] {
-        // Leave the menu before the release, so that the release picks nothing.
-        PlaceCursorStep(POINT{1000, 5});
-        ModalSteps::Add([] { SendButton(MOUSEEVENTF_RIGHTUP); });
-    });
-    ModalSteps::Add([&] {
-        HMENU menu = OpenMenu();
-        seen = DescribeMenu(menu);
-        menuSeen = true;
-        ClickMenuEntry(menu, "Beta");
-    });
-    for (int round = 0; round < 400 && !menuSeen; ++round)
-        PumpFor(5);
-    Pump();
-    ModalSteps::Stop();
-    Pump();
-    EXPECT_EQ("Alpha*:201 | Beta:202 | Gamma*:203 | -- | Insert Item...:101", seen);
-    EXPECT_TRUE(QBR_IsToolbarVisible(beta)) << "the command reached the first toolbar's pane";
 }
 
 TEST_F(CustomizeTest, DeleteAsksAndOnlyYesDeletes) {
@@ -344,39 +251,6 @@ TEST_F(CustomizeTest, InsertDialogCentresAndListsCategoriesItemsAndDescriptions)
     EXPECT_EQ((GetSystemMetrics(SM_CXSCREEN) - width) / 2, dialogRect.left);
     EXPECT_EQ((GetSystemMetrics(SM_CYSCREEN) - height) / 3, dialogRect.top);
     EXPECT_EQ(gdiBefore, LiveGdiObjects()) << "the dialog's font and the drawing brushes are gone";
-}
-
-TEST_F(CustomizeTest, InsertListDrawsButtonPicturesOnLinesOfButtonSize) {
-    for (UINT buttonText : {0u, 1u}) {
-        SCOPED_TRACE(buttonText);
-        QBR_SetButtonText(buttonText);
-        int buttonHeight = 0;
-        GetButtonSizes(nullptr, &buttonHeight, nullptr, nullptr);
-        LRESULT lineHeight = 0;
-        COLORREF selectedCorner = 0, plainCorner = 0;
-        int redInLine = 0;
-        ModalSteps::Add([&] {
-            HWND list = GetDlgItem(InsertDialog(), 5003);
-            lineHeight = SendMessageA(list, LB_GETITEMHEIGHT, 0, 0);
-            Pixels pixels = ReadWindowPixels(list);
-            RECT first, second;
-            SendMessageA(list, LB_GETITEMRECT, 0, reinterpret_cast<LPARAM>(&first));
-            SendMessageA(list, LB_GETITEMRECT, 1, reinterpret_cast<LPARAM>(&second));
-            selectedCorner = pixels.At(first.left + 1, first.top + 1);
-            plainCorner = pixels.At(second.left + 1, second.top + 1);
-            // The test strip puts pure red near the top left of every image.
-            for (int y = second.top; y < second.bottom && y < pixels.height; ++y)
-                for (int x = second.left; x < second.right; ++x)
-                    redInLine += pixels.At(x, y) == RGB(255, 0, 0);
-            PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0);
-        });
-        RunInsertDialog();
-        EXPECT_EQ(buttonHeight + 6, lineHeight);
-        EXPECT_EQ(GetSysColor(COLOR_HIGHLIGHT), selectedCorner);
-        EXPECT_EQ(GetSysColor(COLOR_WINDOW), plainCorner);
-        EXPECT_GT(redInLine, 0) << "the button's picture is drawn in its line";
-    }
-    QBR_SetButtonText(0);
 }
 
 // Drags out of the list with the real cursor, one dialog session: each drag
@@ -469,57 +343,6 @@ TEST_F(CustomizeTest, DragFromListInsertsAtTheDropPointOnly) {
     EXPECT_EQ(gdiBefore, LiveGdiObjects());
 }
 
-// The frame is drawn inverted on the screen: it must sit where the cursor took
-// it, the size of a button, and leave nothing behind after the drop.
-TEST_F(CustomizeTest, DragFrameFollowsTheCursorAndLeavesNoTrace) {
-    int width = 0, height = 0;
-    GetButtonSizes(&width, &height, nullptr, nullptr);
-    const POINT travel = {-200, -60}; // onto the test frame's empty client area
-    POINT press = {};
-    RECT expected = {}, region = {};
-    Pixels before, during, after;
-    ModalSteps::Add([&] {
-        RECT line = ScreenLineRect(GetDlgItem(InsertDialog(), 5003), 0);
-        press = Centre(line);
-        const int left = (line.left + line.right - width) / 2, top = (line.top + line.bottom - height) / 2;
-        expected = Rect(left + travel.x, top + travel.y, left + travel.x + width, top + travel.y + height);
-        region = expected;
-        InflateRect(&region, 3, 3);
-        before = ReadScreenPixels(region);
-        PlaceCursorStep(press);
-    });
-    ModalSteps::Add([] { SendButton(MOUSEEVENTF_LEFTDOWN); });
-    ModalSteps::Until([] { return ButtonDown(VK_LBUTTON); });
-    // Two moves, so that a frame that forgot the first one lands elsewhere.
-    ModalSteps::Add([&] { PlaceCursorStep(POINT{press.x + travel.x / 2, press.y}); });
-    ModalSteps::Add([&] { PlaceCursorStep(POINT{press.x + travel.x, press.y + travel.y}); });
-    ModalSteps::Add([&] { during = ReadScreenPixels(region); });
-    ModalSteps::Add([] { SendButton(MOUSEEVENTF_LEFTUP); }); // beside every toolbar
-    ModalSteps::Until([] { return !ButtonDown(VK_LBUTTON); });
-    ModalSteps::Add([&] {
-        after = ReadScreenPixels(region);
-        PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0);
-    });
-    RunInsertDialog();
-
-    ASSERT_EQ(before.colors.size(), during.colors.size());
-    int changedOnEdge = 0, changedElsewhere = 0;
-    for (int y = 0; y < before.height; ++y)
-        for (int x = 0; x < before.width; ++x) {
-            const int sx = region.left + x, sy = region.top + y;
-            const bool inFrame =
-                sx >= expected.left && sx < expected.right && sy >= expected.top && sy < expected.bottom;
-            const bool onEdge = inFrame && (sx < expected.left + 2 || sx >= expected.right - 2 ||
-                                            sy < expected.top + 2 || sy >= expected.bottom - 2);
-            const bool changed = before.At(x, y) != during.At(x, y);
-            (onEdge ? changedOnEdge : changedElsewhere) += changed;
-        }
-    EXPECT_GE(changedOnEdge, width + height) << "a checkered 2-pixel frame at " << expected;
-    EXPECT_EQ(0, changedElsewhere);
-    EXPECT_TRUE(before.colors == after.colors) << "the frame is erased at the drop";
-    EXPECT_EQ((std::vector<UINT>{1, 2}), Ids(alpha));
-}
-
 // ---- The New Toolbar dialog --------------------------------------------------------
 
 TEST_F(CustomizeTest, NewToolbarMakesAUserToolbarBelowTheInsertDialog) {
@@ -571,27 +394,6 @@ TEST_F(CustomizeTest, NewToolbarMakesAUserToolbarBelowTheInsertDialog) {
     EXPECT_EQ(insertRect.left, frameRect.left) << "below the Insert dialog";
     EXPECT_EQ(insertRect.bottom, frameRect.top);
     EXPECT_TRUE(IsWindowVisible(FrameOf(made)));
-}
-
-TEST_F(CustomizeTest, NewToolbarMakesNothingOnCancelOrAnEmptyTitle) {
-    const UINT countBefore = QBR_GetToolbarCount(manager);
-    for (WPARAM command : {WPARAM(IDCANCEL), WPARAM(IDOK)}) {
-        SCOPED_TRACE(command);
-        ModalSteps::Add([] { PostMessageA(InsertDialog(), WM_COMMAND, 5007, 0); });
-        ModalSteps::Add([&] {
-            HWND dialog = FindWindowA("#32770", "New Toolbar");
-            ASSERT_NE(nullptr, dialog);
-            // An OK that reaches the dialog with the box empty, as a
-            // keyboard Enter would send it even with the button disabled.
-            PostMessageA(dialog, WM_COMMAND, command, 0);
-        });
-        ModalSteps::Add([] {
-            EXPECT_EQ(nullptr, FindWindowA("#32770", "New Toolbar"));
-            PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0);
-        });
-        RunInsertDialog();
-        EXPECT_EQ(countBefore, QBR_GetToolbarCount(manager));
-    }
 }
 
 } // namespace

@@ -44,26 +44,6 @@ TEST_F(DockTest, NewTopDockIsHiddenPlaceholderAndTellsTheFrameOnce) {
     EXPECT_EQ(nullptr, FindDockRecord(frame));
 }
 
-TEST_F(DockTest, GetDockFindsTheOldestDockOfASide) {
-    EXPECT_EQ(nullptr, QBR_GetDock(nullptr, DOCK_TOP));
-    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
-    HWND left = MakeDock(DOCK_LEFT);
-    HWND top = MakeDock(DOCK_TOP);
-    HWND secondLeft = MakeDock(DOCK_LEFT);
-    ASSERT_NE(nullptr, secondLeft);
-    struct Case {
-        ToolbarManager *manager;
-        UINT side;
-        HWND expected;
-    } const cases[] = {
-        {nullptr, DOCK_LEFT, nullptr},  {manager, DOCK_TOP, top}, {manager, DOCK_LEFT, left},
-        {manager, DOCK_RIGHT, nullptr}, {manager, 7, nullptr},
-    };
-    for (const Case &c : cases)
-        EXPECT_EQ(c.expected, QBR_GetDock(c.manager, c.side)) << "side " << c.side;
-    EXPECT_EQ(nullptr, QBR_CreateDock(nullptr, frame, DOCK_TOP));
-}
-
 TEST_F(DockTest, SideDocksStartBelowTheTopDockAndRunToFullScreenHeight) {
     const ButtonSize b = CurrentButton();
     const int cyFull = GetSystemMetrics(SM_CYFULLSCREEN);
@@ -125,24 +105,6 @@ TEST_F(DockTest, RelayoutOfAHiddenUnchangedDockTellsTheFrameEveryTime) {
     EXPECT_EQ(0u, RelayoutDock(frame));
     Pump();
     EXPECT_EQ(0, CountHeard(WM_SIZE));
-}
-
-TEST_F(DockTest, DocksLeaveNoMemoryBehind) {
-    const LONG before = LiveMemoryBlocks();
-    HWND top = MakeDock(DOCK_TOP);
-    HWND left = MakeDock(DOCK_LEFT);
-    ASSERT_NE(nullptr, left);
-    EXPECT_LT(before, LiveMemoryBlocks());
-    QBR_DestroyDock(top);
-    QBR_DestroyDock(left);
-    EXPECT_FALSE(IsWindow(top));
-    EXPECT_EQ(0u, PointerListCount(manager->docks));
-    EXPECT_EQ(before, LiveMemoryBlocks());
-    // Records the manager frees itself at its end go as well.
-    ASSERT_EQ(1u, AddDockRecord(manager, frame, DOCK_RIGHT));
-    FreeDockRecord(ListAt<DockArea>(manager->docks, 0));
-    EXPECT_EQ(0u, PointerListCount(manager->docks));
-    EXPECT_EQ(before, LiveMemoryBlocks());
 }
 
 // ---- Docks with real toolbars -------------------------------------------------------
@@ -223,32 +185,6 @@ TEST_F(DockPackTest, PacksRowsWithSharedBordersAndWraps) {
     Float(2, false);
     EXPECT_EQ(1u, RelayoutDock(dock));
     EXPECT_EQ(r3, WindowRectInParent(t[2]));
-}
-
-// A first pane as wide as the limit still starts the first row at (-1, -1);
-// one pixel wider, it starts a new row one line lower, at (-1, 0). The pane is
-// sized by program, so the case holds on any screen.
-TEST_F(DockPackTest, APaneWiderThanTheLimitStartsANewRowOneLineLower) {
-    const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
-    HWND wide = Toolbar(1, 6);
-    const int h = H(WindowRectInParent(wide));
-    struct Case {
-        int width;
-        RECT pane;
-        int dockHeight;
-    } const cases[] = {
-        {limit, {-1, -1, limit - 1, h - 1}, h - 1},
-        {limit + 1, {-1, 0, limit, h}, h},
-        {limit + 40, {-1, 0, limit + 39, h}, h},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.width);
-        SetWindowPos(wide, nullptr, 0, 0, c.width, h, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
-        ASSERT_EQ(1u, PackDock(record));
-        Pump();
-        EXPECT_EQ(c.pane, WindowRectInParent(wide));
-        EXPECT_EQ(Rect(0, 0, limit, c.dockHeight), WindowRectInParent(dock));
-    }
 }
 
 // The worked example with panes forced to 300x28, 200x28 and 150x28, packed
@@ -422,19 +358,6 @@ TEST_F(DockPackTest, MovedPanesLeaveNoTrace) {
     const Pixels px = ReadWindowPixels(dock);
     EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(before.right - 1, y)) << "the old right border is gone";
     EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(after.right - 1, y)) << "the right border at the new place";
-}
-
-TEST_F(DockPackTest, ADockThatHoldsToolbarsIsNotDestroyed) {
-    HWND t1 = Toolbar(1, 5);
-    QBR_DestroyDock(dock);
-    EXPECT_TRUE(IsWindow(dock));
-    EXPECT_TRUE(IsWindow(t1));
-    EXPECT_EQ(record, FindDockRecord(dock));
-    QBR_DestroyToolbar(t1);
-    Pump();
-    QBR_DestroyDock(dock);
-    EXPECT_FALSE(IsWindow(dock));
-    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
 }
 
 // ---- The bottom dock ------------------------------------------------------------------

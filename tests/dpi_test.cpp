@@ -271,23 +271,6 @@ TEST_F(ScaleTest, AButtonShowsItsImageSharpAndCentred) {
     }
 }
 
-// At 96 DPI a frame never sees the strips drawn for larger scales.
-TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
-    // Only the run at 96 DPI can show this; the runs at 144 and 192 say so.
-    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case, shown by the run at 96 DPI";
-    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
-    HWND frame = CreateRecordingFrame();
-    ToolbarManager *m = QBR_CreateManager(frame);
-    ASSERT_EQ(1u, QBR_SetImageStrip(m, "MAIN"));
-    BITMAP info = {};
-    GetObjectA(m->imageStrip, sizeof info, &info);
-    EXPECT_EQ(368, info.bmWidth);
-    EXPECT_EQ(30, info.bmHeight);
-    QBR_DestroyManager(m);
-    DestroyWindow(frame);
-    QBR_Terminate();
-}
-
 // ---- A new scale for a frame ----------------------------------------------------------
 
 namespace {
@@ -513,31 +496,4 @@ TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
     QBR_DestroyManager(b.manager);
     DestroyWindow(b.frame);
     Pump();
-}
-
-// The floating frame's caption at the frame's scale: the band as tall as the
-// caption font at this DPI makes it, the line under it, then the margin above
-// the items, read back from the screen.
-TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
-    const Scaled &s = Here();
-    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
-    HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_FLOATING);
-    Pump();
-    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
-    RedrawWindow(frameWindow, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_FRAME);
-    Pixels shown = ReadWindowPixels(frameWindow);
-    // A 7-point font is MulDiv(7, dpi, 72) pixels high: its ascent grows with
-    // the scale (the exact ascent is the installed font's).
-    EXPECT_GE(captionHeight, MulDiv(7, s.dpi, 72) * 2 / 3);
-    const int x = shown.width - 2; // right of the centred title
-    std::vector<COLORREF> column, expected;
-    for (int y = 0; y < captionHeight + s.frameTop; ++y) {
-        column.push_back(shown.At(x, y));
-        expected.push_back(y < captionHeight - 1    ? GetSysColor(COLOR_ACTIVECAPTION)
-                           : y == captionHeight - 1 ? GetSysColor(COLOR_WINDOWFRAME)
-                                                    : GetSysColor(COLOR_BTNFACE));
-    }
-    EXPECT_EQ(expected, column);
-    // The first button's frame ring starts right below the margin.
-    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
 }

@@ -513,54 +513,6 @@ TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
 
 // ---- Toolbar drags -----------------------------------------------------------------
 
-// The bottom dock takes a dragged toolbar, gives it back to a double click
-// after a tear-off, and lets it go again when dragged out; it hides emptied.
-TEST_F(InputTest, ToolbarsAreDraggedIntoTheBottomDockAndOut) {
-    HWND bottom = MakeDock(DOCK_BOTTOM);
-    HWND anchor = Make({5, 6}); // keeps the top dock showing
-    HWND pane = Make({1, 2, 3});
-    const POINT into = InDock(bottom);
-    const POINT from = Empty(pane);
-    Down(from);
-    Move(Offset(from, 7, 9));
-    Move(into);
-    Up(into);
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
-    EXPECT_EQ(bottom, GetParent(pane));
-    EXPECT_EQ(bottom, QBR_GetToolbarDock(pane));
-    EXPECT_EQ(std::vector<HWND>{pane}, Order(bottom));
-    EXPECT_EQ(std::vector<HWND>{anchor}, Order(top));
-    EXPECT_TRUE(IsWindowVisible(bottom));
-    EXPECT_EQ(ClientRectOf(frame).bottom, WindowRectInParent(bottom).bottom) << "on the frame's bottom edge";
-    for (UINT state : stateHeard)
-        EXPECT_EQ(0u, state);
-
-    // A double click tears it off, another on the caption brings it back here.
-    Click(Empty(pane));
-    Mouse(WM_LBUTTONDBLCLK, Empty(pane));
-    Up(Empty(pane));
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
-    EXPECT_FALSE(IsWindowVisible(bottom));
-    Click(Caption(pane));
-    Mouse(WM_LBUTTONDBLCLK, Caption(pane));
-    Up(Caption(pane));
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
-    EXPECT_EQ(bottom, GetParent(pane));
-    EXPECT_TRUE(IsWindowVisible(bottom));
-
-    // Dragged out onto the frame's client area it floats; the dock hides.
-    const POINT again = Empty(pane);
-    Down(again);
-    Move(Offset(again, 7, -9));
-    Move(Outside());
-    Up(Outside());
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
-    EXPECT_FALSE(IsWindowVisible(bottom));
-    QBR_DestroyToolbar(pane);
-    QBR_DestroyToolbar(anchor);
-}
-
-
 TEST_F(InputTest, DropsDockFloatAndKeepLockedToolbarsOnTheirSide) {
     HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
     enum Drop { Outside_, OnTop, OnLeft, OnRight };
@@ -688,70 +640,7 @@ void ExpectFrameOnScreen(const Pixels &before, const RECT &area, const RECT &fra
     EXPECT_TRUE(inverted * 10 > band * 4 && inverted * 10 < band * 6) << inverted << " of " << band;
 }
 
-TEST_F(InputTest, TheDragFrameIsInvertedOnTheScreenAndErasedAfter) {
-    HWND pane = Make({1, 2, 3});
-    RECT outer, after;
-    GetWindowRect(pane, &outer);
-    const RECT area = {outer.left - 30, outer.top - 20, outer.right + 60, outer.bottom + 60};
-    const POINT from = Empty(pane);
-    const Pixels before = ReadScreenPixels(area);
-    Down(from);
-    ExpectFrameOnScreen(before, area, outer);
-    Move(Offset(from, 40, 25));
-    RECT moved = outer;
-    OffsetRect(&moved, 40, 25);
-    EXPECT_EQ(moved, mouseTrack.dragFrame);
-    ExpectFrameOnScreen(before, area, moved);
-    // Back to its own place and let go: nothing moves, the screen is as it was.
-    Move(from);
-    Up(from);
-    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
-    GetWindowRect(pane, &after);
-    EXPECT_EQ(outer, after);
-}
-
 // ---- The order of tests --------------------------------------------------------------
-
-TEST_F(InputTest, ARunningPressOrDragHoldsOffOtherPresses) {
-    HWND pane = Make({1, 2, 3});
-    Down(Button(pane, 0));
-    Down(Button(pane, 1));
-    Down(Empty(pane));
-    EXPECT_EQ(kPress | kCaptured, TrackState());
-    Up(Button(pane, 0));
-    EXPECT_EQ((std::vector<Heard>{Press(1), Release(1), Command(1)}), FrameLog()) << Describe(FrameLog());
-    ClearFrameLog();
-    Down(Empty(pane));
-    Down(Button(pane, 1));
-    EXPECT_EQ(kDrag | kCaptured, TrackState());
-    EXPECT_FALSE(Pressed(2));
-    Up(Empty(pane));
-    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
-}
-
-// A close box release outside every toolbar window is missed. Until the next
-// left release on a toolbar, moves run only the close box tracking, and a
-// drag begun meanwhile outlives that release and ends with the next.
-TEST_F(InputTest, AMissedCloseBoxReleaseServesTheNextOneFirst) {
-    HWND floatingPane = Make({1}, TBF_VISIBLE | TBF_FLOATING);
-    HWND pane = Make({2, 3});
-    Down(CloseBox(floatingPane));
-    ASSERT_EQ(frame, WindowFromPoint(Outside()));
-    Up(Outside());
-    EXPECT_EQ(kClose, TrackState());
-    Down(Empty(pane));
-    EXPECT_EQ(kClose | kDrag | kCaptured, TrackState());
-    const RECT frameAtPress = mouseTrack.dragFrame;
-    Move(Offset(Empty(pane), -30, 0));
-    EXPECT_EQ(frameAtPress, mouseTrack.dragFrame) << "the drag frame must not follow";
-    Up(Empty(pane));
-    EXPECT_EQ(kDrag | kCaptured, TrackState());
-    Up(Empty(pane));
-    EXPECT_EQ(0u, TrackState());
-    EXPECT_EQ(TBF_VISIBLE | TBF_FLOATING, Place(floatingPane));
-    EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, Place(pane));
-    InvalidateRect(pane, nullptr, TRUE); // the close box tracking drew on it
-}
 
 // ---- The drag frame to the pixel ------------------------------------------------------
 

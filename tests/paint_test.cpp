@@ -197,24 +197,6 @@ TEST_F(PaintTest, StripKeysBecomeButtonColoursAndTheResourceStaysAsItWas) {
     EXPECT_EQ(live - 2, LiveGdiObjects());
 }
 
-// A strip set again replaces the one before: the old bitmap is deleted, so the
-// library's live GDI count stays where one strip left it, and a name that
-// finds no resource changes nothing.
-TEST_F(PaintTest, ImageStripSetAgainFreesTheOldBitmap) {
-    LONG blocks = 0, before = 0, after = 0;
-    QBR_GetLiveCounts(&blocks, &before);
-    for (int i = 0; i < 3; ++i)
-        ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
-    QBR_GetLiveCounts(&blocks, &after);
-    EXPECT_EQ(before, after) << "each replaced strip must be deleted";
-    HBITMAP strip = manager->imageStrip;
-    EXPECT_EQ(0u, QBR_SetImageStrip(manager, "NOSUCHSTRIP"));
-    EXPECT_EQ(strip, manager->imageStrip);
-    QBR_GetLiveCounts(&blocks, &after);
-    EXPECT_EQ(before, after);
-    ExpectStripColours(BitmapPixels(manager->imageStrip), colors);
-}
-
 // The colours are taken at load time from the scheme: with a scheme whose
 // button colours are none of the keys, every key shows as its element.
 TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
@@ -233,36 +215,6 @@ TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
     ASSERT_NE(nullptr, strip);
     ExpectStripColours(BitmapPixels(strip), SchemeColors());
     GdiDelete(strip);
-}
-
-// Cell arithmetic inside a pass: columns are the strip's width over the image
-// width, truncated, and indexes run row by row.
-TEST_F(PaintTest, ImageIndexGivesItsCell) {
-    struct Row {
-        int stripWidth; // 0: the test strip (70 pixels)
-        int imageWidth;
-        UINT index, column, row;
-    } const rows[] = {
-        {0, 16, 3, 3, 0},  {0, 16, 4, 0, 1},     {0, 16, 9, 1, 2},    {0, 10, 6, 6, 0},
-        {0, 10, 15, 1, 2}, {368, 16, 22, 22, 0}, {368, 16, 30, 7, 1},
-    };
-    Canvas canvas(8, 8);
-    ToolbarManager *wide = QBR_CreateManager(nullptr);
-    ASSERT_NE(nullptr, wide);
-    {
-        ScreenDC screen;
-        wide->imageStrip = GdiTrack(CreateCompatibleBitmap(screen, 368, 30));
-    }
-    for (const Row &r : rows) {
-        QBR_SetButtonMetrics(0, 0, r.imageWidth, 0, 0, 0);
-        ASSERT_EQ(1u, BeginButtonPaint(r.stripWidth ? wide : manager, canvas.Dc()));
-        UINT column = 99, row = 99;
-        StripCellOf(r.index, &column, &row);
-        EndButtonPaint();
-        EXPECT_EQ(r.column * 100 + r.row, column * 100 + row)
-            << "strip " << r.stripWidth << " image width " << r.imageWidth << " index " << r.index;
-    }
-    QBR_DestroyManager(wide);
 }
 
 // Each button shows its own cell: the blue marker of cell n lands in column n
@@ -370,125 +322,6 @@ TEST_F(PaintTest, DisabledInkIsEmbossed) {
     }
 }
 
-// A disabled button that is on, at the default 22-pixel height, every pixel
-// of its cell against the drawing rules worked out here: face, frame ring,
-// sunken edge, the light and dark copies of the ink, and the checker where the
-// eroded mask (each bit anded with its neighbour up and left, as the bits
-// stood before the erosion) leaves it. The images are scattered ink, light
-// and dark pixels over the whole cell, so that every mask column matters.
-TEST_F(PaintTest, DisabledOnButtonMatchesTheRulesEveryPixel) {
-    int bw = 0, bh = 0, iw = 0, ih = 0;
-    GetButtonSizes(&bw, &bh, &iw, &ih);
-    ASSERT_EQ(22, bh);
-    const int left = 5, top = 4, x = left + 1, y = top + 1, w = bw - 2, h = bh - 2;
-    const COLORREF inks[] = {colors.text, colors.shadow, colors.highlight, kRed};
-    HBITMAP loaded = manager->imageStrip;
-    for (unsigned seed = 1; seed <= 4; ++seed) {
-        // A strip of four cells, drawn here in the loaded strip's colours.
-        HBITMAP strip = nullptr;
-        {
-            ScreenDC screen;
-            strip = CreateCompatibleBitmap(screen, 4 * iw, ih);
-        }
-        ASSERT_NE(nullptr, strip);
-        {
-            HDC dc = CreateCompatibleDC(nullptr);
-            HGDIOBJ old = SelectObject(dc, strip);
-            std::srand(seed);
-            for (int py = 0; py < ih; ++py)
-                for (int px = 0; px < 4 * iw; ++px)
-                    SetPixelV(dc, px, py, std::rand() % 2 ? colors.face : inks[std::rand() % 4]);
-            SelectObject(dc, old);
-            DeleteDC(dc);
-        }
-        manager->imageStrip = strip;
-        const BitmapPixels cells(strip);
-        const UINT id = seed; // image seed - 1: each cell once
-        const int cellX = static_cast<int>(id - 1) * iw;
-        // 1 where the image is face or highlight, and outside the image.
-        auto mask = [&](int mx, int my, int imageX, int imageY) {
-            const int cx = mx - imageX, cy = my - imageY;
-            if (cx < 0 || cy < 0 || cx >= iw || cy >= ih) return 1;
-            const COLORREF c = cells.At(cellX + cx, cy);
-            return (c == colors.face || c == colors.highlight) ? 1 : 0;
-        };
-        const int imageX = ((w - iw - 1) >> 1) + 1, imageY = ((h - ih) >> 1) + 1; // sunken
-        std::vector<COLORREF> want(static_cast<size_t>(40 * 40), kUntouched);
-        auto put = [&](int px, int py, COLORREF c) { want[static_cast<size_t>(py * 40 + px)] = c; };
-        for (int py = y; py < y + h; ++py)
-            for (int px = x; px < x + w; ++px)
-                put(px, py, colors.face);
-        for (int i = 0; i < w; ++i) {
-            put(x + i, y - 1, colors.frame);
-            put(x + i, y + h, colors.frame);
-            put(x + i, y, colors.shadow);
-        }
-        for (int i = 0; i < h; ++i) {
-            put(x - 1, y + i, colors.frame);
-            put(x + w, y + i, colors.frame);
-            put(x, y + i, colors.shadow);
-        }
-        for (int my = 0; my < h; ++my) // light copy one pixel lower right
-            for (int mx = 0; mx < w; ++mx)
-                if (!mask(mx, my, imageX, imageY)) put(x + 1 + mx, y + 1 + my, colors.highlight);
-        for (int my = 0; my < h; ++my) // dark copy over it
-            for (int mx = 0; mx < w; ++mx)
-                if (!mask(mx, my, imageX, imageY)) put(x + mx, y + my, colors.shadow);
-        for (int my = 0; my < h - 1; ++my) // the checker, through the eroded mask
-            for (int mx = 0; mx < w - 1; ++mx) {
-                int bit = mask(mx, my, imageX - 1, imageY - 1);
-                if (mx >= 1 && my >= 1) bit &= mask(mx - 1, my - 1, imageX - 1, imageY - 1);
-                const int px = x + 1 + mx, py = y + 1 + my;
-                if (bit) put(px, py, (px + py) % 2 == 0 ? colors.face : colors.highlight);
-            }
-        SetBits(id, BS_DISABLED | BS_ON);
-        Canvas canvas(40, 40);
-        PaintOne(canvas, id, left, top);
-        manager->imageStrip = loaded;
-        DeleteObject(strip);
-        int wrong = 0;
-        for (int py = 0; py < 40; ++py)
-            for (int px = 0; px < 40; ++px)
-                if (canvas.At(px, py) != want[static_cast<size_t>(py * 40 + px)] && ++wrong <= 5)
-                    ADD_FAILURE() << "image " << id - 1 << " at (" << px - left << ", " << py - top
-                                  << "): " << Hex(canvas.At(px, py)) << ", the rules give "
-                                  << Hex(want[static_cast<size_t>(py * 40 + px)]);
-        EXPECT_EQ(0, wrong) << "image " << id - 1;
-    }
-}
-
-// The Insert dialog's list draws every item plain: with noState a button in
-// every state looks exactly like a normal one.
-TEST_F(PaintTest, NoStateDrawsEveryButtonPlain) {
-    Canvas plain(30, 30), forced(30, 30);
-    SetBits(3, 0);
-    PaintOne(plain, 3, 2, 2);
-    for (const StateRow &s : kStates) {
-        SetBits(3, s.bits);
-        forced.Clear();
-        PaintOne(forced, 3, 2, 2, 1);
-        EXPECT_TRUE(plain.All() == forced.All()) << s.name;
-    }
-}
-
-// Buttons of one pass share the frame column, and a button outside the clip
-// region leaves the target alone while the next one is still drawn.
-TEST_F(PaintTest, ClippedButtonIsSkippedAndTheNextDrawn) {
-    Canvas canvas(60, 30);
-    ExcludeClipRect(canvas.Dc(), 0, 0, 24, 22);
-    RECT first = {0, 0, 24, 22}, second = {23, 0, 47, 22};
-    ASSERT_EQ(1u, BeginButtonPaint(manager, canvas.Dc()));
-    PaintButton(ItemFindById(manager->items, 1), &first, 0);
-    PaintButton(ItemFindById(manager->items, 2), &second, 0);
-    EndButtonPaint();
-    for (int y = 0; y < 22; ++y)
-        for (int x = 0; x < 24; ++x) // the shared frame column stays clipped too
-            ASSERT_EQ(Hex(kUntouched), Hex(canvas.At(x, y))) << x << "," << y;
-    EXPECT_EQ(Hex(colors.frame), Hex(canvas.At(46, 5)));
-    EXPECT_EQ(Hex(colors.frame), Hex(canvas.At(30, 0)));
-    EXPECT_EQ(Hex(kRed), Hex(canvas.At(23 + 3 + 1, 3 + 1)));
-}
-
 // Text mode: larger buttons, the image near the top, and under it the host's
 // button text in the target's text colour, centred, one pixel further down
 // right when pressed; out of text mode no label at all.
@@ -547,53 +380,7 @@ TEST_F(PaintTest, TextModeLabelsTheButton) {
         ASSERT_NE(ink, c);
 }
 
-// A pass needs a strip: without one nothing opens and nothing is left made;
-// between passes the strip DC holds nothing of the library.
-TEST_F(PaintTest, PassWithoutStripFails) {
-    ToolbarManager *bare = QBR_CreateManager(nullptr);
-    ASSERT_NE(nullptr, bare);
-    Canvas canvas(8, 8);
-    const LONG live = LiveGdiObjects();
-    EXPECT_EQ(0u, BeginButtonPaint(bare, canvas.Dc()));
-    EXPECT_EQ(0u, BeginButtonPaint(nullptr, canvas.Dc()));
-    EXPECT_EQ(live, LiveGdiObjects());
-    QBR_DestroyManager(bare);
-    ASSERT_EQ(1u, BeginButtonPaint(manager, canvas.Dc()));
-    EndButtonPaint();
-    EXPECT_EQ(live, LiveGdiObjects());
-    EXPECT_NE(HGDIOBJ(manager->imageStrip), GetCurrentObject(stripDC, OBJ_BITMAP));
-}
-
 // ---- Shared objects, caption ----------------------------------------------------
-
-// The dither brush itself is seen in the state looks; here the rest.
-TEST_F(PaintTest, SharedObjectsAndCaptionMetrics) {
-    for (const void *made : {(const void *)buttonFont, (const void *)stripDC, (const void *)maskDC,
-                             (const void *)ditherBrush, (const void *)captionFont})
-        ASSERT_NE(nullptr, made);
-    // The version the platform reports decides the light edge's colour.
-    const DWORD version = GetVersion();
-    const bool newer = (LOBYTE(LOWORD(version)) << 8 | HIBYTE(LOWORD(version))) >= 0x30A;
-    EXPECT_EQ(newer, newerSystem != FALSE);
-    EXPECT_EQ(Hex(newer ? GetSysColor(COLOR_BTNHIGHLIGHT) : kWhite), Hex(colorHighlight));
-
-    TEXTMETRICA metrics = {};
-    {
-        ScreenDC screen;
-        SelectScope font(screen, captionFont);
-        GetTextMetricsA(screen, &metrics);
-    }
-    EXPECT_EQ(metrics.tmAscent + 1, captionHeight);
-    // 7 points against the label's 8.
-    LOGFONTA caption = {}, label = {};
-    GetObjectA(captionFont, sizeof(caption), &caption);
-    GetObjectA(buttonFont, sizeof(label), &label);
-    EXPECT_LT(label.lfHeight, caption.lfHeight);
-    EXPECT_LT(caption.lfHeight, 0);
-    RECT box = {};
-    CloseBoxRect(nullptr, &box);
-    EXPECT_EQ(Rect(0, 0, captionHeight + 1, captionHeight), box);
-}
 
 // ---- Toolbar surface and floating caption -----------------------------------------
 
@@ -668,74 +455,6 @@ TEST_F(SurfaceTest, PaneAndFrameShowSurfaceButtonsAndCaption) {
     EXPECT_LE(std::abs((left + right) - px.width), 6) << left << ".." << right;
 }
 
-// The caption drawn straight into a canvas: a hidden frame with an empty title
-// gets the plain band and line, client-wide, and no close box; a title wider
-// than the frame has its left end under the close box.
-TEST_F(SurfaceTest, CaptionCases) {
-    HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_DOCKED, ""), ROLE_FLOATING);
-    ASSERT_FALSE(IsWindowVisible(frame));
-    RECT client;
-    GetClientRect(frame, &client);
-    ASSERT_GT(client.right, 40);
-    const int ch = captionHeight;
-    Canvas canvas(client.right + 2, ch + 4);
-    const LONG blocks = LiveMemoryBlocks();
-    PaintFloatingCaption(frame, canvas.Dc());
-    EXPECT_EQ(blocks, LiveMemoryBlocks());
-    for (int x = 0; x < client.right; ++x) {
-        for (int y = 0; y < ch - 1; ++y)
-            ASSERT_EQ(Hex(band), Hex(canvas.At(x, y))) << x << "," << y;
-        ASSERT_EQ(Hex(line), Hex(canvas.At(x, ch - 1))) << x;
-    }
-    // The line is a frame grown past the client area: its right side falls
-    // in the column just outside, which a window never shows.
-    EXPECT_EQ(Hex(line), Hex(canvas.At(client.right, 1)));
-    EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(client.right + 1, 1))) << "the band is the client width";
-    EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(1, ch))) << "the band is captionHeight high";
-
-    HWND shown = ResolveRoleWindow(
-        Make(TBF_VISIBLE | TBF_FLOATING, "A title much wider than this small floating frame can ever show"),
-        ROLE_FLOATING);
-    GetClientRect(shown, &client);
-    Canvas wide(client.right + 2, ch + 4);
-    PaintFloatingCaption(shown, wide.Dc());
-    EXPECT_EQ(Hex(colors.face), Hex(wide.At(1, 1)));
-    EXPECT_EQ(Hex(kWhite), Hex(wide.At(3, (ch - 1) >> 1)));
-    int titlePixels = 0;
-    for (int x = ch + 1; x < client.right; ++x)
-        for (int y = 0; y < ch - 1; ++y)
-            titlePixels += wide.At(x, y) != band;
-    EXPECT_GT(titlePixels, 0) << "the title runs across the whole band";
-}
-
-TEST(PaintLifetime, StartsAndEndsLeaveNothingBehind) {
-    moduleInstance = GetModuleHandleA(nullptr);
-    const LONG gdi = LiveGdiObjects(), blocks = LiveMemoryBlocks();
-    for (int round = 0; round < 3; ++round) {
-        ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
-        EXPECT_GT(LiveGdiObjects(), gdi);
-        ToolbarManager *managers[2] = {QBR_CreateManager(nullptr), QBR_CreateManager(nullptr)};
-        Canvas canvas(30, 30);
-        for (ToolbarManager *m : managers) {
-            UINT ids[2] = {1, 2};
-            QBR_AddButtons(m, ids, 2);
-            ASSERT_EQ(1u, QBR_SetImageStrip(m, "TESTSTRIP"));
-            QBR_SetButtonState(m, 1, 1);
-            QBR_SetButtonEnabled(m, 2, 0);
-            RECT rect = {0, 0, 24, 22};
-            ASSERT_EQ(1u, BeginButtonPaint(m, canvas.Dc()));
-            PaintButton(ItemFindById(m->items, 1), &rect, 0);
-            PaintButton(ItemFindById(m->items, 2), &rect, 0);
-            EndButtonPaint();
-        }
-        for (ToolbarManager *m : managers)
-            QBR_DestroyManager(m);
-        QBR_Terminate();
-        EXPECT_EQ(gdi, LiveGdiObjects()) << "round " << round;
-        EXPECT_EQ(blocks, LiveMemoryBlocks()) << "round " << round;
-    }
-}
-
 // ---- Exact places and colours of the moment -------------------------------------------
 
 // Changes system colours for the length of a scope, and puts them back.
@@ -765,52 +484,6 @@ int CALLBACK LabelText(UINT, UINT kind, LPSTR buffer, int size) {
     if (kind != HELP_BUTTON_TEXT) return 0;
     lstrcpynA(buffer, labelText.c_str(), size);
     return lstrlenA(buffer);
-}
-
-// The label's place, to the pixel: x + ((w - width - 1) >> 1) and
-// y + h - height - 3 inside the frame ring, one further down right when
-// pressed. The same button painted without a label, and the text drawn by hand
-// at that place, give the same pixels. Widths of both parities are among the
-// texts, so that half a pixel of centring shows; the last one overhangs.
-TEST_F(PaintTest, TheLabelStandsExactlyWhereItsFormulaPutsIt) {
-    QBR_SetButtonText(1);
-    CurrentClient()->helpTextProc = LabelText;
-    int bw = 0, bh = 0;
-    GetButtonSizes(&bw, &bh, nullptr, nullptr);
-    const int w = bw - 2, h = bh - 2;
-    Canvas painted(bw + 4, bh + 4), expected(bw + 4, bh + 4);
-    const COLORREF ink = RGB(200, 0, 100);
-    bool parity[2] = {false, false};
-    for (const char *text : {"B7", "Open", "Save all", "i", "WW", "Mm", "A label much wider than its button"}) {
-        const int length = lstrlenA(text);
-        SIZE extent = {};
-        {
-            SelectScope font(expected.Dc(), buttonFont);
-            GetTextExtentPointA(expected.Dc(), text, length, &extent);
-        }
-        parity[(w - extent.cx) & 1] = true;
-        for (int pressed = 0; pressed < 2; ++pressed) {
-            SetBits(7, pressed ? BS_PRESSED : 0);
-            labelText = text;
-            painted.Clear();
-            SetTextColor(painted.Dc(), ink);
-            PaintOne(painted, 7, 0, 0);
-            labelText.clear();
-            expected.Clear();
-            PaintOne(expected, 7, 0, 0);
-            {
-                SelectScope font(expected.Dc(), buttonFont);
-                const int oldMode = SetBkMode(expected.Dc(), TRANSPARENT);
-                SetTextColor(expected.Dc(), ink);
-                ExtTextOutA(expected.Dc(), 1 + pressed + ((w - extent.cx - 1) >> 1), 1 + pressed + h - extent.cy - 3, 0,
-                            nullptr, text, static_cast<UINT>(length), nullptr);
-                SetBkMode(expected.Dc(), oldMode);
-            }
-            EXPECT_TRUE(painted.All() == expected.All()) << text << (pressed ? ", pressed" : "");
-        }
-    }
-    EXPECT_TRUE(parity[0] && parity[1]) << "the texts should have widths of both parities";
-    QBR_SetButtonText(0);
 }
 
 // A key is a whole colour-table entry, its reserved byte included: light grey
