@@ -140,33 +140,6 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
     }
 }
 
-TEST_F(CustomizeTest, MenuEntryTogglesShowAndKeepsThePlace) {
-    struct Case {
-        const char *entry;
-        HWND *pane;
-        UINT flagsAfter;
-    };
-    const Case cases[] = {
-        {"Beta", &beta, TBF_VISIBLE | TBF_DOCKED},
-        {"Gamma", &gamma, TBF_HIDDEN | TBF_FLOATING | TBF_USER_CREATED},
-        {"Gamma", &gamma, TBF_VISIBLE | TBF_FLOATING | TBF_USER_CREATED},
-        {"Alpha", &alpha, TBF_HIDDEN | TBF_DOCKED},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.entry);
-        ModalSteps::Add([&] { ClickMenuEntry(OpenMenu(), c.entry); });
-        RunMenu(alpha);
-        EXPECT_EQ(c.flagsAfter, QBR_GetToolbarFlags(*c.pane));
-        HWND shown = ResolveRoleWindow(*c.pane, (c.flagsAfter & TBF_FLOATING) ? ROLE_FLOATING : ROLE_DOCKED);
-        EXPECT_EQ((c.flagsAfter & TBF_VISIBLE) != 0, IsWindowVisible(shown) != 0);
-    }
-    // An id whose toolbar does not exist (a stale menu) and the separator's
-    // id change nothing.
-    OnToolbarCommand(beta, 201 + 4);
-    OnToolbarCommand(beta, 0);
-    EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, QBR_GetToolbarFlags(beta));
-}
-
 TEST_F(CustomizeTest, DeleteAsksAndOnlyYesDeletes) {
     const int before = static_cast<int>(QBR_GetToolbarCount(manager));
     struct Case {
@@ -344,56 +317,5 @@ TEST_F(CustomizeTest, DragFromListInsertsAtTheDropPointOnly) {
 }
 
 // ---- The New Toolbar dialog --------------------------------------------------------
-
-TEST_F(CustomizeTest, NewToolbarMakesAUserToolbarBelowTheInsertDialog) {
-    const UINT countBefore = QBR_GetToolbarCount(manager);
-    RECT insertRect = {}, newRect = {};
-    std::vector<BOOL> okEnabled;
-    auto type = [](HWND edit, const char *keys) {
-        for (const char *k = keys; *k; ++k)
-            SendMessageA(edit, WM_CHAR, static_cast<unsigned char>(*k), 0);
-    };
-    ModalSteps::Add([] {
-        HWND dialog = InsertDialog();
-        ASSERT_NE(nullptr, dialog);
-        PostMessageA(GetDlgItem(dialog, 5007), BM_CLICK, 0, 0);
-    });
-    ModalSteps::Add([&] {
-        HWND dialog = FindWindowA("#32770", "New Toolbar");
-        ASSERT_NE(nullptr, dialog);
-        GetWindowRect(dialog, &newRect);
-        GetWindowRect(InsertDialog(), &insertRect);
-        HWND edit = GetDlgItem(dialog, 5006), ok = GetDlgItem(dialog, IDOK);
-        okEnabled.push_back(IsWindowEnabled(ok)); // at the start
-        type(edit, "  ");
-        okEnabled.push_back(IsWindowEnabled(ok)); // blanks count as text
-        type(edit, "\b\b");
-        okEnabled.push_back(IsWindowEnabled(ok)); // typed and deleted again
-        type(edit, "Mine");
-        okEnabled.push_back(IsWindowEnabled(ok));
-        PostMessageA(ok, BM_CLICK, 0, 0);
-    });
-    ModalSteps::Add([&] {
-        EXPECT_NE(nullptr, InsertDialog()) << "the Insert dialog stays open";
-        PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0);
-    });
-    RunInsertDialog();
-
-    EXPECT_EQ((std::vector<BOOL>{FALSE, TRUE, FALSE, TRUE}), okEnabled);
-    const int width = newRect.right - newRect.left, height = newRect.bottom - newRect.top;
-    EXPECT_EQ((GetSystemMetrics(SM_CXSCREEN) - width) / 2, newRect.left) << "centred";
-    EXPECT_EQ((GetSystemMetrics(SM_CYSCREEN) - height) / 3, newRect.top);
-    ASSERT_EQ(countBefore + 1, QBR_GetToolbarCount(manager));
-    HWND made = QBR_GetToolbar(manager, countBefore);
-    EXPECT_EQ("Mine", TextOf(FrameOf(made)));
-    EXPECT_EQ(TBF_USER_CREATED | TBF_FLOATING | TBF_VISIBLE, QBR_GetToolbarFlags(made));
-    EXPECT_EQ(top, QBR_GetToolbarDock(made));
-    EXPECT_TRUE(Ids(made).empty());
-    RECT frameRect;
-    GetWindowRect(FrameOf(made), &frameRect);
-    EXPECT_EQ(insertRect.left, frameRect.left) << "below the Insert dialog";
-    EXPECT_EQ(insertRect.bottom, frameRect.top);
-    EXPECT_TRUE(IsWindowVisible(FrameOf(made)));
-}
 
 } // namespace

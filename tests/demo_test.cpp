@@ -187,14 +187,6 @@ class DemoViewTest : public ::testing::Test {
     HWND mainWindow = nullptr;
 };
 
-// The main window shows the text file that sits beside the program (the
-// build copies QBRDEMO.TXT into the folder of the programs, this one's too).
-TEST_F(DemoViewTest, MainWindowShowsTheTextFileBesideTheProgram) {
-    char text[64] = "";
-    GetDlgItemTextA(mainWindow, kEditId, text, sizeof text);
-    EXPECT_EQ(std::string(text).rfind("Welcome to the Quaybar Demo", 0), 0u) << text;
-}
-
 TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
     HWND a = OpenView(), b = OpenView();
     ASSERT_TRUE(a && b);
@@ -484,56 +476,6 @@ void RunUntilClosed(const AboutSeen &seen) {
     ModalSteps::Stop();
 }
 
-TEST_F(DemoViewTest, AboutBoxOpensFromMenuAndLatchedButtonOfBothFramesAndClearsTheButton) {
-    HWND view = OpenView();
-    ASSERT_NE(view, nullptr);
-    // The main window away in a corner: the box is placed by the screen.
-    SetWindowPos(mainWindow, nullptr, 0, 0, 620, 440, SWP_NOZORDER);
-    Pump();
-    enum How { Menu, Button };
-    struct Case {
-        const char *what;
-        HWND frame;
-        How how;
-        Close close;
-    } const cases[] = {
-        {"main menu, OK", mainWindow, Menu, Close::OkButton},
-        {"main button, Escape", mainWindow, Button, Close::EscapeKey},
-        {"view button, system menu", view, Button, Close::SystemMenu},
-        {"view menu, OK", view, Menu, Close::OkButton},
-        {"view button again, OK", view, Button, Close::OkButton},
-    };
-    const int cx = GetSystemMetrics(SM_CXSCREEN), cy = GetSystemMetrics(SM_CYSCREEN);
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.what);
-        ToolbarManager *manager = c.frame == mainWindow ? mainManager : ManagerOfView(c.frame);
-        ASSERT_NE(manager, nullptr);
-        const int made = fontsMade, deleted = fontsDeleted;
-        AboutSeen seen;
-        AboutSteps(seen, c.close, manager, made - deleted);
-        if (c.how == Menu) {
-            SendMessageA(c.frame, WM_COMMAND, kAboutCommand, 0); // returns when the box closed
-        } else {
-            ClickButton(c.frame, PaneTitled(manager, "Standard"), kAboutCommand);
-        }
-        RunUntilClosed(seen);
-        ASSERT_TRUE(seen.opened);
-        ASSERT_TRUE(seen.closed);
-        const int w = seen.rect.right - seen.rect.left, h = seen.rect.bottom - seen.rect.top;
-        EXPECT_EQ(seen.rect.left, (cx - w) / 2);
-        EXPECT_EQ(seen.rect.top, (cy - h) / 3);
-        EXPECT_TRUE(seen.sameFontOnAllThree) << "8001..8003 share the box's own font";
-        EXPECT_TRUE(seen.fontAlive);
-        EXPECT_EQ(seen.fontsHeldWhileOpen, 1);
-        EXPECT_EQ(fontsMade - made, 1) << "one font per opening";
-        EXPECT_EQ(fontsDeleted - deleted, 1) << "and it is deleted at the close";
-        EXPECT_NE(GetObjectType(seen.textFont), static_cast<DWORD>(OBJ_FONT));
-        if (c.how == Button) EXPECT_NE(seen.pressedWhileOpen, 0u) << "the latched button stays down while open";
-        EXPECT_EQ(QBR_IsButtonPressed(manager, kAboutCommand), 0u) << "the button is cleared at the close";
-        EXPECT_TRUE(IsWindowEnabled(c.frame)) << "the frame is usable again";
-    }
-}
-
 // ---- Start states, the Palette group, help and the edit control -----------------------
 
 // The button of a group that is on, 0 for none, 9999 for more than one.
@@ -569,31 +511,6 @@ TEST_F(DemoViewTest, PaletteIsOneRadioGroupWithItsMenuChecks) {
         EXPECT_EQ(s.on, MenuGroupOn(mainWindow, 201, 212));
         EXPECT_EQ(304u, GroupOn(mainManager, 304, 307)) << "the other group stays";
     }
-}
-
-// Help is the file "QBR.HLP", without a path, opened at its contents, with
-// the window that asked as the owner: the main window's command and the
-// About box's Help button.
-TEST_F(DemoViewTest, HelpOpensQbrHlpAtItsContentsFromTheMenuAndTheAboutBox) {
-    helpCalls.clear();
-    SendMessageA(mainWindow, WM_COMMAND, kHelpContentsCommand, 0);
-    Pump();
-    EXPECT_EQ((std::vector<HelpCall>{{mainWindow, "QBR.HLP", HELP_CONTENTS, 0}}), helpCalls);
-
-    helpCalls.clear();
-    AboutSeen seen;
-    HWND box = nullptr;
-    ModalSteps::Until([&box] { return (box = AboutBox()) != nullptr; });
-    ModalSteps::Add([] { SendMessageA(AboutBox(), WM_COMMAND, 8004, 0); });
-    ModalSteps::Add([] { PostMessageA(AboutBox(), WM_COMMAND, IDOK, 0); });
-    ModalSteps::Until([&seen] {
-        seen.closed = AboutBox() == nullptr;
-        return seen.closed;
-    });
-    SendMessageA(mainWindow, WM_COMMAND, kAboutCommand, 0);
-    RunUntilClosed(seen);
-    ASSERT_TRUE(seen.closed);
-    EXPECT_EQ((std::vector<HelpCall>{{box, "QBR.HLP", HELP_CONTENTS, 0}}), helpCalls);
 }
 
 // The edit control stands from one pixel left of the client area to its

@@ -248,30 +248,6 @@ TEST_F(DockPackTest, FloatingAndHiddenToolbarsAreSkippedAndAllFloatingHidesTheDo
         EXPECT_EQ(t[i], ListAt<ToolbarRecord>(record->toolbars, i)->paneWindow);
 }
 
-TEST_F(DockPackTest, WmSizeOnlyWhenAVisibleDockChanged) {
-    HWND t1 = Toolbar(1, 6);
-    ASSERT_TRUE(IsWindowVisible(dock));
-    ClearFrameLog();
-    EXPECT_EQ(1u, RelayoutDock(dock));
-    EXPECT_EQ(1u, PackDock(record));
-    // A second toolbar beside the first is no change of the dock's rectangle
-    // either: the top dock is full-screen wide.
-    HWND t2 = Toolbar(7, 6);
-    // Removing the first toolbar moves nothing of the dock either.
-    ToolbarRecord *r1 = ListAt<ToolbarRecord>(record->toolbars, 0);
-    ASSERT_EQ(1u, RemoveToolbarFromDock(record, r1));
-    EXPECT_EQ(-1, WindowRectInParent(t2).left);
-    // Put back in front: again nothing for the frame; the order is restored.
-    ASSERT_EQ(1u, InsertToolbarAt(record, 0, r1));
-    EXPECT_EQ(-1, WindowRectInParent(t1).left);
-    EXPECT_EQ(0u, RemoveToolbarFromDock(record, nullptr));
-    UINT index = 9;
-    EXPECT_EQ(1u, ToolbarIndexInDock(record, r1, &index));
-    EXPECT_EQ(0u, index);
-    Pump();
-    EXPECT_EQ(0, CountHeard(WM_SIZE)) << Describe(FrameLog());
-}
-
 TEST_F(DockPackTest, DockInsertionIndexForPointsAroundThePanes) {
     const int limit = GetSystemMetrics(SM_CXFULLSCREEN);
     HWND t[3];
@@ -341,23 +317,6 @@ TEST_F(DockPackTest, SurfaceIsButtonFaceClosedByAWindowFrameLine) {
     ASSERT_GT(px.height, 2);
     EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(x, client.bottom - 1));
     EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(x, client.bottom - 2));
-}
-
-// Panes that the packing moves are painted at their new place, and the dock
-// surface they left is painted again: no border line is left behind.
-TEST_F(DockPackTest, MovedPanesLeaveNoTrace) {
-    HWND t1 = Toolbar(1, 5);
-    HWND t2 = Toolbar(6, 3);
-    if (WindowRectInParent(t2).left < WindowRectInParent(t1).left) std::swap(t1, t2); // t1 stands first
-    const RECT before = WindowRectInParent(t2);
-    const int y = (before.top + before.bottom) / 2;
-    ASSERT_EQ(GetSysColor(COLOR_WINDOWFRAME), ReadWindowPixels(dock).At(before.right - 1, y));
-    QBR_SetToolbarFlags(t1, TBF_HIDDEN); // t2 moves to the front
-    const RECT after = WindowRectInParent(t2);
-    ASSERT_LT(after.right, before.right);
-    const Pixels px = ReadWindowPixels(dock);
-    EXPECT_EQ(GetSysColor(COLOR_BTNFACE), px.At(before.right - 1, y)) << "the old right border is gone";
-    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), px.At(after.right - 1, y)) << "the right border at the new place";
 }
 
 // ---- The bottom dock ------------------------------------------------------------------

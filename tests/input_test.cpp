@@ -261,24 +261,6 @@ TEST_F(InputTest, NotificationsCarrySixteenBitsAndCanBeSwitchedOff) {
     EXPECT_EQ(std::vector<Heard>{Command(0x12345)}, FrameLog()) << Describe(FrameLog());
 }
 
-TEST_F(InputTest, CheckButtonsMakeARadioGroupWithTheHost) {
-    hostRunsRadio = true;
-    for (UINT id = 1; id <= 4; ++id)
-        QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
-    QBR_SetRadioRange(manager, 1, 4, 1);
-    HWND pane = Make({1, 2, 3, 4});
-    HWND other = Make({4});
-    const std::vector<COLORREF> off4 = Look(other, 0);
-    // Clicking the button that is on leaves it on: the library turns it
-    // off, and the host's answer to the command turns it on again.
-    for (UINT click : {3, 3, 4, 1}) {
-        Click(Button(pane, click - 1));
-        for (UINT id = 1; id <= 4; ++id)
-            EXPECT_EQ(id == click ? 1u : 0u, QBR_GetButtonState(manager, id)) << "click " << click << ", id " << id;
-        EXPECT_EQ(click != 4, Look(other, 0) == off4) << "the other toolbar follows at once, click " << click;
-    }
-}
-
 // Through the platform's input queue, with activation and double click
 // detection. The cursor is settled first: under Wine, GetCursorPos can lag
 // behind an input event that moves it.
@@ -471,45 +453,6 @@ TEST_F(InputTest, TheCloseBoxTracksLikeAButtonAndHides) {
 }
 
 // ---- Double clicks -----------------------------------------------------------------
-
-TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
-    enum Where { EmptySpace, CaptionBand, Box, OnButton };
-    struct Case {
-        const char *name;
-        UINT flags;
-        Where where;
-        UINT place;
-        int commands;
-    } const cases[] = {
-        {"docked, empty space: floats", TBF_DOCKED, EmptySpace, TBF_VISIBLE | TBF_FLOATING, 0},
-        {"docked, on a button: only the click", TBF_DOCKED, OnButton, TBF_VISIBLE | TBF_DOCKED, 1},
-        {"floating, caption: docks", TBF_FLOATING, CaptionBand, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"floating, empty space: docks", TBF_FLOATING, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"floating, on a button: only the click", TBF_FLOATING, OnButton, TBF_VISIBLE | TBF_FLOATING, 1},
-        {"floating, close box: hidden", TBF_FLOATING, Box, TBF_HIDDEN | TBF_FLOATING, 0},
-        {"locked docked: stays", TBF_DOCKED | TBF_LOCKED_PLACE, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"locked floating: stays", TBF_FLOATING | TBF_LOCKED_PLACE, CaptionBand, TBF_VISIBLE | TBF_FLOATING, 0},
-        {"locked floating, close box: hidden", TBF_FLOATING | TBF_LOCKED_PLACE, Box, TBF_HIDDEN | TBF_FLOATING, 0},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.name);
-        HWND pane = Make({1, 2}, TBF_VISIBLE | c.flags);
-        const POINT p = c.where == EmptySpace    ? Empty(pane)
-                        : c.where == CaptionBand ? Caption(pane)
-                        : c.where == Box         ? CloseBox(pane)
-                                                 : Button(pane, 0);
-        // What the window system sends for a double click. On the close box
-        // the first click hides the toolbar already, so there the double
-        // click message comes alone.
-        if (c.where != Box) Click(p);
-        Mouse(WM_LBUTTONDBLCLK, p);
-        Up(p);
-        EXPECT_EQ(c.place, Place(pane));
-        EXPECT_EQ(c.commands, CountHeard(WM_COMMAND));
-        EXPECT_EQ(c.commands, CountHeard(kReleaseMessage));
-        QBR_DestroyToolbar(pane);
-    }
-}
 
 // ---- Toolbar drags -----------------------------------------------------------------
 

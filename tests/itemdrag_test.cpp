@@ -225,24 +225,6 @@ void CALLBACK CloseMenu(HWND, UINT, UINT_PTR, DWORD) {
     EndMenu();
 }
 
-// With customising off a right press on a button takes nothing and opens no
-// menu.
-TEST_F(ItemDragTest, CustomisingOffARightPressOnAButtonDoesNothing) {
-    QBR_SetCustomize(0);
-    HWND a = Make(A0, kDocked, 350), b = Make(B0, kDocked, 150);
-    PlaceCursor(ScreenPoint(a, {'A', kOnItem, 2}));
-    menuSeen = false;
-    const UINT_PTR timer = SetTimer(nullptr, 0, 10, CloseMenu);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_RBUTTON, 0);
-    KillTimer(nullptr, timer);
-    EXPECT_FALSE(menuSeen);
-    EXPECT_EQ(nullptr, GetCapture());
-    EXPECT_EQ(0u, mouseTrack.dragActive);
-    RightDrag(a, ScreenPoint(a, {'A', kOnItem, 2}), ScreenPoint(b, {'B', kOnItem, 8}), 0, 0);
-    EXPECT_EQ(Text(A0), Text(Read(a)));
-    EXPECT_EQ(Text(B0), Text(Read(b)));
-}
-
 // A right press off the buttons (a separator, the empty end, on a pane or a
 // floating frame) opens the toolbar menu at the press and starts no drag.
 TEST_F(ItemDragTest, ARightPressOffTheButtonsOpensTheMenuAtThePress) {

@@ -197,40 +197,6 @@ TEST_F(PaintTest, StripKeysBecomeButtonColoursAndTheResourceStaysAsItWas) {
     EXPECT_EQ(live - 2, LiveGdiObjects());
 }
 
-// The colours are taken at load time from the scheme: with a scheme whose
-// button colours are none of the keys, every key shows as its element.
-TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
-    const int elements[4] = {COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT};
-    const COLORREF unusual[4] = {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)};
-    COLORREF saved[4];
-    for (int i = 0; i < 4; ++i)
-        saved[i] = GetSysColor(elements[i]);
-    struct Restore {
-        const int *elements;
-        const COLORREF *saved;
-        ~Restore() { SetSysColors(4, elements, saved); }
-    } restore{elements, saved};
-    ASSERT_TRUE(SetSysColors(4, elements, unusual));
-    HBITMAP strip = LoadImageStrip(GetModuleHandleA(nullptr), TestStrip());
-    ASSERT_NE(nullptr, strip);
-    ExpectStripColours(BitmapPixels(strip), SchemeColors());
-    GdiDelete(strip);
-}
-
-// Each button shows its own cell: the blue marker of cell n lands in column n
-// of the painted image, for cells of both strip rows.
-TEST_F(PaintTest, ButtonShowsTheCellOfItsImage) {
-    Canvas canvas(40, 30);
-    for (UINT id = 1; id <= 8; ++id) {
-        canvas.Clear();
-        PaintOne(canvas, id, 0, 0);
-        std::vector<int> blue;
-        for (int x = 0; x < kCellW; ++x)
-            if (canvas.At(3 + x, 3 + 13) == kBlue) blue.push_back(x);
-        EXPECT_EQ(std::vector<int>{static_cast<int>(id - 1)}, blue) << "button " << id;
-    }
-}
-
 // ---- Button states ----------------------------------------------------------------
 
 // What a probe should show. Dither is the checker of face and highlight by the
@@ -320,64 +286,6 @@ TEST_F(PaintTest, DisabledInkIsEmbossed) {
         for (int x = 5; x <= 12; ++x)
             EXPECT_EQ(Hex(colors.highlight), Hex(canvas.At(o + x, o + 9))) << bits << " light below";
     }
-}
-
-// Text mode: larger buttons, the image near the top, and under it the host's
-// button text in the target's text colour, centred, one pixel further down
-// right when pressed; out of text mode no label at all.
-TEST_F(PaintTest, TextModeLabelsTheButton) {
-    QBR_SetButtonText(1);
-    int bw = 0, bh = 0;
-    GetButtonSizes(&bw, &bh, nullptr, nullptr);
-    ASSERT_GT(bw, 24);
-    Canvas canvas(bw + 10, bh + 10);
-    const int w = bw - 2, h = bh - 2; // inside the frame ring, from (1, 1)
-    char text[16];
-    const int length = TestHelpText(7, HELP_BUTTON_TEXT, text, sizeof(text));
-    SIZE extent = {};
-    {
-        SelectScope font(canvas.Dc(), buttonFont);
-        GetTextExtentPointA(canvas.Dc(), text, length, &extent);
-    }
-    const COLORREF ink = RGB(200, 0, 100);
-    RECT boxes[2];
-    for (int pressed = 0; pressed < 2; ++pressed) {
-        SetBits(7, pressed ? BS_PRESSED : 0);
-        canvas.Clear();
-        SetTextColor(canvas.Dc(), ink);
-        PaintOne(canvas, 7, 0, 0);
-        const int imageX = 1 + ((w - kCellW - 1) >> 1);
-        EXPECT_EQ(Hex(kRed), Hex(canvas.At(imageX + 1 + pressed, 1 + 5 + 1 + pressed))) << "image place";
-        // The bounding box of what differs from the face under the image.
-        RECT &box = boxes[pressed];
-        box = {bw, bh, -1, -1};
-        bool hasInk = false;
-        for (int y = 1 + 5 + kCellH + 1; y < 1 + h - 2; ++y)
-            for (int x = 3; x < 1 + w - 2; ++x)
-                if (canvas.At(x, y) != colors.face) {
-                    box = {std::min<LONG>(box.left, x), std::min<LONG>(box.top, y), std::max<LONG>(box.right, x + 1),
-                           std::max<LONG>(box.bottom, y + 1)};
-                    hasInk |= canvas.At(x, y) == ink;
-                }
-        ASSERT_LT(box.left, box.right) << "no label drawn";
-        EXPECT_TRUE(hasInk) << "the label takes the target's text colour";
-    }
-    const int labelX = 1 + ((w - extent.cx - 1) >> 1), labelY = 1 + h - extent.cy - 3;
-    EXPECT_GE(boxes[0].left, labelX);
-    EXPECT_LE(boxes[0].left, labelX + 3);
-    EXPECT_LE(boxes[0].right, labelX + extent.cx + 1);
-    EXPECT_GE(boxes[0].top, labelY);
-    EXPECT_LE(boxes[0].bottom, labelY + extent.cy);
-    const RECT &b0 = boxes[0];
-    EXPECT_EQ(Rect(b0.left + 1, b0.top + 1, b0.right + 1, b0.bottom + 1), boxes[1]);
-
-    QBR_SetButtonText(0);
-    SetBits(7, 0);
-    canvas.Clear();
-    SetTextColor(canvas.Dc(), ink);
-    PaintOne(canvas, 7, 0, 0);
-    for (COLORREF c : canvas.All())
-        ASSERT_NE(ink, c);
 }
 
 // ---- Shared objects, caption ----------------------------------------------------
@@ -484,22 +392,6 @@ int CALLBACK LabelText(UINT, UINT kind, LPSTR buffer, int size) {
     if (kind != HELP_BUTTON_TEXT) return 0;
     lstrcpynA(buffer, labelText.c_str(), size);
     return lstrlenA(buffer);
-}
-
-// A key is a whole colour-table entry, its reserved byte included: light grey
-// with a reserved byte of 1 (spare column 68) stays light grey, while the light
-// grey key becomes the face colour (an unusual one, so that the two differ on
-// every scheme).
-TEST_F(PaintTest, AnEntryWithAReservedByteIsNoKey) {
-    SchemeChange scheme({COLOR_BTNFACE}, {RGB(70, 80, 90)});
-    ASSERT_TRUE(scheme.Ok());
-    HBITMAP strip = LoadImageStrip(GetModuleHandleA(nullptr), TestStrip());
-    ASSERT_NE(nullptr, strip);
-    const BitmapPixels px(strip);
-    EXPECT_EQ(Hex(RGB(70, 80, 90)), Hex(px.At(0, 0))) << "the light grey key";
-    for (int y = 0; y < px.height; ++y)
-        EXPECT_EQ(Hex(RGB(192, 192, 192)), Hex(px.At(68, y))) << "row " << y;
-    GdiDelete(strip);
 }
 
 // The surface reads the face colour at every paint; the buttons keep the
@@ -630,27 +522,6 @@ TEST_F(PaintTest, RaisedAndSunkenEdgesToThePixel) {
             }
         }
     }
-}
-
-// In text mode the image stands 5 pixels below the frame ring's inside (6 when
-// pressed): the red square of the test cell (1..2, 1..2) starts at row 7.
-TEST_F(PaintTest, TextModeImageStandsFivePixelsDown) {
-    QBR_SetButtonText(1);
-    int bw = 0, bh = 0;
-    GetButtonSizes(&bw, &bh, nullptr, nullptr);
-    Canvas canvas(bw, bh);
-    const int imageX = 1 + ((bw - 2 - kCellW - 1) >> 1);
-    for (int pressed = 0; pressed < 2; ++pressed) {
-        SetBits(7, pressed ? BS_PRESSED : 0);
-        canvas.Clear();
-        PaintOne(canvas, 7, 0, 0);
-        const int top = 1 + 5 + pressed;
-        for (int y = top - 1; y <= top + 3; ++y) {
-            const bool red = y >= top + 1 && y <= top + 2;
-            EXPECT_EQ(red, canvas.At(imageX + pressed + 1, y) == kRed) << "row " << y << (pressed ? ", pressed" : "");
-        }
-    }
-    QBR_SetButtonText(0);
 }
 
 } // namespace

@@ -261,19 +261,6 @@ TEST_F(QuickHelpTest, LeavingTheButtonsOrPressingAMouseButtonStopsThePoll) {
     }
 }
 
-TEST_F(QuickHelpTest, QuickHelpOffStopsNewTipsButNotARunningPoll) {
-    Hover(pane, At(pane, 0));
-    EXPECT_NE(0u, helpTimer) << "a toolbar's own mouse move starts the wait";
-    ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
-    QBR_SetQuickHelp(0);
-    Hover(pane, At(pane, 1));
-    ASSERT_TRUE(PumpUntil([&] { return helpItem == Item(2); })) << "the running poll goes on";
-    Leave();
-    Hover(pane, At(pane, 0));
-    EXPECT_EQ(0u, helpTimer);
-    EXPECT_FALSE(Shown());
-}
-
 // While no tip shows, every move over the button starts the wait again: the
 // tip comes one period after the last move. Nothing is pumped between the
 // moves, so no tick of an earlier wait can run in between; were the wait not

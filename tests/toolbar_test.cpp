@@ -511,39 +511,6 @@ void RealClick(POINT p) {
     }
 }
 
-// Floating frames stand above their host, even when built before the host
-// is on screen, after the host is raised, and after a click on a docked
-// toolbar activates the host while a floating frame had the activation.
-TEST_F(ToolbarTest, FloatingFramesStayAboveTheirHost) {
-    HWND host = CreateWindowExA(0, "QbrTestFrame", "Hidden Host", WS_OVERLAPPEDWINDOW, 60, 60, 500, 400, nullptr,
-                                nullptr, GetModuleHandleA(nullptr), nullptr);
-    ToolbarManager *hostManager = QBR_CreateManager(host);
-    HWND dock = QBR_CreateDock(hostManager, host, DOCK_TOP);
-    const UINT ids[] = {1, 2};
-    HWND pane = QBR_CreateToolbar("Early", TBF_VISIBLE | TBF_FLOATING, 100, 100, 0, 0, dock, ids, 2);
-    HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
-    ShowWindow(host, SW_SHOWNORMAL);
-    UpdateWindow(host);
-    PumpFor(4 * kRestackPeriod); // the window system raises the host on its own time
-    EXPECT_EQ(host, GetWindow(floating, GW_OWNER));
-    EXPECT_TRUE(Above(floating, host));
-    SetActiveWindow(host);
-    SetWindowPos(host, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
-    Pump();
-    EXPECT_TRUE(Above(floating, host)) << "after the host was raised";
-    HWND docked = QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, dock, ids, 2);
-    Pump();
-    SetActiveWindow(floating);
-    Pump();
-    SendMessageA(docked, WM_MOUSEACTIVATE, reinterpret_cast<WPARAM>(host), MAKELPARAM(HTCLIENT, WM_LBUTTONDOWN));
-    PumpFor(4 * kRestackPeriod);
-    EXPECT_EQ(host, GetActiveWindow());
-    EXPECT_TRUE(Above(floating, host)) << "after a click on a docked toolbar activated the host";
-    QBR_DestroyManager(hostManager);
-    DestroyWindow(host);
-    Pump();
-}
-
 // A click on a floating toolbar leaves the floating frames in their order
 // among themselves, at once and once the activation settled, also when
 // another window was active: "A", on top where three frames overlap, is the

@@ -2,7 +2,7 @@
 # Builds the C host in tests/consumer/ one of the ways the README's "Use it in
 # your program" shows, checks what the build did, and runs the host under Wine.
 #   consumer_test.sh BUILD_DIR subdirectory|package
-# Each way works in BUILD_DIR/consumer/<way>/ and starts from an empty folder.
+# Each way works in BUILD_DIR/consumer/<way>/.
 set -eu
 build=$(cd "$1" && pwd)
 way=$2
@@ -10,7 +10,9 @@ here=$(cd "$(dirname "$0")" && pwd)
 source_dir=$(cd "$here/../.." && pwd)
 work=$build/consumer/$way
 toolchain=$source_dir/cmake/mingw-w64-x86_64.cmake
-rm -rf "$work"
+# The folders stay between runs, as a developer's build folder does; what
+# was installed goes.
+rm -rf "$work/prefix"
 mkdir -p "$work"
 cd "$work"
 
