@@ -1,5 +1,5 @@
-// The demonstration program's view windows and About box, run in this
-// process on the program's own resources (demo_view_test.rc): the program's
+// The demonstration program's main and view windows, run in this process on
+// the program's own resources (demo_test.rc): the program's
 // sources are built in, the main window is made as WinMain makes it, and
 // views are opened with its "Open Another Window" command.
 #include <windows.h>
@@ -16,49 +16,10 @@
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
 
-// The fonts the program makes and deletes, counted where it makes them: the
-// platform cannot tell how many GDI objects a process holds.
-namespace {
-int fontsMade = 0;
-int fontsDeleted = 0;
-HFONT CountedCreateFont(const LOGFONTA *font) {
-    HFONT made = CreateFontIndirectA(font);
-    if (made) ++fontsMade;
-    return made;
-}
-BOOL CountedDeleteObject(HGDIOBJ object) {
-    const bool font = GetObjectType(object) == OBJ_FONT;
-    const BOOL deleted = DeleteObject(object);
-    if (deleted && font) ++fontsDeleted;
-    return deleted;
-}
-// The help the program asks for, noted on the way to the platform's viewer.
-struct HelpCall {
-    HWND owner;
-    std::string file;
-    UINT command;
-    ULONG_PTR data;
-    bool operator==(const HelpCall &o) const {
-        return owner == o.owner && file == o.file && command == o.command && data == o.data;
-    }
-};
-std::vector<HelpCall> helpCalls;
-BOOL RecordedWinHelp(HWND owner, LPCSTR file, UINT command, ULONG_PTR data) {
-    helpCalls.push_back(HelpCall{owner, file ? file : "", command, data});
-    return WinHelpA(owner, file, command, data);
-}
-} // namespace
-
-#define CreateFontIndirectA CountedCreateFont
-#define DeleteObject CountedDeleteObject
-#define WinHelpA RecordedWinHelp
 #include "demo/main.cpp"
 #include "demo/settings.cpp"
 #include "demo/statusbar.cpp"
 #include "demo/tables.cpp"
-#undef CreateFontIndirectA
-#undef DeleteObject
-#undef WinHelpA
 
 namespace {
 
@@ -115,17 +76,16 @@ POINT ButtonCentre(HWND pane, UINT id) {
 
 bool MenuChecked(HWND frame, UINT id) { return (GetMenuState(GetMenu(frame), id, MF_BYCOMMAND) & MF_CHECKED) != 0; }
 
-// The radio group 304..307 as the buttons have it: the id that is on, 0 for none.
-UINT RadioOn(ToolbarManager *manager) {
+// The button of a group that is on, 0 for none, 9999 for more than one.
+UINT GroupOn(ToolbarManager *manager, UINT first, UINT last) {
     UINT on = 0;
-    for (UINT id = 304; id <= 307; ++id)
+    for (UINT id = first; id <= last; ++id)
         if (QBR_GetButtonState(manager, id) & BS_ON) on = on ? 9999 : id;
     return on;
 }
-// The same from a frame's menu.
-UINT MenuRadioOn(HWND frame) {
+UINT MenuGroupOn(HWND frame, UINT first, UINT last) {
     UINT on = 0;
-    for (UINT id = 304; id <= 307; ++id)
+    for (UINT id = first; id <= last; ++id)
         if (MenuChecked(frame, id)) on = on ? 9999 : id;
     return on;
 }
@@ -229,12 +189,12 @@ TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
             SendMessageA(s.frame, WM_COMMAND, s.id, 0);
             Pump();
         }
-        EXPECT_EQ(RadioOn(mainManager), s.expectMain);
-        EXPECT_EQ(RadioOn(ma), s.expectA);
-        EXPECT_EQ(RadioOn(mb), s.expectB);
-        EXPECT_EQ(MenuRadioOn(mainWindow), s.expectMain);
-        EXPECT_EQ(MenuRadioOn(a), s.expectA);
-        EXPECT_EQ(MenuRadioOn(b), s.expectB);
+        EXPECT_EQ(GroupOn(mainManager, 304, 307), s.expectMain);
+        EXPECT_EQ(GroupOn(ma, 304, 307), s.expectA);
+        EXPECT_EQ(GroupOn(mb, 304, 307), s.expectB);
+        EXPECT_EQ(MenuGroupOn(mainWindow, 304, 307), s.expectMain);
+        EXPECT_EQ(MenuGroupOn(a, 304, 307), s.expectA);
+        EXPECT_EQ(MenuGroupOn(b, 304, 307), s.expectB);
     }
 
     // A check button toggles in its own frame only.
@@ -294,8 +254,8 @@ TEST_F(DemoViewTest, ViewLayoutIsSavedWhenAViewClosesAndRestoredByTheNextView) {
     EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mc, "Standard")));
     EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(b), "Style")));
     // Radio group and globals are set up as for a fresh view.
-    EXPECT_EQ(RadioOn(mc), 304u);
-    EXPECT_EQ(MenuRadioOn(c), 304u);
+    EXPECT_EQ(GroupOn(mc, 304, 307), 304u);
+    EXPECT_EQ(MenuGroupOn(c, 304, 307), 304u);
 
     // Closing the last of them writes what it shows.
     SendMessageA(b, WM_CLOSE, 0, 0);
@@ -408,88 +368,30 @@ TEST_F(DemoViewTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
     EXPECT_EQ(TableOf(mb)[2], table[2]);
 }
 
-// ---- The About box ---------------------------------------------------------------------
-
-HWND AboutBox() { return FindWindowA("#32770", "About QBR"); }
-
-struct AboutSeen {
-    bool opened = false;
-    RECT rect = {};
-    HFONT textFont = nullptr;
-    bool sameFontOnAllThree = false;
-    bool fontAlive = false;
-    int fontsHeldWhileOpen = 0;
-    UINT pressedWhileOpen = 0;
-    bool closed = false;
-};
-
-enum class Close { OkButton, EscapeKey, SystemMenu };
-
-// Steps that wait for the About box, look at it, and close it the way given.
-void AboutSteps(AboutSeen &seen, Close how, ToolbarManager *manager, int fontsHeldBefore) {
-    ModalSteps::Until([] { return AboutBox() != nullptr && IsWindowVisible(AboutBox()); });
-    ModalSteps::Add([&seen, how, manager, fontsHeldBefore] {
-        HWND box = AboutBox();
-        seen.opened = true;
-        GetWindowRect(box, &seen.rect);
-        seen.textFont = reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8001, WM_GETFONT, 0, 0));
-        seen.sameFontOnAllThree =
-            seen.textFont &&
-            seen.textFont == reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8002, WM_GETFONT, 0, 0)) &&
-            seen.textFont == reinterpret_cast<HFONT>(SendDlgItemMessageA(box, 8003, WM_GETFONT, 0, 0)) &&
-            seen.textFont != reinterpret_cast<HFONT>(SendDlgItemMessageA(box, IDOK, WM_GETFONT, 0, 0));
-        seen.fontAlive = GetObjectType(seen.textFont) == OBJ_FONT;
-        seen.fontsHeldWhileOpen = fontsMade - fontsDeleted - fontsHeldBefore;
-        seen.pressedWhileOpen = manager ? QBR_IsButtonPressed(manager, kAboutCommand) : 0;
-        switch (how) {
-        case Close::OkButton: {
-            RECT ok;
-            GetWindowRect(GetDlgItem(box, IDOK), &ok);
-            ClickAtStep(Centre(ok));
-            break;
-        }
-        case Close::EscapeKey: {
-            INPUT keys[2] = {};
-            keys[0].type = keys[1].type = INPUT_KEYBOARD;
-            keys[0].ki.wVk = keys[1].ki.wVk = VK_ESCAPE;
-            keys[1].ki.dwFlags = KEYEVENTF_KEYUP;
-            SendInput(2, keys, sizeof(INPUT));
-            break;
-        }
-        case Close::SystemMenu:
-            PostMessageA(box, WM_SYSCOMMAND, SC_CLOSE, 0);
-            break;
-        }
-    });
-    ModalSteps::Until([&seen] {
-        seen.closed = AboutBox() == nullptr;
-        return seen.closed;
-    });
-}
-
-// Pumps until the steps saw the box close (the modal loop runs inside a
-// dispatch of this loop when a button opened it).
-void RunUntilClosed(const AboutSeen &seen) {
-    for (int round = 0; round < 600 && !seen.closed; ++round)
-        PumpFor(5);
-    Pump();
-    ModalSteps::Stop();
-}
-
-// ---- Start states, the Palette group, help and the edit control -----------------------
-
-// The button of a group that is on, 0 for none, 9999 for more than one.
-UINT GroupOn(ToolbarManager *manager, UINT first, UINT last) {
-    UINT on = 0;
-    for (UINT id = first; id <= last; ++id)
-        if (QBR_GetButtonState(manager, id) & BS_ON) on = on ? 9999 : id;
-    return on;
-}
-UINT MenuGroupOn(HWND frame, UINT first, UINT last) {
-    UINT on = 0;
-    for (UINT id = first; id <= last; ++id)
-        if (MenuChecked(frame, id)) on = on ? 9999 : id;
-    return on;
+// A first start shows Standard and Style docked at the top and Align and
+// Palette floating at their places, Palette wrapped into rows of three.
+TEST_F(DemoViewTest, AFirstStartShowsTheDefaultToolbars) {
+    const struct {
+        const char *title;
+        UINT flags;
+        POINT corner; // of a floating frame
+        int rows;
+    } bars[] = {{"Standard", TBF_VISIBLE | TBF_DOCKED, {}, 1},
+                {"Style", TBF_VISIBLE | TBF_DOCKED, {}, 1},
+                {"Align", TBF_VISIBLE | TBF_FLOATING, {300, 100}, 1},
+                {"Palette", TBF_VISIBLE | TBF_FLOATING, {300, 200}, 4}};
+    ASSERT_EQ(4u, QBR_GetToolbarCount(mainManager));
+    for (const auto &b : bars) {
+        SCOPED_TRACE(b.title);
+        HWND pane = PaneTitled(mainManager, b.title);
+        ASSERT_NE(nullptr, pane);
+        EXPECT_EQ(b.flags, QBR_GetToolbarFlags(pane));
+        RECT frame, area;
+        GetWindowRect(ResolveRoleWindow(pane, ROLE_ACTIVE), &frame);
+        GetItemArea(pane, ROLE_ACTIVE, &area);
+        if (b.flags & TBF_FLOATING) EXPECT_EQ(b.corner.x * 10000 + b.corner.y, frame.left * 10000 + frame.top);
+        EXPECT_EQ(b.rows * 22, area.bottom - area.top);
+    }
 }
 
 // The Palette group of the main window: one tool at a time, on its buttons and
@@ -555,19 +457,6 @@ TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
         expectEdit("one toolbar docked again");
         EXPECT_TRUE(IsWindowVisible(top));
     }
-}
-
-// ---- Views whose parts cannot be made ----------------------------------------------------
-
-// A thread hook that refuses the creation of every window of one class.
-const char *refusedClass = nullptr;
-LRESULT CALLBACK RefuseCreation(int code, WPARAM wParam, LPARAM lParam) {
-    if (code == HCBT_CREATEWND && refusedClass) {
-        char name[64] = "";
-        GetClassNameA(reinterpret_cast<HWND>(wParam), name, sizeof name);
-        if (lstrcmpiA(name, refusedClass) == 0) return 1;
-    }
-    return CallNextHookEx(nullptr, code, wParam, lParam);
 }
 
 } // namespace
