@@ -288,8 +288,6 @@ TEST_F(PaintTest, DisabledInkIsEmbossed) {
     }
 }
 
-// ---- Shared objects, caption ----------------------------------------------------
-
 // ---- Toolbar surface and floating caption -----------------------------------------
 
 // A frame with a top dock, buttons 1..3 on the test strip, and a toolbar.
@@ -363,8 +361,6 @@ TEST_F(SurfaceTest, PaneAndFrameShowSurfaceButtonsAndCaption) {
     EXPECT_LE(std::abs((left + right) - px.width), 6) << left << ".." << right;
 }
 
-// ---- Exact places and colours of the moment -------------------------------------------
-
 // Changes system colours for the length of a scope, and puts them back.
 class SchemeChange {
   public:
@@ -386,14 +382,6 @@ class SchemeChange {
     bool ok_ = false;
 };
 
-// Button texts a test chooses; an empty one is no label.
-std::string labelText;
-int CALLBACK LabelText(UINT, UINT kind, LPSTR buffer, int size) {
-    if (kind != HELP_BUTTON_TEXT) return 0;
-    lstrcpynA(buffer, labelText.c_str(), size);
-    return lstrlenA(buffer);
-}
-
 // The surface reads the face colour at every paint; the buttons keep the
 // colours of the library's start.
 TEST_F(SurfaceTest, TheSurfaceTakesTheFaceColourOfEachPaint) {
@@ -406,79 +394,6 @@ TEST_F(SurfaceTest, TheSurfaceTakesTheFaceColourOfEachPaint) {
     EXPECT_EQ(Hex(now), Hex(px.At(2, 1)));
     EXPECT_EQ(Hex(now), Hex(px.At(px.width - 2, px.height - 2)));
     EXPECT_EQ(Hex(colors.face), Hex(px.At(kAreaLeft + 2, kPaneAreaTop + 10))) << "a button's face";
-}
-
-// The title, to the pixel: in the caption font and colour, from
-// x = (client width + 1 - text width) >> 1 (centred over the band and the line's
-// right side beyond it) and y = -1, under the close box. A frame with the title,
-// and a frame of the same size without one with the text drawn by hand and the
-// box over it again, show the same band. Widths of both parities are among the
-// titles, so that half a pixel of centring shows.
-TEST_F(SurfaceTest, TheTitleStandsCentredOnePixelAboveTheClientArea) {
-    HWND blank = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING, ""), ROLE_FLOATING);
-    ASSERT_TRUE(IsWindowVisible(blank));
-    RECT client;
-    GetClientRect(blank, &client);
-    const int ch = captionHeight;
-    Canvas painted(client.right + 2, ch + 4), expected(client.right + 2, ch + 4);
-    bool parity[2] = {false, false};
-    for (const char *title : {"Tools", "Edit", "Format", "ii", "W", "Ab"}) {
-        HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING, title), ROLE_FLOATING);
-        ASSERT_EQ(client, ClientRectOf(frame)) << title;
-        painted.Clear();
-        PaintFloatingCaption(frame, painted.Dc());
-        expected.Clear();
-        PaintFloatingCaption(blank, expected.Dc());
-        const int length = lstrlenA(title);
-        {
-            SelectScope font(expected.Dc(), captionFont);
-            SIZE extent = {};
-            GetTextExtentPointA(expected.Dc(), title, length, &extent);
-            parity[(client.right + 1 - extent.cx) & 1] = true;
-            const int oldMode = SetBkMode(expected.Dc(), TRANSPARENT);
-            SetTextColor(expected.Dc(), GetSysColor(COLOR_CAPTIONTEXT));
-            ExtTextOutA(expected.Dc(), (client.right + 1 - extent.cx) >> 1, -1, 0, nullptr, title,
-                        static_cast<UINT>(length), nullptr);
-            SetBkMode(expected.Dc(), oldMode);
-        }
-        PaintCloseBox(blank, expected.Dc());
-        EXPECT_TRUE(painted.All() == expected.All()) << title;
-        QBR_DestroyToolbar(ResolveRoleWindow(frame, ROLE_DOCKED));
-    }
-    EXPECT_TRUE(parity[0] && parity[1]) << "the titles should have widths of both parities";
-}
-
-// The close box gets its dash from a band of 5 pixels on: its black outline
-// has its top left pixel at (2, ((height - 1) >> 1) - 1); below 5 the box is
-// edge and face only, with no pixel of a dash however small.
-TEST_F(SurfaceTest, TheCloseBoxDashNeedsABandOfFivePixels) {
-    HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
-    const int saved = captionHeight;
-    const struct {
-        int height;
-        bool dash;
-    } cases[] = {{3, false}, {4, false}, {5, true}, {6, true}, {9, true}};
-    for (const auto &k : cases) {
-        captionHeight = k.height;
-        Canvas canvas(16, 16);
-        PaintCloseBox(frame, canvas.Dc());
-        int black = 0;
-        for (int y = 0; y < k.height; ++y)
-            for (int x = 0; x <= k.height; ++x)
-                black += canvas.At(x, y) == kBlack;
-        const int t = (k.height - 1) >> 1;
-        EXPECT_EQ(Hex(k.dash ? kBlack : colors.face), Hex(canvas.At(2, t - 1))) << "band " << k.height;
-        EXPECT_EQ(k.dash, black > 0) << "band " << k.height;
-        if (!k.dash) { // the inside of the box is face, every pixel of it
-            int face = 0;
-            for (int y = 0; y < k.height - 1; ++y)
-                for (int x = 0; x < k.height; ++x)
-                    face += canvas.At(x, y) == colors.face;
-            EXPECT_EQ(k.height * (k.height - 1), face) << "band " << k.height;
-        }
-        EXPECT_EQ(Hex(line), Hex(canvas.At(k.height, 0))) << "band " << k.height << ": right edge";
-    }
-    captionHeight = saved;
 }
 
 // The relief of a raised and of a sunken button, pixel by pixel: f frame ring,
