@@ -1,6 +1,7 @@
-// The toolbar menu and the two customising dialogs, driven from inside their
-// modal loops by steps (support/modal.h), with real mouse input picking menu
-// entries and dragging buttons out of the list.
+// The toolbar menu and the Insert Toolbar Item dialog, driven from inside
+// their modal loops by steps (support/modal.h), with real mouse input picking
+// menu entries. Dragging buttons out of the list and the New Toolbar dialog
+// are the customising journey's (tests/e2e/demo_customize_e2e.sh).
 #include <algorithm>
 #include <functional>
 #include <string>
@@ -34,12 +35,6 @@ std::vector<UINT> ListIds(HWND list) {
     return out;
 }
 
-RECT ScreenLineRect(HWND list, int line) {
-    RECT r = {};
-    SendMessageA(list, LB_GETITEMRECT, line, reinterpret_cast<LPARAM>(&r));
-    MapWindowPoints(list, nullptr, reinterpret_cast<POINT *>(&r), 2);
-    return r;
-}
 
 // ---- Fixture -----------------------------------------------------------------
 //
@@ -94,8 +89,6 @@ class CustomizeTest : public FrameTest {
     static HWND InsertDialog() { return FindWindowA("#32770", "Insert Toolbar Item"); }
     HWND top = nullptr, alpha = nullptr, beta = nullptr, gamma = nullptr, untitled = nullptr;
 };
-
-// ---- The dialog templates, as stored ---------------------------------------------------
 
 
 // ---- The toolbar menu -------------------------------------------------------------
@@ -224,96 +217,6 @@ TEST_F(CustomizeTest, InsertDialogCentresAndListsCategoriesItemsAndDescriptions)
     EXPECT_EQ((GetSystemMetrics(SM_CXSCREEN) - width) / 2, dialogRect.left);
     EXPECT_EQ((GetSystemMetrics(SM_CYSCREEN) - height) / 3, dialogRect.top);
     EXPECT_EQ(gdiBefore, LiveGdiObjects()) << "the dialog's font and the drawing brushes are gone";
-}
-
-// Drags out of the list with the real cursor, one dialog session: each drag
-// is press, two moves and a release, each handled before the next.
-TEST_F(CustomizeTest, DragFromListInsertsAtTheDropPointOnly) {
-    ToolbarRecord *gammaRecord = RecordOfWindow(gamma);
-    RECT alphaFirst;
-    ASSERT_EQ(1u, GetItemRect(RecordOfWindow(alpha), 0, &alphaFirst));
-    MapWindowPoints(alpha, nullptr, reinterpret_cast<POINT *>(&alphaFirst), 2);
-    RECT gammaFrame;
-    GetWindowRect(FrameOf(gamma), &gammaFrame);
-
-    enum Where { kOnPicture, kBesidePicture };
-    struct Button {
-        DWORD down, up;
-        int key;
-    };
-    const Button left = {MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP, VK_LBUTTON};
-    const Button right = {MOUSEEVENTF_RIGHTDOWN, MOUSEEVENTF_RIGHTUP, VK_RBUTTON};
-    struct Drag {
-        const char *name;
-        int line; // in the first category: items 1, 2, 3
-        Button button;
-        Where where;
-        POINT drop;
-        bool lockGamma;
-        std::vector<UINT> alphaAfter, gammaAfter;
-    };
-    const POINT nowhere = {1010, 20};
-    const Drag drags[] = {
-        {"onto Alpha's first button", 2, left, kOnPicture, Centre(alphaFirst), false, {3, 1, 2}, {}},
-        {"a button Alpha has already", 1, left, kOnPicture, Centre(alphaFirst), false, {3, 1, 2}, {}},
-        {"right button, onto the empty floating toolbar",
-         0,
-         right,
-         kOnPicture,
-         Centre(gammaFrame),
-         false,
-         {3, 1, 2},
-         {1}},
-        {"dropped beside every toolbar", 1, left, kOnPicture, nowhere, false, {3, 1, 2}, {1}},
-        {"pressed beside the picture: no drag", 2, left, kBesidePicture, Centre(gammaFrame), false, {3, 1, 2}, {1}},
-        {"a toolbar with locked items", 1, left, kOnPicture, Centre(gammaFrame), true, {3, 1, 2}, {1}},
-        {"onto the floating toolbar's button", 1, right, kOnPicture, Centre(gammaFrame), false, {3, 1, 2}, {2, 1}},
-    };
-    const LONG gdiBefore = LiveGdiObjects();
-    struct Seen {
-        std::vector<UINT> alpha, gamma;
-        LRESULT selected = -1;
-        std::string description;
-    };
-    std::vector<Seen> seen(std::size(drags));
-    // Every step names its drag by index: the table outlives the dialog.
-    for (size_t i = 0; i < std::size(drags); ++i) {
-        ModalSteps::Add([&, i] {
-            const Drag &d = drags[i];
-            if (d.lockGamma)
-                gammaRecord->flags |= TBF_LOCKED_ITEMS;
-            else
-                gammaRecord->flags &= ~TBF_LOCKED_ITEMS;
-            RECT line = ScreenLineRect(GetDlgItem(InsertDialog(), 5003), d.line);
-            PlaceCursorStep(d.where == kOnPicture ? Centre(line) : POINT{line.left + 1, (line.top + line.bottom) / 2});
-        });
-        ModalSteps::Add([&, i] { SendButton(drags[i].button.down); });
-        ModalSteps::Until([&, i] { return ButtonDown(drags[i].button.key); });
-        ModalSteps::Add([&, i] {
-            HWND list = GetDlgItem(InsertDialog(), 5003);
-            seen[i].selected = SendMessageA(list, LB_GETCURSEL, 0, 0);
-            seen[i].description = TextOf(GetDlgItem(InsertDialog(), 5005));
-            PlaceCursorStep(POINT{(drags[i].drop.x + 500) / 2, (drags[i].drop.y + 300) / 2});
-        });
-        ModalSteps::Add([&, i] { PlaceCursorStep(drags[i].drop); });
-        ModalSteps::Add([&, i] { SendButton(drags[i].button.up); });
-        ModalSteps::Until([&, i] { return !ButtonDown(drags[i].button.key); });
-        ModalSteps::Add([&, i] {
-            seen[i].alpha = Ids(alpha);
-            seen[i].gamma = Ids(gamma);
-        });
-    }
-    ModalSteps::Add([] { PostMessageA(InsertDialog(), WM_COMMAND, IDCANCEL, 0); });
-    RunInsertDialog();
-
-    for (size_t i = 0; i < std::size(drags); ++i) {
-        SCOPED_TRACE(drags[i].name);
-        EXPECT_EQ(drags[i].line, seen[i].selected) << "the press selects its line";
-        EXPECT_EQ("D" + std::to_string(drags[i].line + 1), seen[i].description);
-        EXPECT_EQ(drags[i].alphaAfter, seen[i].alpha);
-        EXPECT_EQ(drags[i].gammaAfter, seen[i].gamma);
-    }
-    EXPECT_EQ(gdiBefore, LiveGdiObjects());
 }
 
 // ---- The New Toolbar dialog --------------------------------------------------------
