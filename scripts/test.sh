@@ -9,4 +9,6 @@ build=${1:-$here/build}
 "$here/scripts/build.sh" "$build"
 "$here/scripts/test-ratio.sh"
 cd "$build"
-ctest --output-on-failure --timeout 900
+# Two at a time: the tests on the desktop run one after the other (they share
+# its lock), and the portable builds run beside them.
+ctest --output-on-failure --timeout 900 -j2
