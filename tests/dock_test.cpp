@@ -44,6 +44,31 @@ TEST_F(DockTest, NewTopDockIsHiddenPlaceholderAndTellsTheFrameOnce) {
     EXPECT_EQ(nullptr, FindDockRecord(frame));
 }
 
+// QBR_GetDock finds the oldest dock of a side; a dock that holds toolbars is
+// not destroyed, an emptied one is.
+TEST_F(DockTest, GetDockFindsTheOldestDockAndADockWithToolbarsStays) {
+    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
+    HWND left = MakeDock(DOCK_LEFT), top = MakeDock(DOCK_TOP);
+    MakeDock(DOCK_LEFT);
+    const struct {
+        ToolbarManager *manager;
+        UINT side;
+        HWND expected;
+    } cases[] = {{nullptr, DOCK_LEFT, nullptr}, {manager, DOCK_TOP, top}, {manager, DOCK_LEFT, left},
+                 {manager, DOCK_RIGHT, nullptr}, {manager, 7, nullptr}};
+    for (const auto &c : cases)
+        EXPECT_EQ(c.expected, QBR_GetDock(c.manager, c.side)) << "side " << c.side;
+    const UINT ids[] = {1, 2};
+    HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 2);
+    QBR_DestroyDock(top);
+    EXPECT_TRUE(IsWindow(top) && IsWindow(pane));
+    QBR_DestroyToolbar(pane);
+    Pump();
+    QBR_DestroyDock(top);
+    EXPECT_FALSE(IsWindow(top));
+    EXPECT_EQ(nullptr, QBR_GetDock(manager, DOCK_TOP));
+}
+
 TEST_F(DockTest, SideDocksStartBelowTheTopDockAndRunToFullScreenHeight) {
     const ButtonSize b = CurrentButton();
     const int cyFull = GetSystemMetrics(SM_CYFULLSCREEN);

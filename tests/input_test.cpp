@@ -195,6 +195,7 @@ TEST_F(InputTest, ThePressedLookFollowsTheCursorAndOnlyAReleaseOnTheButtonActs) 
         {"released off it", "d1 m- u-", "100", false},
         {"released on its neighbour", "d1 m2 u2", "100", false},
         {"released off with the pressed look", "d1 u-", "10", false},
+        {"other presses while one runs change nothing", "d1 d2 d- u1", "1000", true},
         {"inactive, moved off, active again", "d1 i- m- a- m- u-", "111100", false},
         {"disabled, released on it", "d2 m- m2 u2", "0000", false},
         {"disabled, released off it", "d2 m- u-", "000", false},

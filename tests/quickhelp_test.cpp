@@ -261,6 +261,70 @@ TEST_F(QuickHelpTest, LeavingTheButtonsOrPressingAMouseButtonStopsThePoll) {
     }
 }
 
+// Disabled buttons get their tip; separators, the empty space and a button
+// whose text the host does not give yet get none, until it does.
+TEST_F(QuickHelpTest, OnlyButtonsWithATextGetATip) {
+    QBR_SetButtonEnabled(manager, 1, 0); // the tests look at the kind only
+    const struct {
+        HWND toolbar;
+        int index;
+        bool timer, tip;
+    } cases[] = {
+        {pane, 0, true, true},    // disabled button
+        {pane, 2, false, false},  // separator
+        {pane, -1, false, false}, // empty space
+        {pane, 3, true, false},   // button 3 has no text
+    };
+    for (const auto &k : cases) {
+        asked.clear();
+        Hover(k.toolbar, k.index >= 0 ? At(k.toolbar, k.index) : At(k.toolbar, -1, 1, 1));
+        EXPECT_EQ(k.timer, helpTimer != 0) << k.index;
+        // A running poll asks for the text at every tick until it gets one.
+        if (k.timer) EXPECT_TRUE(PumpUntil([&] { return Shown() || asked.size() >= 3; })) << k.index;
+        EXPECT_EQ(k.tip, Shown()) << k.index;
+        EXPECT_EQ(k.timer, helpTimer != 0) << k.index;
+        Leave();
+    }
+    // Button 3 gets its tip as soon as the host has a text for it.
+    Hover(pane, At(pane, 3));
+    texts[3] = "Late";
+    EXPECT_TRUE(PumpUntil([&] { return Shown(); }));
+}
+
+// Quick help switched off stops new tips, not a poll under way.
+TEST_F(QuickHelpTest, QuickHelpOffStopsNewTipsButNotARunningPoll) {
+    Hover(pane, At(pane, 0));
+    EXPECT_NE(0u, helpTimer) << "a toolbar's own mouse move starts the wait";
+    ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
+    QBR_SetQuickHelp(0);
+    Hover(pane, At(pane, 1));
+    ASSERT_TRUE(PumpUntil([&] { return helpItem == Item(2); })) << "the running poll goes on";
+    Leave();
+    Hover(pane, At(pane, 0));
+    EXPECT_EQ(0u, helpTimer);
+    EXPECT_FALSE(Shown());
+}
+
+// The end of the tip's own manager hides it, and a paint then asks for no
+// text of a freed item; another manager's end leaves it alone.
+TEST_F(QuickHelpTest, TheTipForgetsADestroyedManagersItems) {
+    ShowTip(pane, 0);
+    HWND frame2 = CreateRecordingFrame(100, 500, 200, 100);
+    QBR_DestroyManager(QBR_CreateManager(frame2));
+    DestroyWindow(frame2);
+    Pump();
+    EXPECT_TRUE(Shown());
+    QBR_DestroyManager(manager);
+    manager = nullptr;
+    EXPECT_FALSE(Shown());
+    asked.clear();
+    ShowWindow(Help(), SW_SHOWNA);
+    UpdateWindow(Help());
+    ShowWindow(Help(), SW_HIDE);
+    EXPECT_TRUE(asked.empty()) << "paint asked for the text of a freed item";
+    EXPECT_TRUE(PumpUntil([&] { return helpTimer == 0; })) << "no record under the cursor: the poll stops";
+}
+
 // While no tip shows, every move over the button starts the wait again: the
 // tip comes one period after the last move. Nothing is pumped between the
 // moves, so no tick of an earlier wait can run in between; were the wait not

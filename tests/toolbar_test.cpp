@@ -434,6 +434,23 @@ TEST_F(ToolbarTest, APaneWithoutItsFrameOrRecordIsNotMade) {
     DestroyWindow(notDock);
 }
 
+// A destroyed toolbar's handle and windows that are no toolbar or no dock
+// are answered with 0 and left alone.
+TEST_F(ToolbarTest, StaleHandlesAndForeignWindowsGiveZero) {
+    HWND pane = Make({1});
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    QBR_DestroyToolbar(pane);
+    Pump();
+    EXPECT_FALSE(IsWindow(pane) || IsWindow(frameWindow));
+    EXPECT_EQ(0u, QBR_GetToolbarCount(manager));
+    EXPECT_EQ(nullptr, ManagerOfToolbar(pane)) << "the cache must not outlive the toolbar";
+    EXPECT_EQ(0u, QBR_GetToolbarFlags(pane));
+    QBR_SetToolbarFlags(frame, TBF_VISIBLE);
+    QBR_DestroyToolbar(frame); // not a toolbar: left alone
+    EXPECT_TRUE(IsWindow(frame));
+    EXPECT_EQ(nullptr, QBR_CreateToolbar("X", TBF_VISIBLE, 0, 0, 0, 0, frame, nullptr, 0)) << "a window that is no dock";
+}
+
 // A host may pump messages between QBR_DestroyManager and the end of its
 // frame. The docks empty, hide and tell the frame at once; afterwards no
 // window names the freed manager, and paints, clicks, timers and the end of
