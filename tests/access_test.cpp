@@ -393,12 +393,13 @@ TEST_F(AccessTest, EveryStateChangeShowAndHideIsAnEvent) {
 TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     QBR_SetButtonEnabled(manager, 3, 0);
     QBR_SetButtonEnabled(manager, 8, 0);
-    // Made out of the keyboard's order: the order is the docks', then the
-    // floating toolbars'.
+    // Made out of the keyboard's order: the order is the docks' (top, left,
+    // right, bottom), then the floating toolbars'.
     Make("Float", {9, 10}, TBF_VISIBLE | TBF_FLOATING);
     Make("Left", {7, 8}, TBF_VISIBLE | TBF_DOCKED, left);
     Make("A", {1, 2, 0, 3, 4});
     Make("B", {5, 6});
+    Make("Low", {12}, TBF_VISIBLE | TBF_DOCKED, MakeDock(DOCK_BOTTOM));
     Make("Hidden", {11}, TBF_HIDDEN | TBF_DOCKED);
     Make("Empty", {0, 8}); // nothing enabled
     const struct {
@@ -407,7 +408,7 @@ TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     } steps[] = {
         {"A", "host"},    {"Right", "host"},   {"F6", "A 0"},      {"Right", "A 1"},    {"Right", "A 4"},
         {"Right", "A 0"}, {"Left", "A 4"},     {"Home", "A 0"},    {"End", "A 4"},      {"Up", "A 4"},
-        {"Down", "A 4"},  {"Tab", "B 0"},      {"Tab", "Left 0"},  {"Right", "Left 0"}, {"Tab", "Float 0"},
+        {"Down", "A 4"},  {"Tab", "B 0"},      {"Tab", "Left 0"},  {"Right", "Left 0"}, {"Tab", "Low 0"},     {"Tab", "Float 0"},
         {"Tab", "A 0"},   {"+Tab", "Float 0"}, {"End", "Float 1"}, {"Esc", "host"},     {"F6", "A 0"},
         {"F6", "host"},
     };

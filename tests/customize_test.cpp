@@ -133,6 +133,34 @@ TEST_F(CustomizeTest, MenuListsToolbarsWithChecksAndOffersInsertAndDelete) {
     }
 }
 
+// A menu entry shows or hides its toolbar where it stands, docked or floating.
+TEST_F(CustomizeTest, MenuEntryTogglesShowAndKeepsThePlace) {
+    struct Case {
+        const char *entry;
+        HWND *pane;
+        UINT flagsAfter;
+    };
+    const Case cases[] = {
+        {"Beta", &beta, TBF_VISIBLE | TBF_DOCKED},
+        {"Gamma", &gamma, TBF_HIDDEN | TBF_FLOATING | TBF_USER_CREATED},
+        {"Gamma", &gamma, TBF_VISIBLE | TBF_FLOATING | TBF_USER_CREATED},
+        {"Alpha", &alpha, TBF_HIDDEN | TBF_DOCKED},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.entry);
+        ModalSteps::Add([&] { ClickMenuEntry(OpenMenu(), c.entry); });
+        RunMenu(alpha);
+        EXPECT_EQ(c.flagsAfter, QBR_GetToolbarFlags(*c.pane));
+        HWND shown = ResolveRoleWindow(*c.pane, (c.flagsAfter & TBF_FLOATING) ? ROLE_FLOATING : ROLE_DOCKED);
+        EXPECT_EQ((c.flagsAfter & TBF_VISIBLE) != 0, IsWindowVisible(shown) != 0);
+    }
+    // An id whose toolbar does not exist (a stale menu) and the separator's
+    // id change nothing.
+    OnToolbarCommand(beta, 201 + 4);
+    OnToolbarCommand(beta, 0);
+    EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, QBR_GetToolbarFlags(beta));
+}
+
 TEST_F(CustomizeTest, DeleteAsksAndOnlyYesDeletes) {
     const int before = static_cast<int>(QBR_GetToolbarCount(manager));
     struct Case {

@@ -378,6 +378,17 @@ class SchemeChange {
     bool ok_ = false;
 };
 
+// A strip loaded under another scheme takes that scheme's colours.
+TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
+    SchemeChange scheme({COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT},
+                        {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)});
+    ASSERT_TRUE(scheme.Ok());
+    HBITMAP strip = LoadImageStrip(GetModuleHandleA(nullptr), TestStrip());
+    ASSERT_NE(nullptr, strip);
+    ExpectStripColours(BitmapPixels(strip), SchemeColors());
+    GdiDelete(strip);
+}
+
 // The surface reads the face colour at every paint; the buttons keep the
 // colours of the library's start.
 TEST_F(SurfaceTest, TheSurfaceTakesTheFaceColourOfEachPaint) {

@@ -50,11 +50,13 @@ sleep 0.4
 xdotool type --delay 80 Mine
 sleep 0.2
 shot customize-new-toolbar
+read -r il it ir ib iv <<<"$(ctl rect "Insert Toolbar Item")"
 xdotool key Return
 ctl wait Mine 5000 || fail "no toolbar Mine after OK"
 sleep 0.5
 read -r l t r b v <<<"$(ctl rect Mine)"
 [ "$v" = 1 ] || fail "Mine is not shown"
+[ "$l $t" = "$il $ib" ] || fail "Mine floats at $l,$t, not below the Insert dialog ($il $it $ir $ib)"
 # The Insert dialog should stay above its owner, the main window; under Wine
 # the main window sometimes comes over it here.
 [ "$(ctl zorder | grep -m1 -e '^Insert Toolbar Item' -e '^Quaybar Demo$')" = "Insert Toolbar Item owned by Quaybar Demo" ] ||
