@@ -18,6 +18,11 @@ void AccessDefaultAction(HWND window, WPARAM index, LPARAM id);
 // A button's state, enabled or pressed bit changed: the item at `index` of
 // `record` tells the screen readers.
 void AccessItemChanged(const ToolbarRecord *record, UINT index);
+// Customising added (EVENT_OBJECT_CREATE) or took away (EVENT_OBJECT_DESTROY)
+// the item at `index` of `record`'s list (where it stood, for a removal): the
+// readers hear of the item and then of the toolbar's new order
+// (EVENT_OBJECT_REORDER), as from the platform's own lists.
+void AccessItemsEdited(const ToolbarRecord *record, DWORD event, UINT index);
 // WM_SHOWWINDOW and WM_WINDOWPOSCHANGED of a toolbar window: a show or hide
 // is announced.
 void AccessShowWindow(HWND window, WPARAM show, LPARAM status);
@@ -42,7 +47,5 @@ void AccessToolbarHidden(HWND window);
 HWND ItemsWindow(const ToolbarRecord *record);
 // The rectangle of the item at `index` on the screen; 0 if it has no place.
 UINT ItemScreenRect(const ToolbarRecord *record, UINT index, RECT *rect);
-// Whether the item at `index` is a button that can be pressed.
-bool IsEnabledButton(const ToolbarRecord *record, UINT index);
 // Tells the screen readers of `event` on the item at `index` (0-based).
 void NotifyItemEvent(DWORD event, const ToolbarRecord *record, UINT index);

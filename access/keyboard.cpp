@@ -1,7 +1,7 @@
 // The keyboard on the toolbars. The host frame keeps the activation and the
 // window focus; the host hands its queued messages to QBR_TranslateToolbarKey
-// (as to IsDialogMessage), and while a frame's toolbars have the keyboard the
-// keys go to them:
+// (as to IsDialogMessage), and while a frame's toolbars have the keyboard
+// these keys go to them; every other key goes on to the host's loop:
 //
 //   F6            into the toolbars: the first enabled button of the first
 //                 shown toolbar; again, or Esc, gives the keyboard back
@@ -21,7 +21,7 @@
 #include "access/access.h"
 #include "core/core.h"
 #include "dock/dock.h"
-#include "input/input.h"
+#include "command/command.h"
 #include "quickhelp/quickhelp.h"
 #include "toolbar/toolbar.h"
 
@@ -154,9 +154,9 @@ void ShowKeyTip() {
     ToolbarRecord *record = FocusedRecord();
     RECT rect;
     if (record && ItemScreenRect(record, keyFocus.index, &rect))
-        QuickHelpForKey(ItemAt(record, keyFocus.index), &rect);
+        QuickHelpForKey(record->paneWindow, ItemAt(record, keyFocus.index), &rect);
     else
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
 }
 
 void CancelKeyPress() {
@@ -207,33 +207,51 @@ bool EnterKeyboard(HWND root) {
         keyFocus.host = root;
         keyFocus.returnTo = GetFocus();
         // Quick help follows the keyboard now, not the cursor.
-        QuickHelpForKey(nullptr, nullptr);
+        QuickHelpForKey(nullptr, nullptr, nullptr);
         MoveFocus(record, index);
         return true;
     }
     return false; // nothing to focus: F6 stays the host's
 }
 
-void LeaveKeyboard(bool giveFocusBack) {
+// How the keyboard leaves the toolbars: whether the window that had it at
+// F6 gets the focus back, and whether the readers must be told where the
+// keyboard is now. The window focus never left the host, so no focus event
+// of the platform's says so; only when another window is being activated
+// does the platform announce the focus itself.
+enum class Leave { Quietly, Announce, GiveBack };
+
+void LeaveKeyboard(Leave how) {
     if (!keyFocus.host) return;
     CancelKeyPress();
     const KeyFocus old = keyFocus;
     keyFocus = KeyFocus{};
     RepaintFocused(old.pane, old.index);
-    QuickHelpForKey(nullptr, nullptr);
-    if (giveFocusBack && old.returnTo && IsWindow(old.returnTo) && GetFocus() != old.returnTo &&
+    QuickHelpForKey(nullptr, nullptr, nullptr);
+    if (how == Leave::Quietly) return;
+    const HWND focus = GetFocus();
+    if (how == Leave::GiveBack && old.returnTo && IsWindow(old.returnTo) && focus != old.returnTo &&
         (old.returnTo == old.host || IsChild(old.host, old.returnTo)))
         SetFocus(old.returnTo);
+    // A SetFocus that moved the focus was announced by the platform.
+    if (focus && GetFocus() == focus) NotifyWinEvent(EVENT_OBJECT_FOCUS, focus, OBJID_CLIENT, CHILDID_SELF);
+}
+
+// A menu opened from the keyboard has closed: the button that opened it, or
+// wherever the keyboard is now, is announced again.
+void AnnounceFocusAgain() {
+    if (ToolbarRecord *record = FocusedRecord()) NotifyItemEvent(EVENT_OBJECT_FOCUS, record, keyFocus.index);
 }
 
 void OpenToolbarMenu(ToolbarRecord *record) {
     CancelKeyPress();
-    QuickHelpForKey(nullptr, nullptr);
+    QuickHelpForKey(nullptr, nullptr, nullptr);
     // The menu opens where a right click on the button's lower left would
     // open it.
     RECT rect;
     if (!ItemScreenRect(record, keyFocus.index, &rect)) GetWindowRect(ItemsWindow(record), &rect);
     ShowToolbarMenu(record->paneWindow, rect.left, rect.bottom, ItemsWindow(record));
+    AnnounceFocusAgain();
 }
 
 void NavigateKey(ToolbarRecord *record, UINT key) {
@@ -274,17 +292,38 @@ void NavigateKey(ToolbarRecord *record, UINT key) {
 
 bool Shifted() { return GetKeyState(VK_SHIFT) < 0; }
 
-// A key down while the toolbars have the keyboard. Every key is theirs.
+// The keys the toolbars use while they have the keyboard. Any other key, a
+// host's accelerator such as Ctrl+S among them, goes on to the host's loop.
+bool IsToolbarKey(UINT key) {
+    switch (key) {
+    case VK_F6:
+    case VK_ESCAPE:
+    case VK_LEFT:
+    case VK_RIGHT:
+    case VK_UP:
+    case VK_DOWN:
+    case VK_HOME:
+    case VK_END:
+    case VK_TAB:
+    case VK_SPACE:
+    case VK_RETURN:
+    case VK_APPS:
+        return true;
+    }
+    return false;
+}
+
+// A key down while the toolbars have the keyboard, one of theirs.
 void OnKeyDown(UINT key, LPARAM lParam) {
     ToolbarRecord *record = FocusedRecord();
     if (!record) {
-        LeaveKeyboard(true);
+        LeaveKeyboard(Leave::GiveBack);
         return;
     }
     switch (key) {
     case VK_F6:
     case VK_ESCAPE:
-        LeaveKeyboard(true);
+        LeaveKeyboard(Leave::GiveBack);
         break;
     case VK_LEFT:
     case VK_RIGHT:
@@ -301,7 +340,10 @@ void OnKeyDown(UINT key, LPARAM lParam) {
     case VK_RETURN: {
         // Auto-repeat (bit 30: the key was already down) presses nothing more.
         if (AtChevron(record)) {
-            if (!(lParam & (1 << 30)) && !keyFocus.pressedId) ShowChevronMenu(record->paneWindow);
+            if (!(lParam & (1 << 30)) && !keyFocus.pressedId) {
+                ShowChevronMenu(record->paneWindow);
+                AnnounceFocusAgain();
+            }
             break;
         }
         UINT id = 0;
@@ -350,7 +392,7 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
     if (!msg || !msg->hwnd || !CurrentClient()) return 0;
     if (IsMousePress(msg->message)) {
         // A mouse press anywhere gives the keyboard back, and goes on.
-        LeaveKeyboard(false);
+        LeaveKeyboard(Leave::Announce);
         return 0;
     }
     switch (msg->message) {
@@ -366,16 +408,19 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
     // Keys go to the window with the focus; they are the toolbars' only while
     // that is in the frame whose toolbars have the keyboard.
     HWND root = GetAncestor(msg->hwnd, GA_ROOT);
-    if (keyFocus.host && (root != keyFocus.host || !IsWindow(keyFocus.host))) LeaveKeyboard(false);
+    // (The focus went to another frame: the platform announced that.)
+    if (keyFocus.host && (root != keyFocus.host || !IsWindow(keyFocus.host))) LeaveKeyboard(Leave::Quietly);
     if (!keyFocus.host) {
         if (msg->message != WM_KEYDOWN || key != VK_F6 || GetKeyState(VK_CONTROL) < 0) return 0;
         return EnterKeyboard(root) ? 1 : 0;
     }
     switch (msg->message) {
     case WM_KEYDOWN:
+        if (!IsToolbarKey(key)) return 0;
         OnKeyDown(key, msg->lParam);
         return 1;
     case WM_KEYUP:
+        if (!IsToolbarKey(key)) return 0;
         OnKeyUp(key);
         return 1;
     case WM_SYSKEYDOWN:
@@ -385,7 +430,7 @@ extern "C" UINT QBR_TranslateToolbarKey(MSG *msg) {
             OnKeyDown(key, msg->lParam);
             return 1;
         }
-        if (key != VK_SHIFT) LeaveKeyboard(false);
+        if (key != VK_SHIFT) LeaveKeyboard(Leave::Announce);
         return 0;
     case WM_SYSKEYUP:
         // The release of Shift+F10 would open the frame's menu bar.
@@ -407,10 +452,10 @@ UINT AccessFocusedIndex(HWND window, UINT *index) {
     return 1;
 }
 
-void AccessLeaveKeyboard() { LeaveKeyboard(false); }
+void AccessLeaveKeyboard() { LeaveKeyboard(Leave::Announce); }
 
 void AccessWindowActivating(HWND window) {
-    if (keyFocus.host && window != keyFocus.host) LeaveKeyboard(false);
+    if (keyFocus.host && window != keyFocus.host) LeaveKeyboard(Leave::Quietly);
 }
 
 void AccessForgetToolbar(const ToolbarRecord *record) {
@@ -419,7 +464,7 @@ void AccessForgetToolbar(const ToolbarRecord *record) {
     // the keyboard goes back to the host rather than look for another.
     keyFocus.pressedId = 0;
     keyFocus.pane = nullptr;
-    LeaveKeyboard(false);
+    LeaveKeyboard(Leave::Announce);
 }
 
 // A toolbar hidden by its menu or its close box hands the focus on.

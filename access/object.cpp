@@ -14,7 +14,7 @@
 
 #include "access/access.h"
 #include "core/core.h"
-#include "input/input.h"
+#include "command/command.h"
 #include "toolbar/toolbar.h"
 
 namespace {
@@ -24,6 +24,7 @@ constexpr UINT kActionPressText = 5109;
 constexpr UINT kActionCheckText = 5110;
 constexpr UINT kActionUncheckText = 5111;
 constexpr UINT kChevronText = 5113; // "More buttons"
+constexpr UINT kActionOpenText = 5114;
 
 // Help texts and titles are read into buffers of this size.
 constexpr int kTextBuffer = 256;
@@ -64,6 +65,8 @@ bool IsButton(const ToolbarItem *item) {
 const ButtonData *DataOf(const ToolbarItem *item) {
     return IsButton(item) ? static_cast<const ButtonData *>(ItemGetData(item)) : nullptr;
 }
+
+bool IsRadioOn(const ButtonData *data) { return ButtonIsRadio(data) && ButtonGetState(data) == 1; }
 
 void SetChild(VARIANT *out, LONG child) {
     out->vt = VT_I4;
@@ -176,9 +179,11 @@ class ToolbarAccessible final : public IAccessible {
     }
     HRESULT STDMETHODCALLTYPE get_accDefaultAction(VARIANT child, BSTR *action) override {
         return Property(child, action, [](const ToolbarRecord *record, LONG id, BSTR *out) {
-            if (IsChevron(record, id)) return TextResult(LoadLibraryText(kActionPressText), out);
+            // A button that opens a menu opens it, as the platform's own do.
+            if (IsChevron(record, id)) return TextResult(LoadLibraryText(kActionOpenText), out);
             const ButtonData *data = DataOf(ItemOf(record, id));
-            if (!data) return S_FALSE;
+            // The radio button that is on has nothing left to do.
+            if (!data || IsRadioOn(data)) return S_FALSE;
             UINT text = kActionPressText;
             if (ButtonGetBehaviour(data) & BTN_CHECK)
                 text = ButtonGetState(data) == 1 ? kActionUncheckText : kActionCheckText;
@@ -304,7 +309,8 @@ class ToolbarAccessible final : public IAccessible {
                                                                                                           : E_FAIL;
         ToolbarItem *item = ItemOf(record, id);
         const ButtonData *data = DataOf(item);
-        if (!data) return DISP_E_MEMBERNOTFOUND; // the toolbar and its separators have no action
+        // The toolbar, its separators and the radio button that is on have no action.
+        if (!data || IsRadioOn(data)) return DISP_E_MEMBERNOTFOUND;
         if (!ButtonIsEnabled(data)) return E_FAIL;
         // Posted: the host's command may open a modal dialog, and the reader's
         // call must not wait for it to close.
@@ -363,6 +369,7 @@ class ToolbarAccessible final : public IAccessible {
         if (IsChevron(record, id)) return ROLE_SYSTEM_BUTTONMENU;
         const ButtonData *data = DataOf(ItemOf(record, id));
         if (!data) return ROLE_SYSTEM_SEPARATOR;
+        if (ButtonIsRadio(data)) return ROLE_SYSTEM_RADIOBUTTON;
         return (ButtonGetBehaviour(data) & BTN_CHECK) ? ROLE_SYSTEM_CHECKBUTTON : ROLE_SYSTEM_PUSHBUTTON;
     }
 
@@ -406,11 +413,6 @@ UINT ItemScreenRect(const ToolbarRecord *record, UINT index, RECT *rect) {
     return 1;
 }
 
-bool IsEnabledButton(const ToolbarRecord *record, UINT index) {
-    const ButtonData *data = DataOf(ItemAt(record, index));
-    return data && ButtonIsEnabled(data);
-}
-
 void NotifyItemEvent(DWORD event, const ToolbarRecord *record, UINT index) {
     if (HWND window = ItemsWindow(record)) NotifyWinEvent(event, window, OBJID_CLIENT, static_cast<LONG>(index + 1));
 }
@@ -437,6 +439,11 @@ LRESULT AccessGetObject(HWND window, WPARAM wParam, LPARAM lParam) {
 
 void AccessItemChanged(const ToolbarRecord *record, UINT index) {
     NotifyItemEvent(EVENT_OBJECT_STATECHANGE, record, index);
+}
+
+void AccessItemsEdited(const ToolbarRecord *record, DWORD event, UINT index) {
+    NotifyItemEvent(event, record, index);
+    if (HWND window = ItemsWindow(record)) NotifyWinEvent(EVENT_OBJECT_REORDER, window, OBJID_CLIENT, CHILDID_SELF);
 }
 
 // ShowWindow sends WM_SHOWWINDOW, and then WM_WINDOWPOSCHANGED only when the

@@ -879,11 +879,43 @@ void BenchGrowth() {
     fflush(stdout);
 }
 
+// The keyboard on one toolbar of 500 buttons in the top dock, cut off at the
+// frame's edge, so that every step asks which buttons the chevron hides.
+// Right moves to the next button; Down looks for a row below, which a
+// single row has not, and so reads every item.
+UINT KeyTo(HWND window, UINT key) {
+    MSG down = {window, WM_KEYDOWN, key, 1, 0, {0, 0}};
+    MSG up = {window, WM_KEYUP, key, static_cast<LPARAM>(0xC0000001u), 0, {0, 0}};
+    const UINT used = QBR_TranslateToolbarKey(&down);
+    QBR_TranslateToolbarKey(&up);
+    return used;
+}
+
+void BenchKeys() {
+    constexpr UINT kItems = 500;
+    Scene s = MakeScene(1, kItems, false);
+    RECT usable;
+    GetClientRect(s.frame, &usable);
+    QBR_SetUsableArea(s.manager, &usable);
+    QBR_SetQuickHelp(0);
+    Pump();
+    Header("The keyboard on a cut-off toolbar of 500 buttons");
+    if (!KeyTo(s.frame, VK_F6)) {
+        printf("| (F6 found no button) |\n");
+    } else {
+        Row("keyboard step: Right, 500 buttons, cut off", Measure([&] { KeyTo(s.frame, VK_RIGHT); }, 100000));
+        Row("keyboard step: Down (no row below), 500 buttons", Measure([&] { KeyTo(s.frame, VK_DOWN); }, 100000));
+        KeyTo(s.frame, VK_ESCAPE);
+    }
+    QBR_SetQuickHelp(1);
+    DestroyScene(s);
+}
+
 } // namespace
 
 int main(int argc, char **argv) {
     bool quick = false;
-    std::string only; // a section name: state, text, drop, layout, growth, close, profile
+    std::string only; // a section name: state, text, drop, layout, growth, keys, close, profile
     for (int i = 1; i < argc; ++i) {
         if (lstrcmpA(argv[i], "--quick") == 0)
             quick = true;
@@ -921,6 +953,7 @@ int main(int argc, char **argv) {
     if (wanted("drop")) BenchDrop();
     if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 200} : std::vector<UINT>{4, 200, 1000});
     if (wanted("growth")) BenchGrowth();
+    if (wanted("keys")) BenchKeys();
     if (wanted("close")) BenchDestroyAndLongLines();
     if (wanted("profile")) {
         ProfileApply(200);

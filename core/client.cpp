@@ -1,10 +1,10 @@
 // The client registry and the global settings of a client.
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "paint/paint.h"
-#include "quickhelp/quickhelp.h"
-#include "toolbar/toolbar.h"
+#include "core/gdi.h"
 
 HINSTANCE moduleInstance = nullptr; // declared extern "C" in quaybar.h
+RoomCallbacks roomCallbacks = {};
 
 PointerList *clientTable = nullptr;
 UINT clientCount = 0;
@@ -97,86 +97,6 @@ UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight) 
     return 1;
 }
 
-// ---- Display scale -----------------------------------------------------------
-
-namespace {
-
-using GetDpiForWindowProc = UINT(WINAPI *)(HWND);
-
-// GetDpiForWindow came with Windows 10 version 1607. It is looked up by name,
-// once, so that the library still loads on older systems, where every window
-// has the screen's one scale.
-GetDpiForWindowProc DpiForWindowCall() {
-    static bool looked = false;
-    static GetDpiForWindowProc call = nullptr;
-    if (!looked) {
-        looked = true;
-        if (HMODULE user = GetModuleHandleA("user32.dll")) {
-            // Through a plain function pointer type first: FARPROC and the
-            // real signature are unrelated function types.
-            auto found = reinterpret_cast<void (*)()>(GetProcAddress(user, "GetDpiForWindow"));
-            call = reinterpret_cast<GetDpiForWindowProc>(found);
-        }
-    }
-    return call;
-}
-
-} // namespace
-
-UINT WindowDpi(HWND window) {
-    if (GetDpiForWindowProc call = DpiForWindowCall()) {
-        UINT dpi = window ? call(window) : 0;
-        if (dpi) return dpi;
-    }
-    HDC screen = GetDC(nullptr);
-    int dpi = screen ? GetDeviceCaps(screen, LOGPIXELSY) : 0;
-    if (screen) ReleaseDC(nullptr, screen);
-    // A screen that cannot be asked is taken at 100 %.
-    return dpi > 0 ? static_cast<UINT>(dpi) : kBaseDpi;
-}
-
-UINT ManagerDpi(const ToolbarManager *manager) { return manager && manager->dpi ? manager->dpi : kBaseDpi; }
-
-int ScaleToDpi(int value, UINT dpi) {
-    return dpi == kBaseDpi || dpi == 0 ? value : MulDiv(value, static_cast<int>(dpi), kBaseDpi);
-}
-
-UINT GetButtonSizesAt(UINT dpi, int *width, int *height, int *imageWidth, int *imageHeight) {
-    int sizes[4] = {0, 0, 0, 0};
-    if (!GetButtonSizes(&sizes[0], &sizes[1], &sizes[2], &sizes[3])) return 0;
-    int *outs[4] = {width, height, imageWidth, imageHeight};
-    for (int i = 0; i < 4; ++i)
-        if (outs[i]) *outs[i] = ScaleToDpi(sizes[i], dpi);
-    return 1;
-}
-
-extern "C" UINT QBR_Initialize(HINSTANCE instance, HelpTextProc helpTextProc) {
-    ToolbarClient *client = RegisterClient(instance, helpTextProc);
-    if (!client) return 0;
-    client->managers = PointerListCreate(1, 1, 0);
-    if (!client->managers) return 0;
-    QBR_SetButtonMetrics(0, 0, 0, 0, 0, 0);
-    // The shared drawing objects are made for the first client only; each
-    // start returns at once for a later one.
-    PaintResourcesStart();
-    CaptionFontStart();
-    QuickHelpStart();
-    return 1;
-}
-
-extern "C" void QBR_Terminate(void) {
-    ToolbarClient *client = CurrentClient();
-    if (!client) return;
-    // The ends run while this client still counts, each acting only for the
-    // last client. Same order as the starts.
-    PaintResourcesEnd();
-    CaptionFontEnd();
-    QuickHelpEnd();
-    PointerListDestroy(client->managers);
-    client->managers = nullptr;
-    UnregisterClient(client);
-}
-
 extern "C" void QBR_SetNotifyMessages(UINT pressMessage, UINT releaseMessage) {
     ToolbarClient *client = CurrentClient();
     if (!client) return;
@@ -193,6 +113,7 @@ extern "C" void QBR_SetButtonMetrics(int buttonWidth, int buttonHeight, int imag
                       &client->imageHeight, &client->textButtonWidth, &client->textButtonHeight};
     for (int i = 0; i < 6; ++i)
         *fields[i] = given[i] ? given[i] : kDefaultMetrics[i];
+    ButtonMetricsChanged();
 }
 
 extern "C" void QBR_SetQuickHelp(UINT on) {
@@ -211,19 +132,6 @@ extern "C" void QBR_SetCustomize(UINT on) {
 extern "C" UINT QBR_GetCustomize(void) {
     ToolbarClient *client = CurrentClient();
     return client ? client->customize : 0;
-}
-
-extern "C" void QBR_SetButtonText(UINT on) {
-    ToolbarClient *client = CurrentClient();
-    if (!client) return;
-    int width = on ? client->textButtonWidth : client->buttonWidth;
-    int height = on ? client->textButtonHeight : client->buttonHeight;
-    // The rows are taken from the row-break lists that the old size made, so
-    // the rewrap runs before the switch and the relayout after it. There is
-    // no early return for an unchanged value: the walk always runs.
-    RewrapAllManagers(width, height);
-    client->buttonText = on;
-    RelayoutAllManagers();
 }
 
 extern "C" UINT QBR_GetButtonText(void) {

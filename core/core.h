@@ -77,16 +77,7 @@ UINT GetButtonMetrics(int *buttonWidth, int *buttonHeight, int *imageWidth, int 
 UINT GetButtonSizes(int *width, int *height, int *imageWidth, int *imageHeight);
 
 // ---- Display scale -----------------------------------------------------------
-// Every size in pixels that the library and its host name (button metrics,
-// margins, separators) is a size at 96 DPI, 100 %. Each frame's manager keeps
-// the DPI of its frame, and sizes are made for it where they are made:
-// ScaleToDpi(value, dpi) is MulDiv(value, dpi, 96), rounded.
-constexpr UINT kBaseDpi = 96;
-UINT WindowDpi(HWND window);
-UINT ManagerDpi(const ToolbarManager *manager);
-int ScaleToDpi(int value, UINT dpi);
-// GetButtonSizes at a DPI: the client's metrics scaled.
-UINT GetButtonSizesAt(UINT dpi, int *width, int *height, int *imageWidth, int *imageHeight);
+#include "core/metrics.h"
 
 // ---- Manager and catalog --------------------------------------------------
 UINT AddButtonItem(ToolbarManager *manager, UINT id, UINT imageIndex);
@@ -101,8 +92,8 @@ UINT ItemGetKind(const ToolbarItem *item, UINT *out);
 UINT ItemSetCategory(ToolbarItem *item, UINT category);
 void *ItemGetData(const ToolbarItem *item);
 UINT ItemGetSize(const ToolbarItem *item, int *width, int *height);
-// The size of an item at a DPI (ItemGetSize gives it at 96).
-UINT ItemGetSizeAt(const ToolbarItem *item, UINT dpi, int *width, int *height);
+// The size of an item at a frame's scale (ItemGetSize gives it at 96).
+UINT ItemGetSizeAt(const ToolbarItem *item, const ScaledMetrics &metrics, int *width, int *height);
 
 UINT ButtonGetImageIndex(const ButtonData *data, UINT *out);
 UINT ButtonSetImageIndex(ButtonData *data, UINT value);
@@ -114,13 +105,42 @@ UINT ButtonIsEnabled(const ButtonData *data);
 UINT ButtonSetEnabled(ButtonData *data, UINT enabled);
 UINT ButtonIsPressed(const ButtonData *data);
 UINT ButtonSetPressed(ButtonData *data, UINT pressed);
+// Whether QBR_SetRadioRange made the button one of a radio group.
+UINT ButtonIsRadio(const ButtonData *data);
+void ButtonSetRadio(ButtonData *data);
 
-void RepaintItem(ToolbarManager *manager, ToolbarItem *item);
 int RequestHelpText(UINT id, UINT kind, LPSTR buffer, int size);
 LPCSTR LoadLibraryText(UINT id);
 
 // The buffer size every caller of RequestHelpText passes.
 constexpr int kHelpTextSize = 254;
+
+// ---- Dock records -------------------------------------------------------------
+// A dock window keeps one word, its manager; the manager lists its DockAreas.
+extern const char kDockClassName[]; // "QBR_DockWindow"
+constexpr int kDockManagerWord = 0;
+// The manager named by a dock window's word; null for any other window.
+ToolbarManager *DockManager(HWND window);
+DockArea *FindDockRecord(HWND window);
+HWND DockWindowForSide(ToolbarManager *manager, UINT side);
+UINT GetDockSide(HWND window, UINT *side);
+// The top and bottom docks lay their rows across the frame; the side docks
+// lay theirs as columns.
+bool IsAcrossDock(UINT side);
+
+// While one lives, PackDock does nothing: a whole arrangement being rebuilt
+// packs each dock once at its end, not once for every toolbar it receives
+// (which with many toolbars costs minutes).
+class DeferDockPacking {
+  public:
+    DeferDockPacking();
+    ~DeferDockPacking();
+    DeferDockPacking(const DeferDockPacking &) = delete;
+    DeferDockPacking &operator=(const DeferDockPacking &) = delete;
+    // Whether one lives now: a docked pane refitted meanwhile is painted by
+    // the packing that follows, not once more on its own.
+    static bool Active();
+};
 
 // ---- Counters that leak tests read -----------------------------------------
 // Live memory blocks and live GDI objects (fonts, brushes, bitmaps, DCs) that

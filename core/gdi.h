@@ -110,3 +110,48 @@ class SolidBrush {
   private:
     HBRUSH brush_;
 };
+
+// A text background mode (SetBkMode) for the life of the scope.
+class BkModeScope {
+  public:
+    BkModeScope(HDC dc, int mode) : dc_(dc), old_(SetBkMode(dc, mode)) {}
+    ~BkModeScope() {
+        if (old_) SetBkMode(dc_, old_);
+    }
+    BkModeScope(const BkModeScope &) = delete;
+    BkModeScope &operator=(const BkModeScope &) = delete;
+
+  private:
+    HDC dc_;
+    int old_;
+};
+
+// A text colour (SetTextColor) for the life of the scope.
+class TextColorScope {
+  public:
+    TextColorScope(HDC dc, COLORREF color) : dc_(dc), old_(SetTextColor(dc, color)) {}
+    ~TextColorScope() {
+        if (old_ != CLR_INVALID) SetTextColor(dc_, old_);
+    }
+    TextColorScope(const TextColorScope &) = delete;
+    TextColorScope &operator=(const TextColorScope &) = delete;
+
+  private:
+    HDC dc_;
+    COLORREF old_;
+};
+
+// A background colour (SetBkColor) for the life of the scope.
+class BkColorScope {
+  public:
+    BkColorScope(HDC dc, COLORREF color) : dc_(dc), old_(SetBkColor(dc, color)) {}
+    ~BkColorScope() {
+        if (old_ != CLR_INVALID) SetBkColor(dc_, old_);
+    }
+    BkColorScope(const BkColorScope &) = delete;
+    BkColorScope &operator=(const BkColorScope &) = delete;
+
+  private:
+    HDC dc_;
+    COLORREF old_;
+};

@@ -5,6 +5,8 @@
 
 extern ToolbarManager *insertManager;
 
+// The Insert Toolbar Item dialog for a manager, modal over `owner`.
+void ShowInsertDialog(HWND owner, ToolbarManager *manager);
 INT_PTR CALLBACK InsertDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam);
 LRESULT CALLBACK InsertListProc(HWND list, UINT message, WPARAM wParam, LPARAM lParam);
 void FillCategoryCombo(HWND dialog);

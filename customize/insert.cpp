@@ -1,10 +1,10 @@
 // The Insert Toolbar Item dialog: a category box, a list that shows the
 // catalog's buttons as pictures, and a description. The user drags a picture
 // out of the list and drops it on any toolbar of the frame.
+#include "access/access.h"
 #include "core/core.h"
 #include "core/gdi.h"
 #include "customize/customize.h"
-#include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -21,17 +21,6 @@ constexpr int kDescription = 5005;
 constexpr int kNewButton = 5007;
 
 constexpr UINT kAllItemsText = 5105;
-
-// A list line is the button picture with 3 pixels all round:
-//
-//   +-------- line ---------+
-//   |          3            |
-//   |   +-- button --+      |
-//   |   |  w x h     |      |
-//   |   +------------+      |
-//   |          3            |
-//   +-----------------------+
-constexpr int kLineMargin = 3;
 
 // One modal dialog runs at a time, so its state is process-wide.
 HFONT insertFont = nullptr;
@@ -66,8 +55,9 @@ void OnInitDialog(HWND dialog) {
 void OnMeasureItem(MEASUREITEMSTRUCT *measure) {
     if (measure->CtlID != kItemList) return;
     int width, height;
-    if (!ItemGetSizeAt(reinterpret_cast<ToolbarItem *>(measure->itemData), ManagerDpi(insertManager), &width, &height)) return;
-    const int margin = ScaleToDpi(kLineMargin, ManagerDpi(insertManager));
+    if (!ItemGetSizeAt(reinterpret_cast<ToolbarItem *>(measure->itemData), ManagerMetrics(insertManager), &width,
+                       &height)) return;
+    const int margin = ManagerMetrics(insertManager).lineMargin;
     measure->itemHeight = static_cast<UINT>(height + 2 * margin);
     measure->itemWidth = static_cast<UINT>(width + 2 * margin);
 }
@@ -82,23 +72,23 @@ void OnDrawItem(const DRAWITEMSTRUCT *draw) {
 
     const bool selected = (draw->itemState & ODS_SELECTED) != 0;
     COLORREF back = GetSysColor(selected ? COLOR_HIGHLIGHT : COLOR_WINDOW);
-    COLORREF oldBack = SetBkColor(dc, back);
-    SetTextColor(dc, GetSysColor(selected ? COLOR_HIGHLIGHTTEXT : COLOR_WINDOWTEXT));
+    // The label of a button in text mode takes the line's text colour.
+    TextColorScope text(dc, GetSysColor(selected ? COLOR_HIGHLIGHTTEXT : COLOR_WINDOWTEXT));
     {
+        BkColorScope background(dc, back);
         SolidBrush brush(back);
         SelectScope select(dc, brush);
         PatBlt(dc, line.left, line.top, line.right - line.left, line.bottom - line.top, PATCOPY);
     }
-    SetBkColor(dc, oldBack);
 
     auto *item = reinterpret_cast<ToolbarItem *>(draw->itemData);
     int width, height;
     UINT kind;
-    if (!ItemGetSizeAt(item, ManagerDpi(insertManager), &width, &height) || !ItemGetKind(item, &kind)) return;
+    if (!ItemGetSizeAt(item, ManagerMetrics(insertManager), &width, &height) || !ItemGetKind(item, &kind)) return;
     if (kind == ITEM_BUTTON) {
         RECT button;
         button.left = (line.right - width + line.left) >> 1; // centred across the line
-        button.top = line.top + ScaleToDpi(kLineMargin, ManagerDpi(insertManager));
+        button.top = line.top + ManagerMetrics(insertManager).lineMargin;
         button.right = button.left + width;
         button.bottom = button.top + height;
         if (!BeginButtonPaint(insertManager, dc)) return;
@@ -148,7 +138,7 @@ LRESULT OnListPress(HWND list, UINT message, WPARAM wParam, LPARAM lParam) {
     if (line == LB_ERR) return 0;
     insertDragItem = reinterpret_cast<ToolbarItem *>(SendMessageA(list, LB_GETITEMDATA, line, 0));
     int width, height;
-    if (!ItemGetSizeAt(insertDragItem, ManagerDpi(insertManager), &width, &height)) return 0;
+    if (!ItemGetSizeAt(insertDragItem, ManagerMetrics(insertManager), &width, &height)) return 0;
 
     SendMessageA(list, LB_GETITEMRECT, line, reinterpret_cast<LPARAM>(&insertDragFrame));
     ClientRectToScreen(list, &insertDragFrame);
@@ -198,7 +188,9 @@ void OnListRelease() {
     UINT index = 0;
     if (!InsertionIndexAtPoint(record, p.x, p.y, &index)) return;
     if (record->flags & TBF_LOCKED_ITEMS) return;
-    InsertItemAt(record, index, insertDragItem);
+    UINT placed = 0;
+    if (InsertItemAt(record, index, insertDragItem) && IndexOfItem(record, insertDragItem, &placed))
+        AccessItemsEdited(record, EVENT_OBJECT_CREATE, placed);
 }
 
 } // namespace
@@ -302,4 +294,8 @@ LRESULT CALLBACK InsertListProc(HWND list, UINT message, WPARAM wParam, LPARAM l
         break;
     }
     return PassOn(list, message, wParam, lParam);
+}
+
+void ShowInsertDialog(HWND owner, ToolbarManager *manager) {
+    DialogBoxParamA(moduleInstance, "QBR_Insert", owner, InsertDialogProc, reinterpret_cast<LPARAM>(manager));
 }

@@ -29,6 +29,24 @@ constexpr int kExtraHeight = 12;
 
 HFONT statusBarFont = nullptr;
 
+// The screen's device context with a font selected, for the life of the
+// scope; the old font goes back and the context is released on every path.
+class ScreenFontDC {
+  public:
+    explicit ScreenFontDC(HFONT font) : dc_(GetDC(nullptr)), old_(dc_ && font ? SelectObject(dc_, font) : nullptr) {}
+    ~ScreenFontDC() {
+        if (old_) SelectObject(dc_, old_);
+        if (dc_) ReleaseDC(nullptr, dc_);
+    }
+    ScreenFontDC(const ScreenFontDC &) = delete;
+    ScreenFontDC &operator=(const ScreenFontDC &) = delete;
+    operator HDC() const { return dc_; }
+
+  private:
+    HDC dc_;
+    HGDIOBJ old_;
+};
+
 char *BufferOf(HWND window) { return reinterpret_cast<char *>(GetWindowLongPtrA(window, 0)); }
 
 // ExtTextOut with ETO_OPAQUE and no text is the cheapest solid fill there is:
@@ -122,12 +140,11 @@ void DeleteStatusBarFont() {
 }
 
 HWND CreateStatusBar(HWND parent) {
-    HDC screen = GetDC(nullptr);
-    HGDIOBJ oldFont = SelectObject(screen, statusBarFont);
     TEXTMETRICA metrics = {};
-    GetTextMetricsA(screen, &metrics);
-    SelectObject(screen, oldFont);
-    ReleaseDC(nullptr, screen);
+    {
+        ScreenFontDC screen(statusBarFont);
+        GetTextMetricsA(screen, &metrics);
+    }
     const int height = metrics.tmHeight - metrics.tmInternalLeading + kExtraHeight;
     return CreateWindowExA(0, kClassName, "", WS_CHILD | WS_VISIBLE, 0, 0, 0, height, parent, nullptr, moduleInstance,
                            nullptr);
@@ -154,6 +171,11 @@ LRESULT CALLBACK StatusBarProc(HWND window, UINT message, WPARAM wParam, LPARAM 
         return OnDestroy(window);
     case WM_PAINT:
         return OnPaint(window);
+    case WM_SIZE:
+        // The panel's right and bottom edges follow the size: a new size is
+        // painted whole, or the old edges would stay where they were drawn.
+        InvalidateRect(window, nullptr, TRUE);
+        return 0;
     case WM_GETTEXT:
         return OnGetText(window, wParam, lParam);
     case WM_GETTEXTLENGTH:

@@ -61,7 +61,8 @@ void SetBehaviours(ToolbarManager *manager, UINT first, UINT last, UINT behaviou
         QBR_SetButtonBehaviour(manager, id, behaviour);
 }
 
-// A stored arrangement, or else a top dock with the default toolbars.
+// A stored arrangement, which makes its own docks, or else a top dock with
+// the default toolbars: never both, or two docks would stand on one side.
 template <size_t N>
 ToolbarManager *RestoreOrDefault(ToolbarManager *manager, HWND frame, LPCSTR section,
                                  const DefaultToolbar (&toolbars)[N]) {

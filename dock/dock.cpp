@@ -4,24 +4,11 @@
 // WM_SIZE (both parameters 0) whenever its place, size or visibility changed.
 #include "dock/dock.h"
 
+#include "core/callbacks.h"
 #include "core/core.h"
 #include "core/gdi.h"
-#include "input/input.h"
 #include "toolbar/toolbar.h"
 
-const char kDockClassName[] = "QBR_DockWindow";
-
-// The dock window keeps one word: its ToolbarManager pointer.
-constexpr int kDockManagerWord = 0;
-
-static ToolbarManager *DockManager(HWND window) {
-    if (!window) return nullptr;
-    // Only a dock window's word 0 is a manager pointer; another class's word
-    // 0 may hold anything.
-    char name[32];
-    if (!GetClassNameA(window, name, sizeof name) || !StringsEqual(name, kDockClassName)) return nullptr;
-    return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(window, kDockManagerWord));
-}
 
 static UINT RegisterDockClass(HINSTANCE instance) {
     WNDCLASSA existing;
@@ -41,7 +28,9 @@ static UINT RegisterDockClass(HINSTANCE instance) {
 // ---- Public functions -----------------------------------------------------------
 
 extern "C" HWND QBR_CreateDock(ToolbarManager *manager, HWND frame, UINT side) {
-    if (!manager || !frame) return nullptr;
+    // A side outside the four would make a dock that no packing, keyboard
+    // walk or stored arrangement knows.
+    if (!manager || !frame || side > DOCK_BOTTOM) return nullptr;
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
     if (!RegisterDockClass(instance)) return nullptr;
     // Not WS_VISIBLE: PlaceDock alone decides whether a dock shows.
@@ -71,6 +60,36 @@ extern "C" void QBR_DestroyDock(HWND window) {
     if (dock && PointerListCount(dock->toolbars)) return;
     FreeDockRecord(dock);
     DestroyWindow(window);
+}
+
+extern "C" HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock,
+                                  const UINT *ids, UINT idCount) {
+    DockArea *dockRecord = FindDockRecord(dock);
+    if (!dockRecord) return nullptr;
+    HWND pane = CreateToolbarWindows(dock, name ? name : "");
+    if (!pane) return nullptr;
+    ToolbarManager *manager = ManagerOfToolbar(pane);
+    ToolbarRecord *record = manager ? FindToolbarRecord(manager->toolbars, pane) : nullptr;
+    if (!record) return nullptr;
+    // From here on the record says floating or docked, before any window shows.
+    record->flags = flags;
+    SetToolbarItems(record, ids, idCount);
+    if (!InsertToolbarBefore(dockRecord, nullptr, record)) return nullptr;
+    // x, y, width and height are always the floating frame's, in screen
+    // coordinates; the pane's place is the dock's business. A width is a
+    // wrapping width: the refit below sets the height the rows need.
+    // The wrapping width and height are 96-DPI sizes, as the host's button
+    // metrics are: the same call gives the same rows at every scale.
+    width = ManagerMetrics(manager).Scaled(width);
+    height = ManagerMetrics(manager).Scaled(height);
+    RECT present;
+    GetToolbarWindowRect(pane, ROLE_FLOATING, &present);
+    RECT target = {x, y, width >= 1 ? x + width : x + (present.right - present.left),
+                   height >= 1 ? y + height : y + (present.bottom - present.top)};
+    MoveToolbarWindow(pane, ROLE_FLOATING, &target);
+    RefitToolbar(pane, ROLE_FLOATING);
+    ApplyToolbarFlags(record, flags);
+    return pane;
 }
 
 // ---- Records ----------------------------------------------------------------------
@@ -116,13 +135,6 @@ void FreeDockRecord(DockArea *dock) {
     MemoryBlockFree(dock);
 }
 
-DockArea *FindDockRecord(HWND window) {
-    ToolbarManager *manager = DockManager(window);
-    if (!manager) return nullptr;
-    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i)
-        if (dock->window == window) return dock;
-    return nullptr;
-}
 
 HWND DockWindowFromPoint(ToolbarManager *manager, int x, int y) {
     if (!manager) return nullptr;
@@ -135,21 +147,7 @@ HWND DockWindowFromPoint(ToolbarManager *manager, int x, int y) {
     return nullptr;
 }
 
-HWND DockWindowForSide(ToolbarManager *manager, UINT side) {
-    if (!manager) return nullptr;
-    for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i)
-        if (dock->side == side) return dock->window;
-    return nullptr;
-}
 
-UINT GetDockSide(HWND window, UINT *side) {
-    DockArea *dock = FindDockRecord(window);
-    if (!dock) return 0;
-    if (side) *side = dock->side;
-    return 1;
-}
-
-bool IsAcrossDock(UINT side) { return side == DOCK_TOP || side == DOCK_BOTTOM; }
 
 // A toolbar that takes part in packing: docked, visible and with a pane.
 static bool IsPacked(const ToolbarRecord *toolbar) {
@@ -202,6 +200,12 @@ UINT RemoveToolbarFromDock(DockArea *dock, ToolbarRecord *toolbar) {
     return RelayoutDock(dock->window);
 }
 
+// A toolbar record about to be freed leaves its dock's list, and the dock
+// packs again.
+void ToolbarLeavesDock(ToolbarRecord *record) {
+    if (DockArea *dock = FindDockRecord(record->dockWindow)) RemoveToolbarFromDock(dock, record);
+}
+
 // ---- Packing and placing -------------------------------------------------------------
 
 UINT RelayoutDock(HWND window) {
@@ -223,14 +227,10 @@ UINT RelayoutDock(HWND window) {
 //
 // The first pane sits one pixel above and left of the dock so that its own
 // top and left border lines fall outside the dock window.
-static UINT packingDeferred = 0;
-DeferDockPacking::DeferDockPacking() { ++packingDeferred; }
-DeferDockPacking::~DeferDockPacking() { --packingDeferred; }
-bool DeferDockPacking::Active() { return packingDeferred != 0; }
 
 UINT PackDock(DockArea *dock) {
     if (!dock) return 0;
-    if (packingDeferred) return 1;
+    if (DeferDockPacking::Active()) return 1;
     RECT overall = {0, 0, 0, 0};
     RECT row = {-1, -1, 0, 0};
     // The full-screen width, not the frame's: a dock does not wrap because the
@@ -272,7 +272,7 @@ void PlaceDock(HWND window, RECT *rect) {
         // and its height still pushes the side docks down.
         show = SW_HIDE;
         int width = 0, height = 0;
-        GetButtonSizesAt(ManagerDpi(DockManager(window)), &width, &height, nullptr, nullptr);
+        if (CurrentClient()) ManagerMetrics(DockManager(window)).ButtonSize(&width, &height);
         rect->right = width;
         rect->bottom = height;
     }
@@ -437,7 +437,7 @@ static void OnDockRightDown(HWND window, LPARAM lParam) {
     if (!first || !first->paneWindow) return; // no toolbar: no menu to own
     POINT at = {LOWORD(lParam), HIWORD(lParam)};
     ClientToScreen(window, &at);
-    ShowToolbarMenu(first->paneWindow, at.x, at.y, nullptr);
+    if (roomCallbacks.showToolbarMenu) roomCallbacks.showToolbarMenu(first->paneWindow, at.x, at.y, nullptr);
 }
 
 LRESULT CALLBACK DockWindowProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {

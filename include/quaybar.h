@@ -118,6 +118,8 @@ UINT QBR_AssignCategory(ToolbarManager *manager, UINT category, const UINT *ids,
 UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName);
 UINT QBR_SetButtonBehaviour(ToolbarManager *manager, UINT id, UINT behaviour);
 UINT QBR_SetButtonState(ToolbarManager *manager, UINT id, UINT state);
+/* Turns on `onId` and off the other buttons from `first` to `last`, and makes
+   them a radio group, which screen readers find as radio buttons. */
 UINT QBR_SetRadioRange(ToolbarManager *manager, UINT first, UINT last, UINT onId);
 UINT QBR_SetButtonEnabled(ToolbarManager *manager, UINT id, UINT enabled);
 UINT QBR_SetButtonPressed(ToolbarManager *manager, UINT id, UINT pressed);
@@ -162,7 +164,8 @@ UINT QBR_SetUsableArea(ToolbarManager *manager, const RECT *area);
    IsDialogMessage; 1 means the toolbars used it, and it must be neither
    translated nor dispatched. F6 moves the keyboard into the frame's
    toolbars, F6 or Esc gives it back; arrows, Home, End, Tab, Space, Enter,
-   Shift+F10 and the context-menu key work there. Toolbars never take the
+   Shift+F10 and the context-menu key work there; any other key gives 0 and
+   goes on to the host's loop (its accelerators, say). Toolbars never take the
    activation or the window focus for it. */
 UINT QBR_TranslateToolbarKey(MSG *msg);
 
@@ -179,6 +182,11 @@ void QBR_GetLiveCounts(LONG *memoryBlocks, LONG *gdiObjects);
 void QBR_FreeLayout(void);
 UINT QBR_BeginLayout(void);
 UINT QBR_AddLayoutEntry(LPCSTR key, LPCSTR value);
+/* Builds the arrangement in the table on `frame`: one new dock (QBR_CreateDock)
+   for every dock key the table holds, and that dock's toolbars. Apply it to a
+   frame without docks, instead of making them, and then make only the docks
+   it did not make (QBR_GetDock gives 0 for those); a dock made before would
+   stand beside the new one on its side. The table is used up: free it after. */
 UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame);
 
 #ifdef __cplusplus

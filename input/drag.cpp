@@ -54,8 +54,12 @@ static void DropIntoDock(HWND window, HWND pane, HWND target, int x, int y) {
     RemoveToolbarFromDock(source, record);
     // The removal closed a place ahead of the new one.
     if (source == destination && oldIndex < newIndex) --newIndex;
+    const UINT wasSideDocked = IsSideDocked(pane);
     SetParent(pane, target);
     SetToolbarDock(record, target);
+    // From a row to a column or back: the pane takes its new dock's shape
+    // before the dock packs it.
+    if (IsSideDocked(pane) != wasSideDocked) ShapePaneForDock(pane);
     InsertToolbarAt(destination, newIndex, record);
     RelayoutDock(target);
     if (sourceWindow != target) RelayoutDock(sourceWindow);

@@ -2,13 +2,10 @@
 // is moved inside its toolbar, moved or copied to another toolbar, or dropped
 // off every toolbar and so removed. Dropped on its own place with a small
 // sideways shift, it adds or removes a separator beside it instead.
+#include "access/access.h"
 #include "core/core.h"
 #include "input/input.h"
 #include "toolbar/toolbar.h"
-
-// The cursor has to travel more than this many pixels sideways before a drop
-// on the item's own place counts as a nudge.
-constexpr int kNudgeDeadZone = 2;
 
 static bool IsSeparatorKind(const ToolbarItem *item, bool *separator) {
     UINT kind;
@@ -60,17 +57,20 @@ static void NudgeSeparator(ToolbarManager *manager, ToolbarRecord *target, UINT 
     // dragFrame began as the item's rectangle and has moved with the cursor;
     // only the sideways part of the way counts.
     const int shift = mouseTrack.dragFrame.left - rect.left;
-    const int deadZone = ScaleToDpi(kNudgeDeadZone, ManagerDpi(manager));
+    const int deadZone = ManagerMetrics(manager).nudgeDeadZone;
+    // The separator's place in the list, before a removal or after an insertion.
     if (shift > deadZone) {
-        if (afterIsSeparator)
-            RemoveItemAfter(target, item);
-        else if (before && !beforeIsSeparator)
-            InsertItemBefore(target, item, separator);
+        if (afterIsSeparator) {
+            if (RemoveItemAfter(target, item)) AccessItemsEdited(target, EVENT_OBJECT_DESTROY, index + 1);
+        } else if (before && !beforeIsSeparator) {
+            if (InsertItemBefore(target, item, separator)) AccessItemsEdited(target, EVENT_OBJECT_CREATE, index);
+        }
     } else if (shift < -deadZone) {
-        if (beforeIsSeparator)
-            RemoveItemBefore(target, item);
-        else if (after && !afterIsSeparator)
-            InsertItemAfter(target, item, separator);
+        if (beforeIsSeparator) {
+            if (RemoveItemBefore(target, item)) AccessItemsEdited(target, EVENT_OBJECT_DESTROY, index - 1);
+        } else if (after && !afterIsSeparator) {
+            if (InsertItemAfter(target, item, separator)) AccessItemsEdited(target, EVENT_OBJECT_CREATE, index + 1);
+        }
     }
 }
 
@@ -118,10 +118,13 @@ void OnToolbarRightUp(HWND window, int x, int y, UINT) {
     const bool targetLocked = target && (targetFlags & TBF_LOCKED_ITEMS);
     // The removal is not undone when the insertion below refuses a button
     // that the target already has: the button has left the source all the same.
-    if (!sourceLocked && !targetLocked && !mouseTrack.dragCopy) RemoveItem(source, item);
+    if (!sourceLocked && !targetLocked && !mouseTrack.dragCopy && RemoveItem(source, item))
+        AccessItemsEdited(source, EVENT_OBJECT_DESTROY, sourceIndex);
     // The item stood ahead of its new place. The correction is one place,
     // whatever the separator clean-up of the removal took besides; the
     // insertion appends an index that has come to lie past the end.
     if (target == source && index > 0 && sourceIndex < index) --index;
-    if (target && !targetLocked) InsertItemAt(target, index, item);
+    UINT placed = 0;
+    if (target && !targetLocked && InsertItemAt(target, index, item) && IndexOfItem(target, item, &placed))
+        AccessItemsEdited(target, EVENT_OBJECT_CREATE, placed);
 }

@@ -15,24 +15,6 @@
 
 namespace {
 
-// ---- Messages to the host ---------------------------------------------------
-// The two notifications have the wParam shapes of WM_MENUSELECT (item and
-// flags 0 while highlighted, flags 0xFFFF when closed), so that a host can
-// drive one help line from its menus and its buttons alike.
-
-void Notify(HWND window, UINT message, WPARAM wParam) {
-    ToolbarManager *manager = ManagerOfToolbar(window);
-    if (message && manager) SendMessageA(manager->frame, message, wParam, 0);
-}
-
-void NotifyPress(HWND window, UINT id) {
-    if (ToolbarClient *client = CurrentClient()) Notify(window, client->pressMessage, MAKEWPARAM(LOWORD(id), 0));
-}
-
-void NotifyRelease(HWND window, UINT id) {
-    if (ToolbarClient *client = CurrentClient()) Notify(window, client->releaseMessage, MAKEWPARAM(LOWORD(id), 0xFFFF));
-}
-
 // ---- Close box ----------------------------------------------------------------
 // The close box has no capture: its release can be missed, and until the next
 // left release on any toolbar window its tracking runs wherever the mouse is.
@@ -121,43 +103,6 @@ void TrackButtonPress(HWND window, int x, int y) {
     if (on != (ButtonIsPressed(data) != 0)) ShowPressedLook(window, data, on ? 1 : 0);
 }
 
-// What a completed press does to the button. A behaviour with neither
-// BTN_CHECK nor BTN_PUSH latches: BS_PRESSED stays until the host clears it.
-void ApplyBehaviour(ToolbarManager *manager, ButtonData *data, UINT id) {
-    const UINT behaviour = ButtonGetBehaviour(data);
-    if (behaviour & BTN_CHECK) {
-        // Cleared quietly: the state change right after repaints anyway.
-        ButtonSetPressed(data, 0);
-        // States are 0 off, 1 on, 2 mixed: on goes off, off and mixed go on.
-        QBR_SetButtonState(manager, id, ButtonGetState(data) == 1 ? 0 : 1);
-    } else if (behaviour & BTN_PUSH) {
-        QBR_SetButtonPressed(manager, id, 0);
-    }
-}
-
-// The end of a press of button `id`: a completed press applies the behaviour
-// and the host hears the release and the command; any other end only clears
-// the pressed look and tells of the release. A disabled button is never
-// applied.
-void FinishPress(HWND window, UINT id, bool completed) {
-    ToolbarManager *manager = ManagerOfToolbar(window);
-    if (!completed) {
-        QBR_SetButtonPressed(manager, id, 0);
-        NotifyRelease(window, id);
-        return;
-    }
-    ToolbarItem *item = manager ? ItemFindById(manager->items, id) : nullptr;
-    auto *data = static_cast<ButtonData *>(ItemGetData(item));
-    if (!data) return;
-    if (!ButtonIsEnabled(data)) {
-        NotifyRelease(window, id);
-        return;
-    }
-    ApplyBehaviour(manager, data, id);
-    NotifyRelease(window, id);
-    if (manager) SendMessageA(manager->frame, WM_COMMAND, id, 0);
-}
-
 void EndButtonPress(HWND window, int x, int y) {
     ReleaseCapture();
     mouseTrack.pressActive = 0;
@@ -165,18 +110,6 @@ void EndButtonPress(HWND window, int x, int y) {
 }
 
 } // namespace
-
-// ---- Presses without the mouse ------------------------------------------------------
-
-void StartKeyPress(HWND window, UINT id) {
-    ToolbarManager *manager = ManagerOfToolbar(window);
-    // As for the mouse: a disabled button never looks pressed, and the look
-    // is on the screen before the host hears of the press.
-    if (QBR_IsButtonEnabled(manager, id)) QBR_SetButtonPressed(manager, id, 1);
-    NotifyPress(window, id);
-}
-
-void FinishKeyPress(HWND window, UINT id, bool completed) { FinishPress(window, id, completed); }
 
 // ---- The handlers ---------------------------------------------------------------
 

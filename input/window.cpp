@@ -1,26 +1,14 @@
-// The window procedure of both toolbar windows, pane and floating frame, and
-// the mouse state that all toolbars of the process share.
+// The window procedure of both toolbar windows, pane and floating frame.
 #include "access/access.h"
 #include "core/core.h"
 #include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
-MouseTrack mouseTrack = {};
 UINT appActive = 1; // moves are served before the first WM_ACTIVATEAPP
 UINT borderSizing = 0;
 
 constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
-
-// The flags stay: the release that ends a press or drag still comes, lets go
-// of the capture and, finding no item and no manager, tells no one.
-void MouseTrackForgetManager(const ToolbarManager *manager) {
-    if (!manager) return;
-    if (mouseTrack.hitItem && PointerListFind(manager->items, ListValue(mouseTrack.hitItem), nullptr))
-        mouseTrack.hitItem = nullptr;
-    if (mouseTrack.menuToolbar && PointerListFind(manager->toolbars, ListValue(mouseTrack.menuToolbar), nullptr))
-        mouseTrack.menuToolbar = nullptr;
-}
 
 // The pane makes its floating frame, links the two and makes the record. The
 // frame passes through here too, and does nothing.
@@ -173,6 +161,9 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
     case kPassActivation:
         PassActivationToHost(window);
         return 0;
+    case WM_DISPLAYCHANGE: // sent to every top-level window: the floating frames, not the panes
+        KeepFloatingFrameOnScreen(window);
+        return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETMINMAXINFO:
         reinterpret_cast<MINMAXINFO *>(lParam)->ptMinTrackSize = POINT{0, 0};
         return 0;

@@ -129,8 +129,24 @@ static void FreeEntries(LPSTR *keys, LPSTR *values, UINT count) {
     MemoryBlockFree(values);
 }
 
+static bool HasTitle(const ToolbarRecord *toolbar) {
+    HWND frame = ResolveRoleWindow(toolbar->paneWindow, ROLE_FLOATING);
+    return frame && GetWindowTextLengthA(frame) > 0;
+}
+
+// The dock's toolbars that are stored: an empty title at the end of the
+// dock's value is read as the value's end and never comes back, so such
+// toolbars are left out, and a table applied and captured again is the table
+// it was.
+static UINT StoredToolbarCount(const DockArea *dock) {
+    UINT n = PointerListCount(dock->toolbars);
+    while (n > 0 && !HasTitle(ListAt<ToolbarRecord>(dock->toolbars, n - 1)))
+        --n;
+    return n;
+}
+
 UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count) {
-    UINT n = PointerListCount(dock->toolbars) + 1;
+    UINT n = StoredToolbarCount(dock) + 1;
     *keys = *values = nullptr;
     *count = 0;
     if (!GrowArray(keys, n) || !GrowArray(values, n)) {
@@ -140,8 +156,7 @@ UINT CaptureDockLayout(DockArea *dock, LPSTR **keys, LPSTR **values, UINT *count
     BlockFill(*keys, 0, PointerBytes(n));
     BlockFill(*values, 0, PointerBytes(n));
     // Entry 0: the dock's key, and its toolbars' titles joined by commas.
-    if (!StringDuplicate(&(*keys)[0], DockKey(dock->side)) ||
-        !StringDuplicate(&(*values)[0], "")) {
+    if (!StringDuplicate(&(*keys)[0], DockKey(dock->side)) || !StringDuplicate(&(*values)[0], "")) {
         FreeEntries(*keys, *values, n);
         return 0;
     }
@@ -172,7 +187,7 @@ extern "C" UINT QBR_CaptureLayout(ToolbarManager *manager, UINT *count) {
         DockArea *dock = ListAt<DockArea>(manager->docks, d);
         // An empty bottom dock writes no line, so that a host that merely
         // offers one stores the same arrangement as a host without it.
-        if (dock->side == DOCK_BOTTOM && !PointerListCount(dock->toolbars)) continue;
+        if (dock->side == DOCK_BOTTOM && !StoredToolbarCount(dock)) continue;
         LPSTR *keys, *values;
         UINT n;
         if (!CaptureDockLayout(dock, &keys, &values, &n)) {
@@ -221,6 +236,35 @@ UINT FindLayoutValue(LPSTR *keys, LPSTR *values, UINT count, LPCSTR key, LPSTR *
 // the unsigned size it would allocate, is one of these.
 constexpr UINT kMostLayoutItems = 65535;
 
+// A frame's stored rectangle is its outer one: the room of its items plus the
+// borders the window system gave it at the scale the table was written at
+// (the manager's while the table is applied). The rows come from the room
+// inside, and where this frame's borders are wider (a larger scale: 5 pixels
+// instead of 4 on each side at 150 %) the last item of a full row would wrap.
+// So the rectangle grows or shrinks by the difference, and the items have
+// the room they had.
+static void KeepRoomInsideBorders(HWND frame, UINT writtenDpi, RECT *rect) {
+    if (!frame) return;
+    const DWORD style = static_cast<DWORD>(GetWindowLongA(frame, GWL_STYLE));
+    const DWORD exStyle = static_cast<DWORD>(GetWindowLongA(frame, GWL_EXSTYLE));
+    RECT written, outer, client;
+    WindowBordersAt(style, exStyle, writtenDpi, &written);
+    // The borders this frame has, measured: under Wine every window has the
+    // screen's, whatever scale its monitor is said to have. Of a frame sized
+    // below its borders only the platform's numbers tell them.
+    GetWindowRect(frame, &outer);
+    GetClientRect(frame, &client);
+    int nowWidth = (outer.right - outer.left) - client.right, nowHeight = (outer.bottom - outer.top) - client.bottom;
+    if (client.right <= 0 || client.bottom <= 0) {
+        RECT platform = {0, 0, 0, 0};
+        AdjustWindowRectEx(&platform, style, FALSE, exStyle);
+        nowWidth = platform.right - platform.left;
+        nowHeight = platform.bottom - platform.top;
+    }
+    rect->right += nowWidth - (written.right - written.left);
+    rect->bottom += nowHeight - (written.bottom - written.top);
+}
+
 // One toolbar from its value, read at *cursor and moved on past what was read.
 static HWND RestoreToolbarAt(HWND dockWindow, LPCSTR title, LPSTR *cursor) {
     HWND pane = CreateToolbarWindows(dockWindow, title);
@@ -242,6 +286,7 @@ static HWND RestoreToolbarAt(HWND dockWindow, LPCSTR title, LPSTR *cursor) {
     r.top = NextTokenInt(cursor);
     r.right = NextTokenInt(cursor);
     r.bottom = NextTokenInt(cursor);
+    KeepRoomInsideBorders(ResolveRoleWindow(pane, ROLE_FLOATING), ManagerDpi(manager), &r);
     MoveToolbarWindow(pane, ROLE_FLOATING, &r);
     DockArea *dock = FindDockRecord(dockWindow);
     if (dock) InsertToolbarBefore(dock, nullptr, record);
@@ -336,5 +381,8 @@ extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     UINT ok = ApplyLayoutRecords(manager, frame, layoutKeys, layoutValues, layoutCount);
     RescaleManagerToolbars(manager, dpi);
     PlaceFloatingInProportion(manager, written);
+    // A table may name places on a monitor that is gone.
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        KeepFloatingFrameOnScreen(ResolveRoleWindow(record->paneWindow, ROLE_FLOATING));
     return ok;
 }

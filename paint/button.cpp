@@ -10,9 +10,12 @@ static HGDIOBJ savedStripObject = nullptr;
 static HGDIOBJ savedMaskObject = nullptr;
 static HBITMAP maskBitmap = nullptr;
 static int stripColumns = 0;
-// The display scale of the pass (its manager's) and the size of one image in
-// the strip it draws from, which is the size the image is drawn at.
-static UINT passDpi = kBaseDpi;
+// The sizes at the display scale of the pass (its manager's) and the size of
+// one image in the strip it draws from, which is the size the image is drawn at.
+static const ScaledMetrics *passMetrics = nullptr;
+
+// The pass's sizes; outside a pass, those of 100 %.
+static const ScaledMetrics &PassMetrics() { return passMetrics ? *passMetrics : ManagerMetrics(nullptr); }
 static int cellWidth = 0;
 static int cellHeight = 0;
 
@@ -27,10 +30,11 @@ constexpr DWORD kBrushWhereMaskSet = 0xE20746;
 // Mask copies onto a colour target read text colour for 0 bits and background
 // colour for 1 bits; black on white makes the source act as all zeros or all
 // ones on every colour bit.
-void SetMaskColors(HDC dc) {
-    SetTextColor(dc, RGB(0, 0, 0));
-    SetBkColor(dc, RGB(255, 255, 255));
-}
+struct MaskColorsScope {
+    explicit MaskColorsScope(HDC dc) : text(dc, RGB(0, 0, 0)), back(dc, RGB(255, 255, 255)) {}
+    TextColorScope text;
+    BkColorScope back;
+};
 
 // Copies the mask onto the target through a brush of one colour.
 void MaskedBrushBlt(int x, int y, int width, int height, HBRUSH brush, DWORD rop) {
@@ -66,8 +70,8 @@ void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color) {
 UINT BeginButtonPaint(ToolbarManager *manager, HDC dc) {
     int bw = 0, bh = 0;
     if (!manager || !dc || !CurrentClient()) return 0;
-    passDpi = ManagerDpi(manager);
-    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
+    const ScaledMetrics &metrics = ManagerMetrics(manager);
+    metrics.ButtonSize(&bw, &bh);
     targetDC = dc;
 
     HBITMAP image = manager->imageStrip;
@@ -94,6 +98,7 @@ UINT BeginButtonPaint(ToolbarManager *manager, HDC dc) {
         SelectObject(stripDC, savedStripObject);
         return 0;
     }
+    passMetrics = &metrics;
     return 1;
 }
 
@@ -105,6 +110,7 @@ void EndButtonPaint() {
     savedMaskObject = nullptr;
     savedStripObject = nullptr;
     targetDC = nullptr;
+    passMetrics = nullptr;
 }
 
 // Ands each bit of the mask (width by height) with its neighbour up and left,
@@ -131,7 +137,7 @@ static void ErodeMask(int width, int height) {
 
 void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, UINT erode) {
     int bw = 0, bh = 0;
-    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
+    PassMetrics().ButtonSize(&bw, &bh);
     const int iw = cellWidth, ih = cellHeight;
     // Everything outside the image counts as background.
     PatBlt(maskDC, 0, 0, bw - 2, bh - 2, WHITENESS);
@@ -163,49 +169,61 @@ void BuildButtonMask(UINT imageIndex, int maskX, int maskY, UINT withHighlight, 
 //      f H S S S S S S S S S S S f     and top only, and the image and the
 //      f S S S S S S S S S S S S f     label one pixel further down right.
 //      . f f f f f f f f f f f f .
-void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
-    ToolbarClient *client = CurrentClient();
-    if (!client || !item || !rect || !targetDC) return;
-    if (!RectVisible(targetDC, rect)) return;
-    // Only a button carries a ButtonData payload; a separator's is another
-    // record, so it is not read as one.
-    const auto *button = item->kind == ITEM_BUTTON ? static_cast<const ButtonData *>(ItemGetData(item)) : nullptr;
-    if (!button) return;
+//
+// With button text the image stands kLabelImageTop below the face's top and
+// the label's cell ends kLabelBottom above its bottom (core/metrics.h).
+namespace {
 
-    int bw = 0, bh = 0;
-    GetButtonSizesAt(passDpi, &bw, &bh, nullptr, nullptr);
-    const int iw = cellWidth, ih = cellHeight;
-    const bool on = !noState && ButtonGetState(button) == 1;
-    const bool mixed = !noState && ButtonGetState(button) == 2;
-    const bool pressed = !noState && ButtonIsPressed(button) != 0;
-    const bool disabled = !noState && ButtonIsEnabled(button) == 0;
-    UINT imageIndex = 0;
-    ButtonGetImageIndex(button, &imageIndex);
+// One button as it is painted now: its state and where its parts go.
+struct ButtonLook {
+    bool on, mixed, pressed, disabled;
+    UINT imageIndex;
+    int bw, bh;           // the button's cell
+    int x, y, w, h;       // inside the frame ring
+    int iw, ih;           // the image
+    int imageX, imageY;   // the image's place from (x, y)
+    int labelDX, labelDY; // the label's shift when sunken
+};
 
-    const int x = rect->left + 1;
-    const int y = rect->top + 1;
-    const int w = bw - 2;
-    const int h = bh - 2;
-    int imageX = (w - iw - 1) >> 1;
-    int imageY = client->buttonText ? ScaleToDpi(5, passDpi) : (h - ih) >> 1;
-    int labelDX = 0;
-    int labelDY = 0;
+ButtonLook LookOf(const ButtonData *button, const RECT *rect, UINT noState, bool withLabel) {
+    ButtonLook look = {};
+    const ScaledMetrics &metrics = PassMetrics();
+    metrics.ButtonSize(&look.bw, &look.bh);
+    look.iw = cellWidth;
+    look.ih = cellHeight;
+    look.on = !noState && ButtonGetState(button) == 1;
+    look.mixed = !noState && ButtonGetState(button) == 2;
+    look.pressed = !noState && ButtonIsPressed(button) != 0;
+    look.disabled = !noState && ButtonIsEnabled(button) == 0;
+    ButtonGetImageIndex(button, &look.imageIndex);
+    look.x = rect->left + 1;
+    look.y = rect->top + 1;
+    look.w = look.bw - 2;
+    look.h = look.bh - 2;
+    look.imageX = (look.w - look.iw - 1) >> 1;
+    look.imageY = withLabel ? metrics.labelImageTop : (look.h - look.ih) >> 1;
+    return look;
+}
 
-    // Face and frame.
-    FillSolidBox(targetDC, x, y, w, h, colorFace);
-    FillSolidBox(targetDC, x, y - 1, w, 1, colorFrame);
-    FillSolidBox(targetDC, x, y + h, w, 1, colorFrame);
-    FillSolidBox(targetDC, x - 1, y, 1, h, colorFrame);
-    FillSolidBox(targetDC, x + w, y, 1, h, colorFrame);
+void PaintFaceAndFrame(const ButtonLook &b) {
+    FillSolidBox(targetDC, b.x, b.y, b.w, b.h, colorFace);
+    FillSolidBox(targetDC, b.x, b.y - 1, b.w, 1, colorFrame);
+    FillSolidBox(targetDC, b.x, b.y + b.h, b.w, 1, colorFrame);
+    FillSolidBox(targetDC, b.x - 1, b.y, 1, b.h, colorFrame);
+    FillSolidBox(targetDC, b.x + b.w, b.y, 1, b.h, colorFrame);
+}
 
-    // Relief.
-    if (on || pressed) {
+// Raised, or sunken for a button that is on or held down; sunken moves the
+// image and the label one pixel down and right.
+void PaintRelief(ButtonLook &b) {
+    const int x = b.x, y = b.y, w = b.w, h = b.h;
+    if (b.on || b.pressed) {
         FillSolidBox(targetDC, x, y, 1, h, colorShadow);
         FillSolidBox(targetDC, x, y, w, 1, colorShadow);
-        ++imageX;
-        ++imageY;
-        ++labelDX;
-        ++labelDY;
+        ++b.imageX;
+        ++b.imageY;
+        ++b.labelDX;
+        ++b.labelDY;
     } else {
         FillSolidBox(targetDC, x, y, 1, h - 1, colorHighlight);
         FillSolidBox(targetDC, x, y, w - 1, 1, colorHighlight);
@@ -214,82 +232,120 @@ void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
         FillSolidBox(targetDC, x, y + h - 1, w, 1, colorShadow);
         FillSolidBox(targetDC, x + 1, y + h - 2, w - 2, 1, colorShadow);
     }
-
-    // Image: a disabled button shows only its embossed ink, unless it is held
-    // down, when the image shows under the ink copies.
-    if (pressed || !disabled) {
-        int sourceX = 0, sourceY = 0;
-        SourceOfImage(imageIndex, &sourceX, &sourceY);
-        BitBlt(targetDC, x + imageX, y + imageY, iw, ih, stripDC, sourceX, sourceY, SRCCOPY);
-    }
-
-    // Ink passes: every image pixel that is neither face nor highlight, flat.
-    if (disabled || mixed) {
-        BuildButtonMask(imageIndex, imageX, imageY, 1, 0);
-        SetMaskColors(targetDC);
-        if (disabled) {
-            SolidBrush light(colorHighlight);
-            MaskedBrushBlt(x + 1, y + 1, bw - 2, bh - 2, light, kBrushWhereMaskClear);
-        }
-        SolidBrush dark(colorShadow);
-        MaskedBrushBlt(x, y, bw - 2, bh - 2, dark, kBrushWhereMaskClear);
-    }
-
-    // Dither pass: the checker over the background, the ink left alone. The
-    // brush origin stays the target's, so neighbouring buttons show one
-    // unbroken pattern.
-    if (on || mixed) {
-        SelectScope select(targetDC, ditherBrush);
-        if (select.Selected()) {
-            // This mask is laid down at (x + 1, y + 1), hence one pixel up and
-            // left of the ink passes' image.
-            BuildButtonMask(imageIndex, imageX - 1, imageY - 1, mixed ? 0 : 1, disabled ? 1 : 0);
-            SetMaskColors(targetDC);
-            // A mixed button's dither stops short of the two-pixel dark edge.
-            const int n = mixed ? 3 : 1;
-            BitBlt(targetDC, x + 1, y + 1, w - n, h - n, maskDC, 0, 0, kBrushWhereMaskSet);
-        }
-    }
-
-    // Label, in the target's own text colour.
-    if (client->buttonText) {
-        const int oldMode = SetBkMode(targetDC, TRANSPARENT);
-        SelectScope font(targetDC, buttonFont);
-        UINT id = 0;
-        ItemGetId(item, &id);
-        char text[kHelpTextSize + 2];
-        text[0] = '\0';
-        int length = RequestHelpText(id, HELP_BUTTON_TEXT, text, kHelpTextSize);
-        // A host that reports the length it wanted rather than what it wrote
-        // must not make us read past the buffer.
-        if (length >= kHelpTextSize) length = lstrlenA(text);
-        if (length > 0) {
-            SIZE extent = {0, 0};
-            GetTextExtentPointA(targetDC, text, length, &extent);
-            // A label wider than the button gets a negative offset and
-            // overhangs both sides; only the window clips it.
-            const int labelX = x + labelDX + ((w - extent.cx - 1) >> 1);
-            const int labelY = y + labelDY + h - extent.cy - ScaleToDpi(3, passDpi);
-            ExtTextOutA(targetDC, labelX, labelY, 0, nullptr, text, static_cast<UINT>(length), nullptr);
-        }
-        SetBkMode(targetDC, oldMode);
-    }
 }
 
-// The focus rectangle stands this far inside the button's cell, clear of
-// the frame ring and the raised edges.
-constexpr int kFocusInset = 3;
+// A disabled button shows only its embossed ink, unless it is held down,
+// when the image shows under the ink copies.
+void PaintImage(const ButtonLook &b) {
+    if (!b.pressed && b.disabled) return;
+    int sourceX = 0, sourceY = 0;
+    SourceOfImage(b.imageIndex, &sourceX, &sourceY);
+    BitBlt(targetDC, b.x + b.imageX, b.y + b.imageY, b.iw, b.ih, stripDC, sourceX, sourceY, SRCCOPY);
+}
+
+// Every image pixel that is neither face nor highlight, flat: light one pixel
+// down right for a disabled button, then dark.
+void PaintInk(const ButtonLook &b) {
+    if (!b.disabled && !b.mixed) return;
+    BuildButtonMask(b.imageIndex, b.imageX, b.imageY, 1, 0);
+    MaskColorsScope colors(targetDC);
+    if (b.disabled) {
+        SolidBrush light(colorHighlight);
+        MaskedBrushBlt(b.x + 1, b.y + 1, b.bw - 2, b.bh - 2, light, kBrushWhereMaskClear);
+    }
+    SolidBrush dark(colorShadow);
+    MaskedBrushBlt(b.x, b.y, b.bw - 2, b.bh - 2, dark, kBrushWhereMaskClear);
+}
+
+// The checker over the background of a button that is on or mixed, the ink
+// left alone. The brush origin stays the target's, so neighbouring buttons
+// show one unbroken pattern.
+void PaintDither(const ButtonLook &b) {
+    if (!b.on && !b.mixed) return;
+    SelectScope select(targetDC, ditherBrush);
+    if (!select.Selected()) return;
+    // This mask is laid down at (x + 1, y + 1), hence one pixel up and left
+    // of the ink passes' image.
+    BuildButtonMask(b.imageIndex, b.imageX - 1, b.imageY - 1, b.mixed ? 0 : 1, b.disabled ? 1 : 0);
+    MaskColorsScope colors(targetDC);
+    // A mixed button's dither stops short of the two-pixel dark edge.
+    const int n = b.mixed ? 3 : 1;
+    BitBlt(targetDC, b.x + 1, b.y + 1, b.w - n, b.h - n, maskDC, 0, 0, kBrushWhereMaskSet);
+}
+
+// The label under the image, centred, in the target's own text colour.
+void PaintLabel(const ButtonLook &b, UINT id) {
+    BkModeScope transparent(targetDC, TRANSPARENT);
+    SelectScope font(targetDC, buttonFont);
+    char text[kHelpTextSize + 2];
+    text[0] = '\0';
+    int length = RequestHelpText(id, HELP_BUTTON_TEXT, text, kHelpTextSize);
+    // A host that reports the length it wanted rather than what it wrote
+    // must not make us read past the buffer.
+    if (length >= kHelpTextSize) length = lstrlenA(text);
+    if (length <= 0) return;
+    SIZE extent = {0, 0};
+    GetTextExtentPointA(targetDC, text, length, &extent);
+    // A label wider than the button gets a negative offset and overhangs
+    // both sides; only the window clips it.
+    const int labelX = b.x + b.labelDX + ((b.w - extent.cx - 1) >> 1);
+    const int labelY = b.y + b.labelDY + b.h - extent.cy - PassMetrics().labelBottom;
+    ExtTextOutA(targetDC, labelX, labelY, 0, nullptr, text, static_cast<UINT>(length), nullptr);
+}
+
+} // namespace
+
+void PaintButton(ToolbarItem *item, const RECT *rect, UINT noState) {
+    ToolbarClient *client = CurrentClient();
+    if (!client || !item || !rect || !targetDC) return;
+    if (!RectVisible(targetDC, rect)) return;
+    // Only a button carries a ButtonData payload; a separator's is another
+    // record, so it is not read as one.
+    const auto *button = item->kind == ITEM_BUTTON ? static_cast<const ButtonData *>(ItemGetData(item)) : nullptr;
+    if (!button) return;
+    ButtonLook look = LookOf(button, rect, noState, client->buttonText != 0);
+    PaintFaceAndFrame(look);
+    PaintRelief(look);
+    PaintImage(look);
+    PaintInk(look);
+    PaintDither(look);
+    if (client->buttonText) PaintLabel(look, item->id);
+}
 
 void PaintFocusRect(const RECT *rect) {
     if (!targetDC || !rect) return;
     RECT focus = *rect;
-    const int inset = ScaleToDpi(kFocusInset, passDpi);
+    const int inset = PassMetrics().focusInset;
     InflateRect(&focus, -inset, -inset);
     // The dots invert what lies under them, black and white being the
     // colours the platform's own controls draw them with.
-    const COLORREF oldText = SetTextColor(targetDC, RGB(0, 0, 0));
-    const COLORREF oldBack = SetBkColor(targetDC, RGB(255, 255, 255));
-    DrawFocusRect(targetDC, &focus);
-    SetTextColor(targetDC, oldText);
-    SetBkColor(targetDC, oldBack);
+    MaskColorsScope colors(targetDC);
+    DrawFocusFrame(targetDC, &focus, PassMetrics());
+}
+
+void DrawFocusFrame(HDC dc, const RECT *rect, const ScaledMetrics &metrics) {
+    if (!dc || !rect) return;
+    const int cx = metrics.focusBorderX, cy = metrics.focusBorderY;
+    if (cx == 1 && cy == 1) {
+        DrawFocusRect(dc, rect);
+        return;
+    }
+    // Wider lines: the same dots, every other pixel of the band inverted by a
+    // checked pattern in the context's text and background colours.
+    static const WORD kChecks[8] = {0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55};
+    HBITMAP pattern = GdiTrack(CreateBitmap(8, 8, 1, 1, kChecks));
+    HBRUSH brush = pattern ? GdiTrack(CreatePatternBrush(pattern)) : nullptr;
+    if (brush) {
+        const int w = rect->right - rect->left, h = rect->bottom - rect->top;
+        const int sideX = cx < w / 2 ? cx : w / 2, sideY = cy < h / 2 ? cy : h / 2;
+        SelectScope select(dc, brush);
+        if (select.Selected()) {
+            PatBlt(dc, rect->left, rect->top, w, sideY, PATINVERT);
+            PatBlt(dc, rect->left, rect->bottom - sideY, w, sideY, PATINVERT);
+            PatBlt(dc, rect->left, rect->top + sideY, sideX, h - 2 * sideY, PATINVERT);
+            PatBlt(dc, rect->right - sideX, rect->top + sideY, sideX, h - 2 * sideY, PATINVERT);
+        }
+    }
+    GdiDelete(brush);
+    GdiDelete(pattern);
 }

@@ -2,6 +2,7 @@
 // each state, the toolbar surface and the caption of floating frames.
 #pragma once
 
+#include "core/metrics.h"
 #include "qbr_records.h"
 
 // ---- Shared drawing objects (made for the first client, freed with the last)
@@ -38,6 +39,9 @@ void FillSolidBox(HDC dc, int x, int y, int width, int height, COLORREF color);
 // The keyboard's focus on the button just painted at `rect`: a dotted
 // rectangle inside its face.
 void PaintFocusRect(const RECT *rect);
+// A dotted focus rectangle on `rect`, its lines as wide as the platform's
+// focus border (SM_CXFOCUSBORDER, SM_CYFOCUSBORDER) at the display scale `dpi`.
+void DrawFocusFrame(HDC dc, const RECT *rect, const ScaledMetrics &metrics);
 
 // ---- Surface and caption -----------------------------------------------------
 extern HFONT captionFont;
@@ -45,7 +49,8 @@ extern int captionHeight;
 
 UINT CaptionFontStart();
 void CaptionFontEnd();
-void PaintToolbar(HWND window);
 void PaintFloatingCaption(HWND window, HDC dc);
 void PaintCloseBox(HWND window, HDC dc);
 void CloseBoxRect(HWND window, RECT *rect);
+// The checkered drag frame, inverted on the screen: drawn twice, it is gone.
+void DrawDragFrame(const RECT *rect);

@@ -196,8 +196,8 @@ void StripCellSize(const ToolbarManager *manager, int *width, int *height) {
 UINT ChooseImageStrip(ToolbarManager *manager) {
     ToolbarClient *client = CurrentClient();
     if (!client || !manager || !manager->imageResource) return 0;
-    const UINT dpi = ManagerDpi(manager);
-    const UINT wanted = static_cast<UINT>(MulDiv(100, static_cast<int>(dpi), static_cast<int>(kBaseDpi)));
+    const ScaledMetrics &metrics = ManagerMetrics(manager);
+    const UINT wanted = metrics.scalePercent;
     HRSRC resource = manager->imageResource;
     UINT scale = 100;
     if (manager->imageName && wanted > 100) {
@@ -220,9 +220,9 @@ UINT ChooseImageStrip(ToolbarManager *manager) {
 
     // The largest whole factor by which the strip's images still fit the
     // image size at the frame's scale; 1 when they already fill it.
-    int iw = 0, ih = 0, wantWidth = 0, wantHeight = 0;
+    int iw = 0, ih = 0;
     GetButtonSizes(nullptr, nullptr, &iw, &ih);
-    GetButtonSizesAt(dpi, nullptr, nullptr, &wantWidth, &wantHeight);
+    const int wantWidth = metrics.imageWidth, wantHeight = metrics.imageHeight;
     const int cellWidth = ScalePercent(iw, scale), cellHeight = ScalePercent(ih, scale);
     int factor = 1;
     if (cellWidth > 0 && cellHeight > 0) {
@@ -298,4 +298,20 @@ HBITMAP LoadImageStrip(HINSTANCE instance, HRSRC resource) {
 
     FreeResource(loaded);
     return strip;
+}
+
+extern "C" UINT QBR_SetImageStrip(ToolbarManager *manager, LPCSTR resourceName) {
+    ToolbarClient *client = CurrentClient();
+    if (!client || !manager) return 0;
+    HRSRC resource = FindResourceA(client->instance, resourceName, MAKEINTRESOURCEA(2) /* RT_BITMAP */);
+    if (!resource) return 0;
+    // A second call replaces the strip: the chooser loads the new bitmap
+    // first and only then deletes the one it replaces, which is the manager's
+    // alone. Toolbars paint from the new one at their next paint.
+    manager->imageResource = resource;
+    // Kept for the strips of other display scales, which are found by name.
+    if (manager->imageName) MemoryBlockFree(manager->imageName);
+    manager->imageName = nullptr;
+    if (!IS_INTRESOURCE(resourceName)) StringDuplicate(&manager->imageName, resourceName);
+    return ChooseImageStrip(manager);
 }

@@ -1,13 +1,8 @@
-// A toolbar window as a whole: the surface, the caption band of a floating
-// frame with its title and close box, then the buttons.
-//
-// Kept apart from the caption font: this file needs the toolbar windows, and
-// only code that paints toolbars pulls it in.
+// The caption band of a floating frame with its title and close box, and the
+// checkered drag frame inverted on the screen.
 #include "core/core.h"
 #include "core/gdi.h"
-#include "input/input.h"
 #include "paint/paint.h"
-#include "toolbar/toolbar.h"
 
 namespace {
 
@@ -24,26 +19,6 @@ constexpr COLORREF kDashFace = RGB(255, 255, 255);
 constexpr int kMinDashCaption = 5;
 
 } // namespace
-
-void PaintToolbar(HWND window) {
-    ToolbarManager *manager = ManagerOfToolbar(window);
-    HWND target = ResolveRoleWindow(window, ROLE_ACTIVE);
-    if (!target) target = window; // a window without a record still gets validated
-    PaintScope paint(target);
-    HDC dc = paint;
-    if (!dc) return;
-
-    // The surface reads the system colour at every paint; the buttons keep
-    // the colours fixed when the library started.
-    const RECT &update = paint.UpdateRect();
-    FillBox(dc, update, GetSysColor(COLOR_BTNFACE));
-    if (IsFloatingFrame(target)) PaintFloatingCaption(target, dc);
-    if (BeginButtonPaint(manager, dc)) {
-        PaintToolbarItems(ResolveRoleWindow(window, ROLE_DOCKED));
-        EndButtonPaint();
-    }
-    PaintChevron(target, dc);
-}
 
 // The band, from the top of the client area down to captionHeight:
 //
@@ -76,26 +51,25 @@ void PaintFloatingCaption(HWND window, HDC dc) {
         if (!MemoryBlockAlloc(&block, static_cast<UINT>(length) + 1, 0)) return; // no title, no close box
         char *text = static_cast<char *>(block);
         const int copied = GetWindowTextA(window, text, length + 1);
-        SetBkMode(dc, TRANSPARENT);
         {
+            BkModeScope transparent(dc, TRANSPARENT);
             SelectScope font(dc, captionFont);
             SIZE extent = {0, 0};
             GetTextExtentPointA(dc, text, copied, &extent);
-            const COLORREF oldColor = SetTextColor(dc, GetSysColor(COLOR_CAPTIONTEXT));
+            TextColorScope color(dc, GetSysColor(COLOR_CAPTIONTEXT));
             // Drawn after the line and one pixel above the client area, so
             // descenders reach over the line; a title wider than the frame
             // starts left of it, and the close box covers that end.
             ExtTextOutA(dc, (rect.right - extent.cx) >> 1, -1, 0, nullptr, text, static_cast<UINT>(copied), nullptr);
-            SetTextColor(dc, oldColor);
         }
         MemoryBlockFree(block);
-        SetBkMode(dc, OPAQUE);
     }
     PaintCloseBox(window, dc);
 }
 
+// `window` is the floating frame; a hidden one has no close box to paint.
 void PaintCloseBox(HWND window, HDC dc) {
-    if (!IsWindowVisible(ResolveRoleWindow(window, ROLE_FLOATING))) return;
+    if (!IsWindowVisible(window)) return;
     RECT box;
     CloseBoxRect(window, &box);
     // What stays of the edge colour is a line at the right and at the
@@ -114,4 +88,36 @@ void PaintCloseBox(HWND window, HDC dc) {
     FillBox(dc, dash, kDashOutline);
     InflateRect(&dash, -1, -1);
     FillBox(dc, dash, kDashFace);
+}
+
+// ---- The drag frame --------------------------------------------------------------
+// The checkered frame shared by toolbar drags, item drags and the Insert
+// Toolbar Item list: inverted straight onto the screen, so drawing the same
+// rectangle twice erases it.
+//
+// Four 2-pixel strips inside the rectangle. They meet without overlap: a pixel
+// covered twice would be inverted back.
+//
+//   +--------------- top ----------+--+
+//   |  |                           |  |
+//   |left                        right|
+//   |  |                           |  |
+//   +--+----------- bottom -----------+
+void DrawDragFrame(const RECT *rect) {
+    static const WORD kRows[8] = {0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55, 0xAA, 0x55};
+    ScreenDC screen;
+    if (!screen) return;
+    HBITMAP bitmap = GdiTrack(CreateBitmap(8, 8, 1, 1, kRows));
+    HBRUSH brush = bitmap ? GdiTrack(CreatePatternBrush(bitmap)) : nullptr;
+    if (brush) {
+        SelectScope select(screen, brush);
+        const int width = rect->right - rect->left;
+        const int height = rect->bottom - rect->top;
+        PatBlt(screen, rect->left, rect->top + 2, 2, height - 4, PATINVERT);
+        PatBlt(screen, rect->left, rect->top, width - 2, 2, PATINVERT);
+        PatBlt(screen, rect->right - 2, rect->top, 2, height - 2, PATINVERT);
+        PatBlt(screen, rect->left, rect->bottom - 2, width, 2, PATINVERT);
+    }
+    GdiDelete(brush);
+    GdiDelete(bitmap);
 }

@@ -22,23 +22,8 @@ constexpr DWORD kHelpStyle = WS_POPUP | WS_BORDER | WS_CLIPSIBLINGS; // created 
 // One period is both the delay before a tip and the step of the poll.
 constexpr UINT kHelpPeriod = 200;
 
-// The tip and its text, in screen and client pixels:
-//
-//        + cursor (x, y)
-//        |
-//        | kTipBelowCursor
-//   +----v-------------------+  ^
-//   | (2,1) text             |  | text height (no internal leading)
-//   +------------------------+  v + kTipExtraHeight
-//   <-- text width + kTipExtraWidth -->
-//
-// At the bottom of the screen the tip stands above the cursor's line instead,
-// its lower edge on y; at the right edge its right edge stands on x.
-constexpr int kTipBelowCursor = 18;
-constexpr int kTipExtraWidth = 8;
-constexpr int kTipExtraHeight = 6;
-constexpr int kTextLeft = 2;
-constexpr int kTextTop = 1;
+// The tip's offsets (kTipBelowCursor and the rest, in core/metrics.h) are
+// those of the display scale of the toolbar it stands for.
 constexpr COLORREF kTipBackground = RGB(255, 255, 128);
 
 // Help text buffers hold kHelpTextSize characters and the terminator, with
@@ -85,19 +70,23 @@ void StopQuickHelp(HWND help) {
     KillHelpTimer();
 }
 
+// Where the text stands in the tip on show, at its toolbar's scale.
+POINT tipTextAt = {kTipTextLeft, kTipTextTop};
+
 // Sizes and places the tip for `text` with its left edge at x and its top
 // at `below`; at the bottom of the screen its lower edge stands on `above`
 // instead, at the right edge its right edge on x (all screen coordinates).
-void PlaceTipAt(HWND help, int x, int below, int above, const char *text, int length) {
+void PlaceTipAt(HWND help, const ScaledMetrics &metrics, int x, int below, int above, const char *text, int length) {
     WindowDC dc(help);
-    SelectScope font(dc, helpFont);
-    TEXTMETRICA metrics;
-    BlockFill(&metrics, 0, sizeof(metrics));
-    GetTextMetricsA(dc, &metrics);
+    SelectScope selected(dc, helpFont);
+    TEXTMETRICA font;
+    BlockFill(&font, 0, sizeof(font));
+    GetTextMetricsA(dc, &font);
     SIZE extent = {0, 0};
     GetTextExtentPoint32A(dc, text, length, &extent);
-    int height = metrics.tmHeight - metrics.tmInternalLeading + kTipExtraHeight;
-    int width = extent.cx + kTipExtraWidth;
+    int height = font.tmHeight - font.tmInternalLeading + metrics.tipExtraHeight;
+    int width = extent.cx + metrics.tipExtraWidth;
+    tipTextAt = POINT{metrics.tipTextLeft, metrics.tipTextTop};
     int top = below;
     if (below + height > GetSystemMetrics(SM_CYSCREEN)) top = above - height;
     if (x - GetSystemMetrics(SM_CXSCREEN) + width > 0) x -= width;
@@ -105,14 +94,15 @@ void PlaceTipAt(HWND help, int x, int below, int above, const char *text, int le
 }
 
 // The tip beside the cursor at `cursor` (screen).
-void PlaceTip(HWND help, POINT cursor, const char *text, int length) {
-    PlaceTipAt(help, cursor.x, cursor.y + kTipBelowCursor, cursor.y, text, length);
+void PlaceTip(HWND help, const ScaledMetrics &metrics, POINT cursor, const char *text, int length) {
+    PlaceTipAt(help, metrics, cursor.x, cursor.y + metrics.tipBelowCursor, cursor.y, text, length);
 }
 
 // The keyboard's tip waits for its item here; the button's place is taken
 // when the wait began.
 ToolbarItem *keyTipItem = nullptr;
 RECT keyTipRect = {};
+ToolbarManager *keyTipManager = nullptr;
 
 void CALLBACK KeyTipTimerProc(HWND, UINT, UINT_PTR, DWORD) {
     KillHelpTimer();
@@ -122,7 +112,8 @@ void CALLBACK KeyTipTimerProc(HWND, UINT, UINT_PTR, DWORD) {
     char text[kTextBuffer];
     int length = QuickHelpText(helpItem, text);
     if (length <= 0) return;
-    PlaceTipAt(help, keyTipRect.left, keyTipRect.bottom + 1, keyTipRect.top, text, length);
+    PlaceTipAt(help, ManagerMetrics(keyTipManager), keyTipRect.left, keyTipRect.bottom + 1, keyTipRect.top, text,
+               length);
     ShowWindow(help, SW_SHOWNA);
     // A tip already on show keeps its old picture otherwise.
     InvalidateRect(help, nullptr, TRUE);
@@ -134,7 +125,7 @@ void QuickHelpPaint(HWND window) {
     PaintScope dc(window);
     if (!helpItem) return;
     SelectScope font(dc, helpFont);
-    SetBkMode(dc, TRANSPARENT);
+    BkModeScope transparent(dc, TRANSPARENT);
     // Asked again rather than kept from the poll: the tip always shows what
     // the host says now.
     char text[kTextBuffer];
@@ -146,7 +137,7 @@ void QuickHelpPaint(HWND window) {
     ++client.bottom;
     SolidBrush background(kTipBackground);
     FillRect(dc, &client, background);
-    ExtTextOutA(dc, kTextLeft, kTextTop, 0, nullptr, text, static_cast<UINT>(length), nullptr);
+    ExtTextOutA(dc, tipTextAt.x, tipTextAt.y, 0, nullptr, text, static_cast<UINT>(length), nullptr);
 }
 
 } // namespace
@@ -196,13 +187,14 @@ void QuickHelpForgetManager(const ToolbarManager *manager) {
     keyTipItem = nullptr;
 }
 
-void QuickHelpForKey(ToolbarItem *item, const RECT *rect) {
+void QuickHelpForKey(HWND window, ToolbarItem *item, const RECT *rect) {
     // The mouse's poll stops: the keyboard names the button now.
     KillHelpTimer();
     if (HWND help = HelpWindow()) ShowWindow(help, SW_HIDE);
     keyTipItem = rect && IsButtonItem(item) ? item : nullptr;
     if (!keyTipItem) return;
     keyTipRect = *rect;
+    keyTipManager = ManagerOfToolbar(window);
     if (QBR_GetQuickHelp()) helpTimer = SetTimer(nullptr, 0, kHelpPeriod, KeyTipTimerProc);
 }
 
@@ -253,7 +245,7 @@ void CALLBACK QuickHelpTimerProc(HWND, UINT, UINT_PTR, DWORD) {
     char text[kTextBuffer];
     int length = QuickHelpText(item, text);
     if (length <= 0) return;
-    PlaceTip(help, p, text, length);
+    PlaceTip(help, ManagerMetrics(ManagerOfToolbar(w)), p, text, length);
     // The tip never takes activation from the frame.
     ShowWindow(help, SW_SHOWNA);
 }

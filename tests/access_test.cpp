@@ -607,4 +607,161 @@ TEST_F(AccessTest, AToolbarHiddenFromTheKeyboardHandsTheFocusOn) {
     EXPECT_EQ("host", Focus());
 }
 
+// ---- Where readers and hosts meet the keyboard ------------------------------------------------
+
+// The last focus event heard, or none.
+Event LastFocus() {
+    for (auto e = events.rbegin(); e != events.rend(); ++e)
+        if (e->event == EVENT_OBJECT_FOCUS) return *e;
+    return Event{0, nullptr, 0, 0};
+}
+
+// The window focus never leaves the host while the toolbars have the
+// keyboard, so the platform says nothing when it comes back: the library does.
+TEST_F(AccessTest, LeavingTheToolbarsAnnouncesTheWindowThatHasTheKeyboard) {
+    HWND pane = Make("Tools", {1, 2});
+    // Alt and F10 go down only: their release would start the frame's menu
+    // loop, which is the host's business.
+    struct Row {
+        const char *what;
+        void (*leave)(HWND frame);
+    } const rows[] = {
+        {"Esc", [](HWND) { Key("Esc"); }},
+        {"F6", [](HWND) { Key("F6"); }},
+        {"Alt", [](HWND f) { PostMessageA(f, WM_SYSKEYDOWN, VK_MENU, 0x20380001); }},
+        {"F10", [](HWND f) { PostMessageA(f, WM_SYSKEYDOWN, VK_F10, 0x00440001); }},
+        {"mouse press",
+         [](HWND f) {
+             POINT p = {300, 300};
+             ClientToScreen(f, &p);
+             PlaceCursor(p);
+             INPUT in[2] = {};
+             in[0].type = in[1].type = INPUT_MOUSE;
+             in[0].mi.dwFlags = MOUSEEVENTF_LEFTDOWN;
+             in[1].mi.dwFlags = MOUSEEVENTF_LEFTUP;
+             SendInput(2, in, sizeof(INPUT));
+         }},
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(row.what);
+        Key("F6");
+        ASSERT_EQ("Tools 0", Focus());
+        events.clear();
+        row.leave(frame);
+        PumpHost(50);
+        EXPECT_EQ("host", Focus());
+        EXPECT_EQ((Event{EVENT_OBJECT_FOCUS, frame, OBJID_CLIENT, CHILDID_SELF}), LastFocus());
+    }
+    // The toolbar menu closed: the button that opened it is announced again.
+    Key("F6");
+    Key("Right");
+    ModalSteps::Until([] {
+        if (!OpenMenu()) return false;
+        EndMenu();
+        return true;
+    });
+    events.clear();
+    Key("+F10");
+    PumpHost(100);
+    ModalSteps::Stop();
+    EXPECT_EQ((Event{EVENT_OBJECT_FOCUS, ResolveRoleWindow(pane, ROLE_ACTIVE), OBJID_CLIENT, 2}), LastFocus());
+}
+
+// While the toolbars have the keyboard, the keys they do not use are the
+// host's: its accelerators see them.
+TEST_F(AccessTest, KeysTheToolbarsDoNotUseGoOnToTheHost) {
+    Make("Tools", {1, 2});
+    Key("F6");
+    const struct {
+        UINT message;
+        WPARAM key;
+        UINT used;
+    } rows[] = {
+        {WM_KEYDOWN, VK_CONTROL, 0}, {WM_KEYDOWN, 'S', 0}, {WM_KEYUP, 'S', 0},
+        {WM_KEYDOWN, VK_DELETE, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1},
+    };
+    for (const auto &row : rows) {
+        MSG msg = {frame, row.message, row.key, 1, 0, {0, 0}};
+        EXPECT_EQ(row.used, QBR_TranslateToolbarKey(&msg)) << "message " << row.message << " key " << row.key;
+    }
+    EXPECT_EQ("Tools 1", Focus()) << "the host's keys left the keyboard in the toolbars";
+}
+
+// A radio group is read as radio buttons; the one that is on has no action.
+TEST_F(AccessTest, ARadioGroupIsReadAsRadioButtons) {
+    for (UINT id : {1u, 2u, 3u, 4u})
+        QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
+    QBR_SetRadioRange(manager, 1, 3, 2);
+    HWND pane = Make("Tools", {1, 2, 3, 4});
+    Reader reader(pane);
+    ASSERT_NE(nullptr, reader.object);
+    const struct {
+        LONG child, role;
+        const char *action;
+        HRESULT done;
+    } rows[] = {
+        {1, ROLE_SYSTEM_RADIOBUTTON, "Check", S_OK},
+        {2, ROLE_SYSTEM_RADIOBUTTON, "(none)", DISP_E_MEMBERNOTFOUND},
+        {4, ROLE_SYSTEM_CHECKBUTTON, "Check", S_OK},
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.child);
+        EXPECT_EQ(row.role, reader.Role(row.child));
+        EXPECT_EQ(row.action, reader.Action(row.child));
+        EXPECT_EQ(row.done, reader.object->accDoDefaultAction(Reader::Child(row.child)));
+    }
+}
+
+// Customising changes a toolbar's items as the platform's own lists do: the
+// item made or taken away, then the toolbar's new order.
+TEST_F(AccessTest, CustomisingAnnouncesTheItemsAndTheNewOrder) {
+    QBR_SetCustomize(1);
+    HWND a = Make("A", {1, 2, 3});
+    HWND b = Make("B", {4, 5});
+    UnhookWinEvent(hook);
+    hook = SetWinEventHook(EVENT_OBJECT_CREATE, EVENT_OBJECT_REORDER, nullptr, OnWinEvent, GetCurrentProcessId(), 0,
+                           WINEVENT_OUTOFCONTEXT);
+    auto centre = [](HWND pane, UINT index) {
+        const RECT r = ScreenItem(pane, index);
+        return POINT{(r.left + r.right) / 2, (r.top + r.bottom) / 2};
+    };
+    auto pastEnd = [](HWND pane, UINT last) {
+        const RECT r = ScreenItem(pane, last);
+        return POINT{r.right + 3, (r.top + r.bottom) / 2};
+    };
+    POINT away = {300, 300};
+    ClientToScreen(frame, &away);
+    HWND wa = ResolveRoleWindow(a, ROLE_ACTIVE);
+    const DWORD made = EVENT_OBJECT_CREATE, gone = EVENT_OBJECT_DESTROY, order = EVENT_OBJECT_REORDER;
+    struct Row {
+        const char *what;
+        HWND from;
+        POINT press, release;
+        UINT keys;
+        std::vector<Event> expected;
+    } const rows[] = {
+        {"move 1 to A's end", a, centre(a, 0), pastEnd(a, 2), 0,
+         {{gone, wa, OBJID_CLIENT, 1}, {order, wa, OBJID_CLIENT, 0}, {made, wa, OBJID_CLIENT, 3},
+          {order, wa, OBJID_CLIENT, 0}}},
+        {"copy 4 to A's end", b, centre(b, 0), pastEnd(a, 2), MK_CONTROL,
+         {{made, wa, OBJID_CLIENT, 4}, {order, wa, OBJID_CLIENT, 0}}},
+        {"remove 3 (A's second)", a, centre(a, 1), away, 0, {{gone, wa, OBJID_CLIENT, 2}, {order, wa, OBJID_CLIENT, 0}}},
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(row.what);
+        events.clear();
+        PlaceCursor(row.press);
+        HWND pressed = ResolveRoleWindow(row.from, ROLE_ACTIVE);
+        SendMessageA(pressed, WM_RBUTTONDOWN, MK_RBUTTON | row.keys, 0);
+        HWND holder = GetCapture() ? GetCapture() : pressed;
+        PlaceCursor(row.release);
+        SendMessageA(holder, WM_MOUSEMOVE, MK_RBUTTON | row.keys, 0);
+        SendMessageA(holder, WM_RBUTTONUP, 0, 0);
+        PumpFor(50);
+        EXPECT_EQ(row.expected, events);
+    }
+    EXPECT_EQ((std::vector<UINT>{2, 1, 4}), ToolbarIds(a));
+    EXPECT_EQ((std::vector<UINT>{4, 5}), ToolbarIds(b));
+}
+
 } // namespace

@@ -311,4 +311,48 @@ TEST_F(ChevronTest, ASideDockedToolbarIsCutOffAboveTheBottomDock) {
     QBR_DestroyToolbar(column);
 }
 
+// ---- What a reader hears of the chevron ------------------------------------------------
+
+std::vector<LONG> focusChildren;
+void CALLBACK OnFocusEvent(HWINEVENTHOOK, DWORD, HWND, LONG object, LONG child, DWORD, DWORD) {
+    if (object == OBJID_CLIENT) focusChildren.push_back(child);
+}
+
+// The chevron opens a menu: its action reads so, and when the menu closes
+// the chevron is announced again, as the keyboard is back on it.
+TEST_F(ChevronTest, TheChevronReadsOpenAndIsAnnouncedAgainWhenItsMenuCloses) {
+    CutAt(Item(1).right + kChevronSize);
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    PumpHost(50);
+    IAccessible *object = nullptr;
+    ASSERT_EQ(S_OK, AccessibleObjectFromWindow(pane, static_cast<DWORD>(OBJID_CLIENT), IID_IAccessible,
+                                               reinterpret_cast<void **>(&object)));
+    VARIANT child;
+    VariantInit(&child);
+    child.vt = VT_I4;
+    child.lVal = 9;
+    BSTR action = nullptr;
+    ASSERT_EQ(S_OK, object->get_accDefaultAction(child, &action));
+    EXPECT_EQ(std::wstring(L"Open"), std::wstring(action));
+    SysFreeString(action);
+    object->Release();
+
+    Key(VK_F6);
+    Key(VK_END);
+    HWINEVENTHOOK hook = SetWinEventHook(EVENT_OBJECT_FOCUS, EVENT_OBJECT_FOCUS, nullptr, OnFocusEvent,
+                                         GetCurrentProcessId(), 0, WINEVENT_OUTOFCONTEXT);
+    focusChildren.clear();
+    ModalSteps::Until([] {
+        if (!OpenMenu()) return false;
+        EndMenu();
+        return true;
+    });
+    Key(VK_RETURN);
+    PumpHost(100);
+    ModalSteps::Stop();
+    UnhookWinEvent(hook);
+    EXPECT_EQ(std::vector<LONG>{9}, focusChildren);
+}
+
 } // namespace

@@ -459,4 +459,47 @@ TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
     }
 }
 
+// ---- The status bar when its width changes ------------------------------------------------
+
+class StatusBarTest : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        if (!moduleInstance) moduleInstance = GetModuleHandleA(nullptr);
+        ASSERT_EQ(RegisterStatusBarClass(), 1u);
+        frame = CreateRecordingFrame();
+        bar = CreateStatusBar(frame);
+        ASSERT_NE(bar, nullptr);
+        Pump();
+    }
+    void TearDown() override {
+        DestroyWindow(frame);
+        DeleteStatusBarFont();
+        Pump();
+    }
+    HWND frame = nullptr, bar = nullptr;
+};
+
+// Widened or narrowed by SetWindowPos, the bar is painted whole again: no
+// panel edge stays where the old width put it, and the text stays.
+TEST_F(StatusBarTest, AChangeOfWidthPaintsTheWholeBarAgain) {
+    const COLORREF grey = RGB(0xC0, 0xC0, 0xC0), white = RGB(0xFF, 0xFF, 0xFF);
+    SetWindowPos(bar, nullptr, 0, 0, 200, 25, SWP_NOZORDER);
+    Pump();
+    const Pixels narrow = ReadWindowPixels(bar);
+    for (int w : {300, 240}) {
+        SCOPED_TRACE(w);
+        SetWindowPos(bar, nullptr, 0, 0, w, 25, SWP_NOZORDER | SWP_NOMOVE);
+        Pump();
+        const Pixels shown = ReadWindowPixels(bar);
+        ASSERT_EQ(w, shown.width);
+        EXPECT_EQ(grey, shown.At(200 - 5, 10)) << "the old right edge is gone";
+        EXPECT_EQ(white, shown.At(w - 5, 10)) << "the new right edge";
+        int sameText = 0;
+        for (int y = 5; y < 20; ++y)
+            for (int x = 10; x < 190; ++x)
+                sameText += shown.At(x, y) == narrow.At(x, y);
+        EXPECT_EQ(15 * 180, sameText) << "the text is as before";
+    }
+}
+
 } // namespace

@@ -424,4 +424,14 @@ TEST_F(DockPackTest, BottomDockPacksAsTheTopDockAndGrowsUpwards) {
     EXPECT_EQ(usable.bottom - CurrentButton().height, WindowRectInParent(left).bottom);
 }
 
+// ---- Faults of the API under bad use ----------------------------------------------
+
+TEST_F(DockTest, ASideOutsideTheFourMakesNoDock) {
+    for (UINT side : {4u, static_cast<UINT>(-1), 1000u}) {
+        SCOPED_TRACE(side);
+        EXPECT_EQ(nullptr, QBR_CreateDock(manager, frame, side));
+        EXPECT_EQ(nullptr, GetWindow(frame, GW_CHILD)) << "no window was made";
+    }
+}
+
 } // namespace

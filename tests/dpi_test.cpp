@@ -2,8 +2,10 @@
 // program three times: in the build folder's own prefix (96 DPI) and in its
 // 144- and 192-DPI prefixes (dpi144_dpi_test, dpi192_dpi_test), with
 // QBR_EXPECT_DPI telling it which scale it was started for.
+#include <algorithm>
 #include <cstdlib>
 
+#include "access/access.h"
 #include "harness.h"
 #include "quaybar.h"
 
@@ -480,4 +482,271 @@ TEST_F(ClientTest, AFloatingToolbarKeepsItsPlaceInProportionToTheScreen) {
     QBR_DestroyManager(b.manager);
     DestroyWindow(b.frame);
     Pump();
+}
+
+// The floating frame's caption at the frame's scale: the band as tall as the
+// caption font at this DPI makes it, the line under it, then the margin above
+// the items, read back from the screen.
+TEST_F(ScaleTest, TheFloatingCaptionBandAndTheMarginBelowIt) {
+    const Scaled &s = Here();
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2, 3}, TBF_VISIBLE | TBF_FLOATING);
+    Pump();
+    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+    RedrawWindow(frameWindow, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_FRAME);
+    Pixels shown = ReadWindowPixels(frameWindow);
+    // A 7-point font is MulDiv(7, dpi, 72) pixels high: its ascent grows with
+    // the scale (the exact ascent is the installed font's).
+    EXPECT_GE(captionHeight, MulDiv(7, s.dpi, 72) * 2 / 3);
+    const int x = shown.width - 2; // right of the centred title
+    std::vector<COLORREF> column, expected;
+    for (int y = 0; y < captionHeight + s.frameTop; ++y) {
+        column.push_back(shown.At(x, y));
+        expected.push_back(y < captionHeight - 1    ? GetSysColor(COLOR_ACTIVECAPTION)
+                           : y == captionHeight - 1 ? GetSysColor(COLOR_WINDOWFRAME)
+                                                    : GetSysColor(COLOR_BTNFACE));
+    }
+    EXPECT_EQ(expected, column);
+    // The first button's frame ring starts right below the margin.
+    EXPECT_EQ(GetSysColor(COLOR_WINDOWFRAME), shown.At(s.areaLeft + 3, captionHeight + s.frameTop));
+}
+
+// ---- The keyboard's focus at the frame's scale --------------------------------------------
+
+// The focus rectangle's lines are the platform's focus border (1 pixel here)
+// at the frame's scale: 1 at 96, 2 at 144 and 192.
+TEST_F(ScaleTest, TheFocusRectangleLinesGrowWithTheFramesScale) {
+    const Scaled &s = Here();
+    const int width = s.dpi == 96 ? 1 : 2;
+    ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
+    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_DOCKED);
+    SetForegroundWindow(frame);
+    SetFocus(frame);
+    PumpHost(50);
+    RECT item = {};
+    GetItemRect(RecordOfWindow(pane), 0, &item);
+    const Pixels before = ReadWindowPixels(pane);
+    for (DWORD flags : {DWORD{0}, DWORD{KEYEVENTF_KEYUP}}) {
+        INPUT in = {};
+        in.type = INPUT_KEYBOARD;
+        in.ki.wVk = VK_F6;
+        in.ki.dwFlags = flags;
+        SendInput(1, &in, sizeof in);
+        PumpHost(30);
+    }
+    UINT index = 9;
+    ASSERT_EQ(1u, AccessFocusedIndex(pane, &index)) << "F6 brought the keyboard";
+    const Pixels focused = ReadWindowPixels(pane);
+    // Rows from the top of the focus rectangle down, across its middle half:
+    // the line's rows have dots, the row below it none.
+    const int top = item.top + MulDiv(3, s.dpi, 96), left = (3 * item.left + item.right) / 4,
+              right = (item.left + 3 * item.right) / 4;
+    std::vector<int> dotted, expected;
+    for (int y = top; y <= top + width; ++y) {
+        int changed = 0;
+        for (int x = left; x < right; ++x)
+            changed += focused.At(x, y) != before.At(x, y);
+        dotted.push_back(changed > 0);
+        expected.push_back(y < top + width);
+    }
+    EXPECT_EQ(expected, dotted);
+    AccessLeaveKeyboard();
+}
+
+// ---- Rows, places and the screen across scales -------------------------------------
+
+namespace {
+
+// A floating toolbar's stored value, its frame sized for `across` buttons at
+// `dpi` and standing at (x, y): "n,ids...,flags,left,top,right,bottom".
+std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int x, int y, UINT flags = 33) {
+    const Scaled &s = At(dpi);
+    RECT borders = {0, 0, 0, 0}; // the frame's border as a system at that scale gives it
+    AdjustWindowRectExForDpi(&borders, WS_POPUP | WS_BORDER | WS_THICKFRAME, FALSE, 0, static_cast<UINT>(dpi));
+    std::string value = std::to_string(ids.size());
+    for (UINT id : ids)
+        value += "," + std::to_string(id);
+    const int width = 2 * s.areaLeft + across * (s.buttonWidth - 1) + 1 + borders.right - borders.left;
+    value += "," + std::to_string(flags) + "," + std::to_string(x) + "," + std::to_string(y) + "," +
+             std::to_string(x + width) + "," + std::to_string(y + 100);
+    return value;
+}
+
+// Applies a table in a new frame at `dpi` and gives the frame.
+DpiFrame ApplyAt(int dpi, const std::vector<std::pair<std::string, std::string>> &table) {
+    DpiFrame made = MakeDpiFrame();
+    if (dpi != ScreenDpi()) QBR_DpiChanged(made.frame, MAKEWPARAM(dpi, dpi), 0);
+    QBR_BeginLayout();
+    for (auto &entry : table)
+        QBR_AddLayoutEntry(entry.first.c_str(), entry.second.c_str());
+    QBR_ApplyLayout(made.manager, made.frame);
+    QBR_FreeLayout();
+    Pump();
+    return made;
+}
+
+} // namespace
+
+// One row of four and three rows of three with separators between the groups
+// keep their rows when a table written at one scale is read at another, and
+// when the frame then moves to another scale; each frame is as large as its
+// rows at the scale it ends at, and so the table written back holds them too.
+TEST_F(ClientTest, RowsOfFloatingToolbarsSurviveEveryChangeOfScale) {
+    const int here = Here().dpi, other = here == 96 ? 144 : here;
+    struct Case {
+        const char *name;
+        int written, read, after; // after: a live change of the reading frame; 0 none
+    };
+    const Case cases[] = {
+        {"written at 96, read at a larger scale", 96, other, 0},
+        {"written at a larger scale, read at 96", other, 96, 0},
+        {"read at 96, frame moved to a larger scale", 96, 96, other},
+        {"read at a larger scale, frame moved to 96", other, other, 96},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        std::vector<std::pair<std::string, std::string>> table;
+        if (c.written != 96)
+            table.emplace_back("Display Scale", std::to_string(c.written) + "," +
+                                                    std::to_string(GetSystemMetrics(SM_CXSCREEN)) + "," +
+                                                    std::to_string(GetSystemMetrics(SM_CYSCREEN)));
+        table.emplace_back("Top Dock", "Row,Grid");
+        table.emplace_back("Row", FloatingValue({1, 2, 3, 4}, 4, c.written, 300, 100));
+        table.emplace_back("Grid", FloatingValue({1, 2, 3, 0, 4, 5, 6, 0, 7, 8, 9}, 3, c.written, 300, 300));
+        DpiFrame made = ApplyAt(c.read, table);
+        if (c.after) QBR_DpiChanged(made.frame, MAKEWPARAM(c.after, c.after), 0);
+        Pump();
+        const Scaled &s = At(c.after ? c.after : c.read);
+        struct Expected {
+            std::vector<UINT> breaks;
+            int across, rows;
+        };
+        const Expected expected[] = {{{}, 4, 1}, {{4, 7}, 3, 3}};
+        for (UINT i = 0; i < 2; ++i) {
+            HWND pane = QBR_GetToolbar(made.manager, i);
+            EXPECT_EQ(expected[i].breaks, BreakIds(RecordOfWindow(pane)->floatingBreaks)) << "toolbar " << i;
+            EXPECT_EQ(Rect(0, 0, 2 * s.areaLeft + expected[i].across * (s.buttonWidth - 1) + 1,
+                           captionHeight + s.frameTop + expected[i].rows * s.buttonHeight + s.frameBottom),
+                      ClientRectOf(ResolveRoleWindow(pane, ROLE_FLOATING)))
+                << "toolbar " << i;
+        }
+        QBR_DestroyManager(made.manager);
+        DestroyWindow(made.frame);
+        Pump();
+    }
+}
+
+namespace {
+
+RECT WorkArea() {
+    RECT work;
+    SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0);
+    return work;
+}
+
+} // namespace
+
+// A floating frame with no part on any screen comes back inside the nearest
+// monitor's work area, when a layout is applied and when the display
+// changes; a frame with any part on a screen stays where it is, negative
+// coordinates and all (as on a monitor left of or above the primary one).
+TEST_F(ClientTest, FloatingFramesOffEveryScreenComeBackInsideTheWorkArea) {
+    const RECT work = WorkArea();
+    struct Case {
+        const char *name;
+        int x, y;         // where the table puts the frame
+        int wantX, wantY; // kEnd: the right edge on the work area's
+    };
+    constexpr int kEnd = -100000;
+    const Case cases[] = {
+        {"far right and above every screen", 5000, -3000, kEnd, static_cast<int>(work.top)},
+        {"left of every screen", -1500, 200, static_cast<int>(work.left), 200},
+        {"partly on the screen, left and above", -40, -20, -40, -20},
+        {"on the screen", 300, 100, 300, 100},
+    };
+    for (bool displayChange : {false, true}) {
+        std::vector<std::pair<std::string, std::string>> table = {{"Top Dock", "A,B,C,D"}};
+        const char *titles[] = {"A", "B", "C", "D"};
+        for (UINT i = 0; i < 4; ++i)
+            table.emplace_back(titles[i], FloatingValue({1, 2, 3, 4}, 4, ScreenDpi(), displayChange ? 300 : cases[i].x,
+                                                        displayChange ? 100 : cases[i].y));
+        DpiFrame made = ApplyAt(ScreenDpi(), table);
+        for (UINT i = 0; i < 4; ++i) {
+            SCOPED_TRACE(std::string(cases[i].name) + (displayChange ? ", display changed" : ", layout applied"));
+            HWND frame = ResolveRoleWindow(QBR_GetToolbar(made.manager, i), ROLE_FLOATING);
+            RECT r;
+            GetWindowRect(frame, &r);
+            if (displayChange) {
+                // The screen that held it is gone: the window system leaves it there.
+                SetWindowPos(frame, nullptr, cases[i].x, cases[i].y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+                SendMessageA(frame, WM_DISPLAYCHANGE, 32,
+                             MAKELPARAM(GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)));
+                Pump();
+            }
+            const int width = r.right - r.left;
+            GetWindowRect(frame, &r);
+            EXPECT_EQ(cases[i].wantX == kEnd ? work.right - width : cases[i].wantX, r.left);
+            EXPECT_EQ(cases[i].wantY, r.top);
+            EXPECT_EQ(width, r.right - r.left);
+            EXPECT_TRUE(IsWindowVisible(frame));
+        }
+        QBR_DestroyManager(made.manager);
+        DestroyWindow(made.frame);
+        Pump();
+    }
+}
+
+// A floating frame is never larger than the work area: a column too tall
+// wraps into more columns, a row too wide into more rows, each with as few
+// as fit, and every button lies inside the frame, on the screen: a frame that
+// had to be fitted low on the screen is moved up into the work area.
+TEST_F(ScaleTest, AFloatingFrameNeverOutgrowsTheWorkArea) {
+    const Scaled &s = Here();
+    const RECT work = WorkArea();
+    AddButtons(7, 54);
+    struct Case {
+        const char *name;
+        UINT count, across; // buttons, and how many across the frame is made for
+        UINT buttonText;
+        int y; // where the frame is made
+    };
+    const Case cases[] = {
+        {"one column of 40, made low on the screen", 40, 1, 0, static_cast<int>(work.bottom) - 100},
+        {"one row of 60", 60, 60, 0, 200},
+        {"one column of 12 with button text", 12, 1, 1, 200},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        QBR_SetButtonText(c.buttonText);
+        std::vector<UINT> ids;
+        for (UINT id = 1; id <= c.count; ++id)
+            ids.push_back(id);
+        const int bw = c.buttonText ? s.textWidth : s.buttonWidth, bh = c.buttonText ? s.textHeight : s.buttonHeight;
+        const int across = static_cast<int>(c.across) * (bw - 1) + 1 + 2 * s.areaLeft + 20;
+        HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_FLOATING, work.left, c.y, MulDiv(across, 96, s.dpi), 0,
+                                      top, ids.data(), c.count);
+        Pump();
+        HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT outer, client = ClientRectOf(frameWindow);
+        GetWindowRect(frameWindow, &outer);
+        EXPECT_TRUE(outer.left >= work.left && outer.top >= work.top && outer.right <= work.right &&
+                    outer.bottom <= work.bottom)
+            << outer << " in " << work;
+        std::vector<LONG> lefts, tops;
+        int cutOff = 0;
+        for (const RECT &r : ItemRects(pane)) {
+            if (r.right > client.right || r.bottom > client.bottom) ++cutOff;
+            if (std::find(lefts.begin(), lefts.end(), r.left) == lefts.end()) lefts.push_back(r.left);
+            if (std::find(tops.begin(), tops.end(), r.top) == tops.end()) tops.push_back(r.top);
+        }
+        EXPECT_EQ(0, cutOff) << "buttons beyond the frame's client area " << client;
+        const int columns = static_cast<int>(lefts.size()), rows = static_cast<int>(tops.size());
+        if (c.across == 1 && columns > 1) { // one column fewer would run past the work area
+            const int rowsThen = (static_cast<int>(c.count) + columns - 2) / (columns - 1);
+            EXPECT_GT(outer.bottom - outer.top + (rowsThen - rows) * bh, work.bottom - work.top) << columns;
+        }
+        if (c.across > 1) EXPECT_GT(outer.right - outer.left + bw - 1, work.right - work.left) << columns;
+        QBR_DestroyToolbar(pane);
+    }
+    QBR_SetButtonText(0);
 }

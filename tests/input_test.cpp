@@ -641,3 +641,40 @@ TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
 }
 
 } // namespace
+
+// ---- A toolbar takes the shape of the dock it is dropped into --------------------------
+
+// Dropped into a side dock a toolbar stands as one column at once, and back
+// in the top dock as one row: its pane has the size a new start gives it
+// there, its items and margins and the pane's border (96 DPI here).
+TEST_F(InputTest, ADroppedToolbarTakesTheShapeOfItsNewDock) {
+    HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
+    const int border = 2 * GetSystemMetrics(SM_CXBORDER);
+    const RECT column = Rect(0, 0, 6 + 24 + 6 + border, 3 + 3 * 22 + 4 + border); // rows stand edge to edge
+    const RECT row = Rect(0, 0, 6 + 3 * 23 + 1 + 6 + border, 3 + 22 + 4 + border);
+    struct Case {
+        const char *name;
+        UINT flags;
+        HWND *from, *to;
+        RECT shape;
+    } const cases[] = {
+        {"docked, from the top dock into the left one", TBF_DOCKED, &top, &left, column},
+        {"floating, into the right dock", TBF_FLOATING, &top, &right, column},
+        {"docked, from the left dock into the top one", TBF_DOCKED, &left, &top, row},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND anchor = Make({5, 6}); // keeps the top dock showing
+        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | c.flags, *c.from);
+        const POINT from = c.flags & TBF_FLOATING ? Caption(pane) : Empty(pane);
+        Down(from);
+        Move(Offset(from, 7, 9));
+        Move(InDock(*c.to));
+        Up(InDock(*c.to));
+        ASSERT_EQ(*c.to, GetParent(pane));
+        const RECT outer = WindowRectInParent(pane);
+        EXPECT_EQ(c.shape, Rect(0, 0, outer.right - outer.left, outer.bottom - outer.top));
+        QBR_DestroyToolbar(pane);
+        QBR_DestroyToolbar(anchor);
+    }
+}

@@ -200,6 +200,20 @@ TEST_F(ToolbarTest, EditsRefuseDoublesAndCleanSeparators) {
         CleanSeparators(RecordOfWindow(t));
         EXPECT_EQ(k.after, ToolbarIds(t));
     }
+    HWND as = Make({1, S});
+    RemoveItem(RecordOfWindow(as), Item(1));
+    EXPECT_TRUE(ToolbarIds(as).empty());
+
+    // A move inside a toolbar keeps its length and its size, not its item
+    // rectangles: the button that takes a separator's place has its width.
+    HWND moved = Make({1, S, 2, 3});
+    const std::vector<RECT> before = Rects(moved);
+    RemoveItem(RecordOfWindow(moved), Item(2));
+    InsertItemAt(RecordOfWindow(moved), 1, Item(2));
+    ASSERT_EQ((std::vector<UINT>{1, 2, S, 3}), ToolbarIds(moved));
+    const std::vector<RECT> after = Rects(moved);
+    EXPECT_EQ(before[2].right - before[2].left, after[1].right - after[1].left);
+    EXPECT_EQ(before[1].right - before[1].left, after[2].right - after[2].left);
 }
 
 // The two groups of the flag word: in each the first bit wins (visible over

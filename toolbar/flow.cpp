@@ -2,10 +2,11 @@
 // hit testing, painting, item rectangles, measuring, row breaks and re-wrapping.
 // No item position is stored anywhere; whoever needs one walks again.
 #include <algorithm>
+#include <unordered_map>
+#include <vector>
 
-#include "access/access.h"
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "dock/dock.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -19,19 +20,19 @@ namespace {
 enum class Wrap { None, NewRow, EdgeMoved };
 
 // When separators take no place at all, when one that wraps is dropped, and
-// the display scale every item is measured at.
+// the sizes at the display scale every item is measured at.
 struct FlowRules {
     bool skipSeparators;
     bool dropSeparators;
-    UINT dpi;
+    const ScaledMetrics *metrics;
 };
 
 // The differences between the members of the walk. Each member overrides
 // only what it changes; Place may stop the walk by returning true.
 struct FlowVisitor {
-    UINT dpi = kBaseDpi; // the walk's, set by FlowWalk
+    const ScaledMetrics *metrics = nullptr; // the walk's, set by FlowWalk
     virtual ~FlowVisitor() = default;
-    virtual bool Size(ToolbarItem *item, int *w, int *h) { return ItemGetSizeAt(item, dpi, w, h) != 0; }
+    virtual bool Size(ToolbarItem *item, int *w, int *h) { return ItemGetSizeAt(item, *metrics, w, h) != 0; }
     virtual void AfterRowHeight(ToolbarItem *, bool /*separator*/, int & /*h*/, int /*rowHeight*/) {}
     virtual Wrap WrapTest(ToolbarItem *, int x, int w, RECT &area) {
         return x + w > area.right ? Wrap::NewRow : Wrap::None;
@@ -44,7 +45,7 @@ struct FlowVisitor {
 // part. It is a reference because a drop measure may push its right edge out.
 void FlowWalk(const PointerList *items, RECT &area, const FlowRules &rules, FlowVisitor &visitor) {
     int x = area.left, y = area.top, rowHeight = 0;
-    visitor.dpi = rules.dpi;
+    visitor.metrics = rules.metrics;
     for (UINT i = 0; i < PointerListCount(items); ++i) {
         ToolbarItem *item = ListAt<ToolbarItem>(items, i);
         UINT kind;
@@ -72,12 +73,14 @@ void FlowWalk(const PointerList *items, RECT &area, const FlowRules &rules, Flow
 
 bool HasFlags(const ToolbarRecord *record, UINT flags) { return (record->flags & flags) == flags; }
 
-UINT ToolbarDpi(const ToolbarRecord *record) { return ManagerDpi(ManagerOfToolbar(record->paneWindow)); }
+const ScaledMetrics *ToolbarMetrics(const ToolbarRecord *record) {
+    return &ManagerMetrics(ManagerOfToolbar(record->paneWindow));
+}
 
 // The window on show goes by the record's flags.
 FlowRules ActiveRules(const ToolbarRecord *record) {
     return {HasFlags(record, TBF_FLOATING | TBF_NO_FLOAT_SEPARATORS), HasFlags(record, TBF_FLOATING),
-            ToolbarDpi(record)};
+            ToolbarMetrics(record)};
 }
 
 // Hit testing, painting and item rectangles describe the window on show.
@@ -90,7 +93,7 @@ void WalkActiveWindow(const ToolbarRecord *record, FlowVisitor &visitor) {
 // The measuring members go by the role they are given.
 FlowRules RoleRules(const ToolbarRecord *record, int role) {
     bool floating = role == ROLE_FLOATING;
-    return {floating && HasFlags(record, TBF_NO_FLOAT_SEPARATORS), floating, ToolbarDpi(record)};
+    return {floating && HasFlags(record, TBF_NO_FLOAT_SEPARATORS), floating, ToolbarMetrics(record)};
 }
 
 // Extents of the placed items, with an optional trailing-separator rule: a
@@ -110,7 +113,7 @@ struct ExtentVisitor : FlowVisitor {
         ToolbarItem *next = ListAt<ToolbarItem>(items, index + 1);
         UINT kind;
         int w, h;
-        if (!ItemGetKind(next, &kind) || !ItemGetSizeAt(next, dpi, &w, &h)) return false;
+        if (!ItemGetKind(next, &kind) || !ItemGetSizeAt(next, *metrics, &w, &h)) return false;
         if (kind == ITEM_BUTTON && nextButtonWidth) w = nextButtonWidth;
         return !(separator && nextX + w > bound->right);
     }
@@ -165,15 +168,16 @@ UINT PaintToolbarItems(HWND pane) {
     ToolbarRecord *record = pane ? RecordOfWindow(pane) : nullptr;
     if (!record) return 0;
     struct Painter : FlowVisitor {
-        const ToolbarRecord *record;
+        bool hasFocus = false; // the keyboard's focus is on this toolbar, at focused
+        UINT focused = 0;
         bool Place(UINT index, ToolbarItem *item, bool separator, const RECT &rect, int) override {
             if (separator) return false;
             PaintButton(item, &rect, 0);
-            if (AccessIsFocused(record, index)) PaintFocusRect(&rect);
+            if (hasFocus && index == focused) PaintFocusRect(&rect);
             return false;
         }
     } painter;
-    painter.record = record;
+    painter.hasFocus = roomCallbacks.focusedIndex && roomCallbacks.focusedIndex(record->paneWindow, &painter.focused);
     WalkActiveWindow(record, painter);
     return 1;
 }
@@ -187,23 +191,97 @@ struct ItemRectVisitor : FlowVisitor {
     }
 };
 
+// ---- The layout of the window on show ------------------------------------------
+// The item rectangles of a toolbar's window on show, as GetItemRect gives
+// them, made by one walk once the toolbar has been laid out and read until
+// it is laid out again: the chevron (which items it cuts off), the keyboard
+// and the screen readers ask for items one by one, and a walk for each would
+// make a pass over a toolbar cost a time quadratic in its items. Kept beside
+// the record rather than in it, since the record is a public C structure.
+// Besides a new layout, anything the rectangles follow (the window, its size,
+// the items, the flags, the scale, the button size) makes them be walked again.
+namespace {
+
+struct ShownLayout {
+    bool valid = false;
+    HWND window = nullptr;
+    RECT client = {};
+    const PointerList *items = nullptr;
+    UINT count = 0;
+    UINT flags = 0;
+    UINT dpi = 0;
+    int buttonWidth = 0, buttonHeight = 0;
+    std::vector<RECT> rects;  // by item index
+    std::vector<char> placed; // whether the walk placed the item
+    POINT extent = {0, 0};    // the right and bottom edges of the placed items
+};
+
+std::unordered_map<const ToolbarRecord *, ShownLayout> shownLayouts;
+
+const ShownLayout &LayoutOf(const ToolbarRecord *record) {
+    ShownLayout &layout = shownLayouts[record];
+    HWND window = ResolveRoleWindow(record->paneWindow, ROLE_ACTIVE);
+    RECT client = {};
+    if (window) GetClientRect(window, &client);
+    const UINT count = PointerListCount(record->items);
+    const ScaledMetrics &metrics = *ToolbarMetrics(record);
+    int bw = 0, bh = 0;
+    metrics.ButtonSize(&bw, &bh);
+    if (layout.valid && layout.window == window && EqualRect(&layout.client, &client) &&
+        layout.items == record->items && layout.count == count && layout.flags == record->flags &&
+        layout.dpi == metrics.dpi && layout.buttonWidth == bw && layout.buttonHeight == bh)
+        return layout;
+    layout.valid = true;
+    layout.window = window;
+    layout.client = client;
+    layout.items = record->items;
+    layout.count = count;
+    layout.flags = record->flags;
+    layout.dpi = metrics.dpi;
+    layout.buttonWidth = bw;
+    layout.buttonHeight = bh;
+    layout.rects.assign(count, RECT{});
+    layout.placed.assign(count, 0);
+    layout.extent = POINT{0, 0};
+    if (!window) return layout;
+    struct Recorder : ItemRectVisitor {
+        ShownLayout *layout;
+        bool Place(UINT i, ToolbarItem *, bool, const RECT &rect, int) override {
+            layout->rects[i] = rect;
+            layout->placed[i] = 1;
+            layout->extent.x = std::max(layout->extent.x, rect.right);
+            layout->extent.y = std::max(layout->extent.y, rect.bottom);
+            return false;
+        }
+    } recorder;
+    recorder.layout = &layout;
+    WalkActiveWindow(record, recorder);
+    return layout;
+}
+
+} // namespace
+
+void ForgetShownLayout(const ToolbarRecord *record, bool recordGoes) {
+    if (recordGoes) {
+        shownLayouts.erase(record);
+        return;
+    }
+    auto found = shownLayouts.find(record);
+    if (found != shownLayouts.end()) found->second.valid = false;
+}
+
 UINT GetItemRect(const ToolbarRecord *record, UINT index, RECT *outRect) {
     if (!record) return 0;
-    struct Finder : ItemRectVisitor {
-        UINT index;
-        RECT *out;
-        bool found = false;
-        bool Place(UINT i, ToolbarItem *, bool, const RECT &rect, int) override {
-            if (i != index) return false;
-            *out = rect;
-            found = true;
-            return true;
-        }
-    } finder;
-    finder.index = index;
-    finder.out = outRect;
-    WalkActiveWindow(record, finder);
-    return finder.found ? 1 : 0;
+    const ShownLayout &layout = LayoutOf(record);
+    if (index >= layout.count || !layout.placed[index]) return 0;
+    *outRect = layout.rects[index];
+    return 1;
+}
+
+UINT ShownItemsExtent(const ToolbarRecord *record, POINT *extent) {
+    if (!record) return 0;
+    *extent = LayoutOf(record).extent;
+    return 1;
 }
 
 // Natural sizes: the toolbar with nothing wrapped, along or across.
@@ -216,7 +294,7 @@ static UINT NaturalSize(HWND pane, bool vertical, int *outWidth, int *outHeight)
         ToolbarItem *item = ListAt<ToolbarItem>(record->items, i);
         UINT kind;
         int w, h;
-        if (!ItemGetKind(item, &kind) || !ItemGetSizeAt(item, rules.dpi, &w, &h)) continue;
+        if (!ItemGetKind(item, &kind) || !ItemGetSizeAt(item, *rules.metrics, &w, &h)) continue;
         if (kind == ITEM_SEPARATOR && rules.skipSeparators) continue;
         along += (vertical ? h : w) - 1;
         across = std::max(across, vertical ? w : h);
@@ -240,7 +318,7 @@ UINT MeasureToFit(HWND pane, int role, RECT *rect) {
     if (!record) return 0;
     if (!PointerListCount(record->items)) {
         int w = 0, h = 0;
-        GetButtonSizesAt(ToolbarDpi(record), &w, &h, nullptr, nullptr);
+        if (CurrentClient()) ToolbarMetrics(record)->ButtonSize(&w, &h);
         OneButton(rect, w, h);
         return 1;
     }
@@ -286,6 +364,8 @@ UINT MeasureAfterDrop(HWND pane, int role, ToolbarItem *dropped, RECT *rect) {
 UINT ComputeRowBreaks(HWND window, int role) {
     ToolbarRecord *record = window ? RecordOfWindow(window) : nullptr;
     if (!record) return 0;
+    // A new layout: the rectangles of the window on show are walked again.
+    ForgetShownLayout(record, false);
     PointerList *&breaks = role == ROLE_FLOATING ? record->floatingBreaks : record->dockedBreaks;
     PointerListDestroy(breaks);
     breaks = PointerListCreate(3, 3, 0);
@@ -330,7 +410,7 @@ UINT RewrapForMetrics(HWND window, int role, int newWidth, int newHeight, RECT *
                 *h = newHeight;
                 return true;
             }
-            return ItemGetSizeAt(item, dpi, w, h) != 0;
+            return ItemGetSizeAt(item, *metrics, w, h) != 0;
         }
         Wrap WrapTest(ToolbarItem *item, int, int, RECT &) override {
             ToolbarItem *nextBreak = ListAt<ToolbarItem>(breaks, nextBreakIndex);

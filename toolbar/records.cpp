@@ -1,8 +1,7 @@
 // Toolbar records, their flag word and their item lists. Every edit of the
 // item list ends in a refit of both windows of the toolbar.
-#include "access/access.h"
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "dock/dock.h"
 #include "toolbar/toolbar.h"
 
 // ---- Records ----------------------------------------------------------------
@@ -49,8 +48,9 @@ UINT CreateToolbarRecord(HWND pane) {
 void DestroyToolbarRecord(ToolbarRecord *record) {
     if (!record) return;
     ToolbarManager *manager = ManagerOfToolbar(record->paneWindow);
-    AccessForgetToolbar(record);
-    if (DockArea *dock = FindDockRecord(record->dockWindow)) RemoveToolbarFromDock(dock, record);
+    // The keyboard lets go of it, and it leaves its dock, which packs again.
+    if (roomCallbacks.toolbarForgotten) roomCallbacks.toolbarForgotten(record);
+    if (roomCallbacks.toolbarLeavesDock) roomCallbacks.toolbarLeavesDock(record);
     PointerListDestroy(record->items);
     PointerListDestroy(record->floatingBreaks);
     PointerListDestroy(record->dockedBreaks);
@@ -58,6 +58,7 @@ void DestroyToolbarRecord(ToolbarRecord *record) {
     // A later window may get this pane's handle: the lookup cache must not
     // hand it this toolbar's manager.
     ForgetToolbarWindow(record->paneWindow);
+    ForgetShownLayout(record, true);
     MemoryBlockFree(record);
 }
 
@@ -66,6 +67,7 @@ UINT SetToolbarItems(ToolbarRecord *record, const UINT *ids, UINT idCount) {
     ToolbarManager *manager = ManagerOfToolbar(record->paneWindow);
     PointerListDestroy(record->items);
     record->items = PointerListCreate(idCount, 5, 0);
+    ForgetShownLayout(record, false);
     for (UINT i = 0; manager && i < idCount; ++i) {
         // An id the catalog lacks shortens the toolbar; id 0 is a separator.
         if (ToolbarItem *item = ItemFindById(manager->items, ids[i])) PointerListAppend(record->items, ListValue(item));
@@ -107,36 +109,6 @@ void ApplyToolbarFlags(ToolbarRecord *record, UINT flags) {
 }
 
 // ---- Public toolbar calls -------------------------------------------------------
-
-extern "C" HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock,
-                                  const UINT *ids, UINT idCount) {
-    DockArea *dockRecord = FindDockRecord(dock);
-    if (!dockRecord) return nullptr;
-    HWND pane = CreateToolbarWindows(dock, name ? name : "");
-    if (!pane) return nullptr;
-    ToolbarManager *manager = ManagerOfToolbar(pane);
-    ToolbarRecord *record = manager ? FindToolbarRecord(manager->toolbars, pane) : nullptr;
-    if (!record) return nullptr;
-    // From here on the record says floating or docked, before any window shows.
-    record->flags = flags;
-    SetToolbarItems(record, ids, idCount);
-    if (!InsertToolbarBefore(dockRecord, nullptr, record)) return nullptr;
-    // x, y, width and height are always the floating frame's, in screen
-    // coordinates; the pane's place is the dock's business. A width is a
-    // wrapping width: the refit below sets the height the rows need.
-    // The wrapping width and height are 96-DPI sizes, as the host's button
-    // metrics are: the same call gives the same rows at every scale.
-    width = ScaleToDpi(width, ManagerDpi(manager));
-    height = ScaleToDpi(height, ManagerDpi(manager));
-    RECT present;
-    GetToolbarWindowRect(pane, ROLE_FLOATING, &present);
-    RECT target = {x, y, width >= 1 ? x + width : x + (present.right - present.left),
-                   height >= 1 ? y + height : y + (present.bottom - present.top)};
-    MoveToolbarWindow(pane, ROLE_FLOATING, &target);
-    RefitToolbar(pane, ROLE_FLOATING);
-    ApplyToolbarFlags(record, flags);
-    return pane;
-}
 
 extern "C" void QBR_DestroyToolbar(HWND pane) {
     if (!pane) return;
@@ -270,4 +242,12 @@ UINT CleanSeparators(ToolbarRecord *record) {
     UINT count = PointerListCount(items);
     if (count && IsSeparator(ItemAt(record, count - 1))) PointerListRemoveAt(items, count - 1);
     return 1;
+}
+
+bool IsEnabledButton(const ToolbarRecord *record, UINT index) {
+    const ToolbarItem *item = ItemAt(record, index);
+    UINT kind = ITEM_SEPARATOR;
+    if (!ItemGetKind(item, &kind) || kind != ITEM_BUTTON) return false;
+    const auto *data = static_cast<const ButtonData *>(ItemGetData(item));
+    return data && ButtonIsEnabled(data);
 }

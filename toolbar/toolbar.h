@@ -2,7 +2,7 @@
 // windows of each toolbar. What the rest of the library may call.
 #pragma once
 
-#include "qbr_records.h"
+#include "core/core.h"
 
 // Which window of a toolbar's pair an operation means.
 enum WindowRole : int {
@@ -48,6 +48,11 @@ UINT PointInRectInclusive(const RECT *rect, int x, int y);
 ToolbarItem *HitTestToolbar(HWND pane, int x, int y, UINT *outId, RECT *outRect);
 UINT PaintToolbarItems(HWND pane);
 UINT GetItemRect(const ToolbarRecord *record, UINT index, RECT *outRect);
+// The right and bottom edges of the items that GetItemRect places.
+UINT ShownItemsExtent(const ToolbarRecord *record, POINT *extent);
+// The stored item rectangles of a toolbar are walked again at their next
+// reading (a layout is under way), or dropped with the record.
+void ForgetShownLayout(const ToolbarRecord *record, bool recordGoes);
 UINT NaturalSizeHorizontal(HWND pane, int *outWidth, int *outHeight);
 UINT NaturalSizeVertical(HWND pane, int *outWidth, int *outHeight);
 UINT MeasureToFit(HWND pane, int role, RECT *rect);
@@ -76,9 +81,14 @@ void MoveToolbarWindow(HWND window, int role, const RECT *rect);
 void SizeToolbarToContent(HWND window, int role, const RECT *rect);
 void RepaintToolbarWindow(HWND window, int role, const RECT *rect);
 UINT SizeToolbarWindows(HWND window);
+// Gives a pane the shape of its dock (a column at the side, a row across),
+// as a new toolbar there has: after it moved to a dock of the other kind.
+UINT ShapePaneForDock(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);
+// Brings a floating frame that lies on no monitor into the nearest work area.
+void KeepFloatingFrameOnScreen(HWND frame);
 // Timers of a floating frame shown while its owner was hidden: the first
 // waits for the owner to show, the second lets it settle before the frame
 // goes back above it.
@@ -95,34 +105,32 @@ void WatchHostActivation();
 void UnwatchHostActivation();
 UINT SwitchToFloating(HWND window);
 UINT SwitchToDocked(HWND window);
-UINT RewrapAllManagers(int newWidth, int newHeight);
-UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight);
-UINT RelayoutAllManagers();
-UINT RelayoutManagerToolbars(ToolbarManager *manager);
-// Measures a manager's toolbars again for another display scale, each
-// keeping its items and rows; 0 when the scale is 0 or unchanged.
-UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi);
 
 void ScreenRectToClient(HWND window, RECT *rect);
 void ClientRectToScreen(HWND window, RECT *rect);
 void ScreenPointToClient(HWND window, int *x, int *y);
 void ClientPointToScreen(HWND window, int *x, int *y);
 
-// Item-area margins of the two windows, inside their client rectangles:
-//
-//   pane                               floating frame
-//   +-------------------------+        +-------------------------+
-//   |   3                     |        | caption band            |
-//   | 6 [ items ...       ] 6 |        |   captionHeight + 3     |
-//   |   4                     |        | 6 [ items ...       ] 6 |
-//   +-------------------------+        |   3                     |
-//                                      +-------------------------+
-constexpr int kAreaLeft = 6;
-constexpr int kAreaRight = 6;
-constexpr int kPaneAreaTop = 3;
-constexpr int kPaneAreaBottom = 4;
-constexpr int kFrameAreaTop = 3; // below the caption band
-constexpr int kFrameAreaBottom = 3;
-// The margins above at the display scale of the toolbar's frame (top, for
-// the floating frame, with the caption band): left, top, right, bottom.
+// The item-area margins of a toolbar window (kAreaLeft and the rest) at the
+// display scale of its frame (top, for the floating frame, with the caption
+// band): left, top, right, bottom.
 RECT AreaMargins(HWND window, int role);
+
+// ---- The chevron ----------------------------------------------------------------
+// The chevron of a docked toolbar cut off at the edge of its host's usable
+// area: its rectangle in the pane's client coordinates (0 when there is none),
+// whether the item at `index` is under it or past it, its painting, and
+// whether a point of `window` is on it.
+UINT ChevronRect(const ToolbarRecord *record, RECT *rect);
+bool IsItemCutOff(const ToolbarRecord *record, UINT index);
+void PaintChevron(HWND window, HDC dc);
+UINT InChevron(HWND window, int x, int y);
+
+// ---- Painting and buttons --------------------------------------------------------
+// A toolbar window as a whole, on WM_PAINT.
+void PaintToolbar(HWND window);
+// A button's place on every toolbar that shows it is painted again, and the
+// screen readers hear of the change.
+void RepaintItem(ToolbarManager *manager, ToolbarItem *item);
+// Whether the item at `index` is a button that can be pressed.
+bool IsEnabledButton(const ToolbarRecord *record, UINT index);

@@ -4,10 +4,8 @@
 #include <algorithm>
 #include <initializer_list>
 
-#include "access/access.h"
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "dock/dock.h"
-#include "input/input.h"
 #include "paint/paint.h"
 #include "toolbar/toolbar.h"
 
@@ -90,6 +88,12 @@ HWND DockOfToolbar(HWND window) {
     return pane ? GetParent(pane) : nullptr;
 }
 
+// The toolbar's dock packs again, through the dock room.
+static UINT RelayoutDockOf(HWND window) {
+    HWND dock = DockOfToolbar(window);
+    return roomCallbacks.relayoutDock ? roomCallbacks.relayoutDock(dock) : 1;
+}
+
 UINT IsSideDocked(HWND window) {
     UINT side;
     return GetDockSide(DockOfToolbar(window), &side) && !IsAcrossDock(side) ? 1 : 0;
@@ -103,7 +107,7 @@ HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
     if (!GetClassInfoA(instance, kToolbarClassName, &wc)) {
         wc = WNDCLASSA{};
         wc.style = CS_DBLCLKS;
-        wc.lpfnWndProc = ToolbarWindowProc;
+        wc.lpfnWndProc = roomCallbacks.toolbarWindowProc;
         wc.cbWndExtra = sizeof(LONG_PTR); // the twin window
         wc.hInstance = instance;
         wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
@@ -166,13 +170,12 @@ void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
 }
 
 RECT AreaMargins(HWND window, int role) {
-    const UINT dpi = ManagerDpi(ManagerOfToolbar(window));
-    if (role == ROLE_DOCKED)
-        return RECT{ScaleToDpi(kAreaLeft, dpi), ScaleToDpi(kPaneAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
-                    ScaleToDpi(kPaneAreaBottom, dpi)};
+    const ScaledMetrics &metrics = ManagerMetrics(ManagerOfToolbar(window));
+    if (role == ROLE_DOCKED) return metrics.paneMargins;
     // The caption band is the caption font's, which already has the screen's scale.
-    return RECT{ScaleToDpi(kAreaLeft, dpi), captionHeight + ScaleToDpi(kFrameAreaTop, dpi), ScaleToDpi(kAreaRight, dpi),
-                ScaleToDpi(kFrameAreaBottom, dpi)};
+    RECT margins = metrics.frameMargins;
+    margins.top += captionHeight;
+    return margins;
 }
 
 void GetItemArea(HWND window, int role, RECT *rect) {
@@ -228,27 +231,33 @@ void MoveToolbarWindow(HWND window, int role, const RECT *rect) {
     ComputeRowBreaks(target, role);
 }
 
-void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
-    if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
-    if (!target) return;
+// Whatever a window spends outside its item area stays the same whatever its
+// size: the margins inside the client area, and the borders outside it. A
+// user can size a floating frame down to less than its own borders; its
+// client area is then empty and tells nothing of them, so the borders are
+// never taken smaller than the platform gives for the window's style.
+static SIZE OutsideItemArea(HWND target, int role) {
     RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
-    if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
-    // Whatever the window spends outside its item area stays the same: the
-    // margins inside the client area, and the borders outside it. A user can
-    // size a floating frame down to less than its own borders; its client
-    // area is then empty and tells nothing of them, so the borders are never
-    // taken smaller than the platform gives for the window's style.
     GetClientRect(target, &client);
     RECT borders = {0, 0, 0, 0};
     AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
                        static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
     const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
     const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
-    RECT size = {0, 0, Width(*rect) + outsideW + Width(client) - Width(area),
-                 Height(*rect) + outsideH + Height(client) - Height(area)};
+    return SIZE{outsideW + Width(client) - Width(area), outsideH + Height(client) - Height(area)};
+}
+
+void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
+    if (!SettleRole(window, role)) return;
+    HWND target = ResolveRoleWindow(window, role);
+    if (!target) return;
+    RECT area;
+    GetItemArea(target, role, &area);
+    if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
+    const SIZE outside = OutsideItemArea(target, role);
+    RECT size = {0, 0, Width(*rect) + outside.cx, Height(*rect) + outside.cy};
     PlaceWindow(target, size, false, true);
 }
 
@@ -261,22 +270,99 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     UpdateWindow(target);
 }
 
+// ---- The screen --------------------------------------------------------------------
+
+// The work area of the monitor nearest to a rectangle: the screen less the
+// taskbar and the like.
+static RECT NearestWorkArea(const RECT &rect) {
+    MONITORINFO info = {};
+    info.cbSize = sizeof info;
+    HMONITOR monitor = MonitorFromRect(&rect, MONITOR_DEFAULTTONEAREST);
+    if (monitor && GetMonitorInfoA(monitor, &info)) return info.rcWork;
+    RECT work;
+    if (!SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0))
+        work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    return work;
+}
+
+// Moves a window into the nearest work area by the shortest way, its size kept.
+static void MoveIntoWorkArea(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    const RECT work = NearestWorkArea(r);
+    const int x = std::max<int>(work.left, std::min<int>(r.left, work.right - Width(r)));
+    const int y = std::max<int>(work.top, std::min<int>(r.top, work.bottom - Height(r)));
+    if (x != r.left || y != r.top)
+        SetWindowPos(window, nullptr, x, y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+// A floating frame is never larger than the work area of its monitor, so
+// that every button can be reached: a toolbar too wide for it wraps into
+// more rows, one too tall takes one more column at a time until it fits.
+// `given` is the item area the measure started from, `measured` its result,
+// measured again here when it does not fit. True when it did not.
+static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *measured) {
+    RECT outer;
+    GetWindowRect(frame, &outer);
+    const RECT work = NearestWorkArea(outer);
+    const SIZE outside = OutsideItemArea(frame, ROLE_FLOATING);
+    const int mostWidth = Width(work) - outside.cx, mostHeight = Height(work) - outside.cy;
+    if (Width(*measured) <= mostWidth && Height(*measured) <= mostHeight) return false;
+    int buttonWidth = 0;
+    GetButtonSizesAt(ManagerDpi(ManagerOfToolbar(pane)), &buttonWidth, nullptr, nullptr, nullptr);
+    const int column = std::max(buttonWidth - 1, 1); // neighbours share one pixel column
+    for (int width = std::min(Width(given), mostWidth);; width = std::min(width + column, mostWidth)) {
+        *measured = RECT{given.left, given.top, given.left + width, given.bottom};
+        MeasureToFit(pane, ROLE_FLOATING, measured);
+        if (Height(*measured) <= mostHeight || width >= mostWidth) return true;
+    }
+}
+
+// Any part of a frame on any monitor keeps it where it is, however negative
+// its coordinates (a monitor may stand left of or above the primary one). A
+// frame on no monitor at all, stored on one that is gone or moved there
+// before the display changed, comes into the nearest work area by the
+// shortest way, its size kept.
+void KeepFloatingFrameOnScreen(HWND frame) {
+    if (!IsFloatingFrame(frame)) return;
+    RECT r;
+    GetWindowRect(frame, &r);
+    if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
+    MoveIntoWorkArea(frame);
+}
+
 // ---- Sizing and refits -------------------------------------------------------------
 
-UINT SizeToolbarWindows(HWND window) {
-    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
-    int width, height;
-    UINT ok =
-        IsSideDocked(pane) ? NaturalSizeVertical(pane, &width, &height) : NaturalSizeHorizontal(pane, &width, &height);
-    if (!ok) return 0;
-    // The margins of the item areas, plus what WS_BORDER takes around the
-    // pane and WS_THICKFRAME around the frame: each item area comes out
-    // exactly the natural size.
+// The natural size of a toolbar in its dock: one column in a side dock, one
+// row across the frame.
+static UINT NaturalSizeInDock(HWND pane, int *width, int *height) {
+    return IsSideDocked(pane) ? NaturalSizeVertical(pane, width, height) : NaturalSizeHorizontal(pane, width, height);
+}
+
+// The margins of the pane's item area, plus what WS_BORDER takes around it:
+// the item area comes out exactly the natural size.
+static void SizePaneToNatural(HWND pane, int width, int height) {
     const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
     RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
                      height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
     PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
+}
+
+UINT ShapePaneForDock(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!pane || !NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    return RefitToolbar(pane, ROLE_DOCKED);
+}
+
+UINT SizeToolbarWindows(HWND window) {
+    HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
+    int width, height;
+    if (!NaturalSizeInDock(pane, &width, &height)) return 0;
+    SizePaneToNatural(pane, width, height);
+    // And what WS_THICKFRAME takes around the frame.
     const RECT frameMargins = AreaMargins(pane, ROLE_FLOATING);
     RECT frameSize = {0, 0, width + frameMargins.left + frameMargins.right + 2 * GetSystemMetrics(SM_CXFRAME),
                       height + frameMargins.top + frameMargins.bottom + 2 * GetSystemMetrics(SM_CYFRAME)};
@@ -288,6 +374,8 @@ UINT SizeToolbarWindows(HWND window) {
 
 // The refit of one window, with the measure that a plain refit or a drop uses.
 static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
+    // Every edit of the items comes through here.
+    if (ToolbarRecord *record = RecordOfWindow(window)) ForgetShownLayout(record, false);
     if (role == ROLE_BOTH) {
         if (!Refit(window, ROLE_FLOATING, dropped, forDrop)) return 0;
         role = ROLE_DOCKED;
@@ -298,14 +386,17 @@ static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
     RECT area;
     GetItemArea(target, role, &area);
     HWND pane = ResolveRoleWindow(target, ROLE_DOCKED);
+    const RECT given = area;
     UINT measured = forDrop ? MeasureAfterDrop(pane, role, dropped, &area) : MeasureToFit(pane, role, &area);
     if (!measured) return 0;
+    const bool fitted = role == ROLE_FLOATING && FitWithinWorkArea(target, pane, given, &area);
     SizeToolbarToContent(target, role, &area);
+    if (fitted) MoveIntoWorkArea(target);
     ComputeRowBreaks(target, role);
     RepaintToolbarWindow(target, role, nullptr);
     // By the toolbar's state, not the role: a refit of the hidden frame of a
     // docked toolbar lays the dock out too.
-    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDock(DockOfToolbar(target));
+    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDockOf(target);
     return 1;
 }
 
@@ -436,7 +527,8 @@ static HHOOK activationHook = nullptr;
 static UINT activationWatchers = 0;
 
 static void OnWindowActivating(HWND window) {
-    AccessWindowActivating(window); // the keyboard stays with the toolbars only while their frame is active
+    // The keyboard stays with the toolbars only while their frame is active.
+    if (roomCallbacks.windowActivating) roomCallbacks.windowActivating(window);
     ToolbarClient *client = CurrentClient();
     if (!client) return;
     for (UINT i = 0; ToolbarManager *manager = ListAt<ToolbarManager>(client->managers, i); ++i)
@@ -467,7 +559,7 @@ UINT ShowToolbarWindow(HWND window, UINT show) {
         ShowWithoutActivating(target);
     else
         ShowWindow(target, SW_HIDE);
-    return RelayoutDock(DockOfToolbar(target));
+    return RelayoutDockOf(target);
 }
 
 static UINT Switch(HWND window, bool toFloating) {
@@ -479,96 +571,8 @@ static UINT Switch(HWND window, bool toFloating) {
     if (IsWindowVisible(shown) || (QBR_GetToolbarFlags(pane) & TBF_HIDDEN)) return 1;
     ShowWindow(hidden, SW_HIDE);
     ShowWithoutActivating(shown);
-    return RelayoutDock(DockOfToolbar(pane));
+    return RelayoutDockOf(pane);
 }
 
 UINT SwitchToFloating(HWND window) { return Switch(window, true); }
 UINT SwitchToDocked(HWND window) { return Switch(window, false); }
-
-// ---- New button size ---------------------------------------------------------------
-
-UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight) {
-    if (!manager) return 0;
-    // The new size is given at 96 DPI, as the host gives its metrics.
-    const UINT dpi = ManagerDpi(manager);
-    newWidth = ScaleToDpi(newWidth, dpi);
-    newHeight = ScaleToDpi(newHeight, dpi);
-    for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
-        HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
-        for (int role : {ROLE_FLOATING, ROLE_DOCKED}) {
-            RECT area;
-            GetItemArea(pane, role, &area);
-            RewrapForMetrics(pane, role, newWidth, newHeight, &area);
-            SizeToolbarToContent(pane, role, &area);
-        }
-    }
-    return 1;
-}
-
-// Every dock is packed once, after all toolbars are refitted: packing it again
-// for each of its toolbars would move and paint its panes once per toolbar (a
-// dock of 40 took 40 packs), and only the last packing would stay on the
-// screen. The top and bottom docks go first, since the side docks lie
-// between them.
-UINT RelayoutManagerToolbars(ToolbarManager *manager) {
-    if (!manager) return 0;
-    {
-        DeferDockPacking deferred;
-        for (UINT i = 0; i < PointerListCount(manager->toolbars); ++i) {
-            HWND pane = ListAt<ToolbarRecord>(manager->toolbars, i)->paneWindow;
-            RefitToolbar(pane, ROLE_BOTH);
-            ComputeRowBreaks(pane, ROLE_FLOATING);
-            ComputeRowBreaks(pane, ROLE_DOCKED);
-        }
-    }
-    for (bool top : {true, false})
-        for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
-            if (IsAcrossDock(dock->side) == top) PackDock(dock);
-    return 1;
-}
-
-// ---- New display scale -----------------------------------------------------------
-
-UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
-    if (!manager || !dpi || dpi == ManagerDpi(manager)) return 0;
-    // As for a new button size: the rows come from the break lists the old
-    // scale made, so the rewrap runs at the new scale before the relayout.
-    int width = 0, height = 0;
-    GetButtonSizes(&width, &height, nullptr, nullptr);
-    manager->dpi = dpi;
-    RewrapManagerToolbars(manager, width, height);
-    if (manager->imageResource) ChooseImageStrip(manager);
-    RelayoutManagerToolbars(manager);
-    return 1;
-}
-
-extern "C" UINT QBR_DpiChanged(HWND frame, WPARAM wParam, LPARAM lParam) {
-    ToolbarClient *client = CurrentClient();
-    if (!client || !frame) return 0;
-    ToolbarManager *manager = nullptr;
-    for (UINT i = 0; ToolbarManager *m = ListAt<ToolbarManager>(client->managers, i); ++i)
-        if (m->frame == frame) manager = m;
-    if (!manager) return 0;
-    RescaleManagerToolbars(manager, HIWORD(wParam));
-    if (const RECT *suggested = reinterpret_cast<const RECT *>(lParam))
-        SetWindowPos(frame, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
-                     suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
-    return 1;
-}
-
-// Both walk every manager of the client in list order.
-static UINT ForEachManager(UINT (*action)(ToolbarManager *, int, int), int w, int h) {
-    ToolbarClient *client = CurrentClient();
-    if (!client) return 0;
-    for (UINT i = 0; i < PointerListCount(client->managers); ++i)
-        action(ListAt<ToolbarManager>(client->managers, i), w, h);
-    return 1;
-}
-
-UINT RewrapAllManagers(int newWidth, int newHeight) {
-    return ForEachManager(RewrapManagerToolbars, newWidth, newHeight);
-}
-
-UINT RelayoutAllManagers() {
-    return ForEachManager([](ToolbarManager *m, int, int) { return RelayoutManagerToolbars(m); }, 0, 0);
-}

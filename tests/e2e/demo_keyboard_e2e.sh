@@ -24,7 +24,7 @@ for t in Standard Style Align Palette; do grep -qx "toolbar \"$t\"" <<<"$list" |
 expect_item Standard New '  1 push "New" focusable "Press"'
 expect_item Standard Cut '  5 push "Cut" unavailable "Press"'
 expect_item Style Bold '  1 check "Bold" mixed,focusable "Check"'
-expect_item Style Left '  5 check "Left" checked,focusable "Uncheck"'
+expect_item Style Left '  5 radio "Left" checked,focusable ""'
 [ "$(grep -c '^  ' <<<"$list")" = 37 ] || fail "37 items in all: $list"
 expect_focus none "a mouse user sees nothing new"
 
@@ -44,8 +44,8 @@ keys Right space
 expect_item Style Italic '  2 check "Italic" checked,focusable,focused "Uncheck"'
 keys End Return
 expect_focus "Style: Justified" "End"
-expect_item Style Justified '  8 check "Justified" checked,focusable,focused "Uncheck"'
-expect_item Style Left '  5 check "Left" focusable "Check"'
+expect_item Style Justified '  8 radio "Justified" checked,focusable,focused ""'
+expect_item Style Left '  5 radio "Left" focusable "Check"'
 
 # Tab on to the floating toolbars in the manager's order; Down in the Palette
 # goes to the button below.

@@ -60,6 +60,8 @@ std::string Role(IAccessible *object, LONG id) {
         return "push";
     case ROLE_SYSTEM_CHECKBUTTON:
         return "check";
+    case ROLE_SYSTEM_RADIOBUTTON:
+        return "radio";
     case ROLE_SYSTEM_SEPARATOR:
         return "separator";
     case ROLE_SYSTEM_BUTTONMENU:

@@ -1,9 +1,9 @@
 // The toolbar menu: a right press on a toolbar's empty space or on a dock
 // lists every toolbar of the frame, to show or hide it, offers the Insert
 // Toolbar Item dialog and, for a toolbar the user made, its deletion.
+#include "command/command.h"
+#include "core/callbacks.h"
 #include "core/core.h"
-#include "customize/customize.h"
-#include "input/input.h"
 #include "toolbar/toolbar.h"
 
 namespace {
@@ -105,8 +105,7 @@ void OnToolbarCommand(HWND window, UINT id) {
     ToolbarManager *manager = ManagerOfToolbar(window);
     switch (id) {
     case kInsertItemCommand:
-        if (manager)
-            DialogBoxParamA(moduleInstance, "QBR_Insert", window, InsertDialogProc, reinterpret_cast<LPARAM>(manager));
+        if (manager && roomCallbacks.insertDialog) roomCallbacks.insertDialog(window, manager);
         break;
     case kDeleteToolbarCommand:
         AskAndDeleteToolbar(window);
