@@ -284,6 +284,20 @@ void ChooseInsertTarget(HWND owner, ToolbarManager *manager) {
 
 } // namespace
 
+bool DialogControlColor(UINT message, WPARAM wParam, INT_PTR *answer) {
+    switch (message) {
+    case WM_CTLCOLORDLG:
+    case WM_CTLCOLORSTATIC:
+    case WM_CTLCOLORBTN:
+    case WM_CTLCOLOREDIT:
+    case WM_CTLCOLORLISTBOX:
+        // The scheme's colours; under the system's scheme 0, the platform's.
+        *answer = reinterpret_cast<INT_PTR>(SchemeControlColor(message, reinterpret_cast<HDC>(wParam)));
+        return true;
+    }
+    return false;
+}
+
 void CenterWindowOnScreen(HWND window) {
     RECT rect;
     GetWindowRect(window, &rect);
@@ -370,6 +384,8 @@ void RepaintCustomizeDialogs() {
 }
 
 INT_PTR CALLBACK InsertDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM lParam) {
+    INT_PTR colour = 0;
+    if (DialogControlColor(message, wParam, &colour)) return colour;
     switch (message) {
     case WM_INITDIALOG:
         insertManager = reinterpret_cast<ToolbarManager *>(lParam);
@@ -381,13 +397,6 @@ INT_PTR CALLBACK InsertDialogProc(HWND dialog, UINT message, WPARAM wParam, LPAR
     case WM_DESTROY:
         openInsertDialog = nullptr;
         return FALSE;
-    case WM_CTLCOLORDLG:
-    case WM_CTLCOLORSTATIC:
-    case WM_CTLCOLORBTN:
-    case WM_CTLCOLOREDIT:
-    case WM_CTLCOLORLISTBOX:
-        // The scheme's colours; under the system's scheme 0, the platform's.
-        return reinterpret_cast<INT_PTR>(SchemeControlColor(message, reinterpret_cast<HDC>(wParam)));
     case WM_MEASUREITEM:
         OnMeasureItem(reinterpret_cast<MEASUREITEMSTRUCT *>(lParam));
         return TRUE;

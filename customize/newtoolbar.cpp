@@ -57,6 +57,8 @@ void OnCommand(HWND dialog, UINT id, UINT code) {
 } // namespace
 
 INT_PTR CALLBACK NewToolbarDialogProc(HWND dialog, UINT message, WPARAM wParam, LPARAM) {
+    INT_PTR colour = 0;
+    if (DialogControlColor(message, wParam, &colour)) return colour;
     switch (message) {
     case WM_INITDIALOG:
         CenterWindowOnScreen(dialog);
@@ -66,13 +68,6 @@ INT_PTR CALLBACK NewToolbarDialogProc(HWND dialog, UINT message, WPARAM wParam, 
     case WM_DESTROY:
         openNewToolbarDialog = nullptr;
         return FALSE;
-    case WM_CTLCOLORDLG:
-    case WM_CTLCOLORSTATIC:
-    case WM_CTLCOLORBTN:
-    case WM_CTLCOLOREDIT:
-    case WM_CTLCOLORLISTBOX:
-        // The scheme's colours; under the system's scheme 0, the platform's.
-        return reinterpret_cast<INT_PTR>(SchemeControlColor(message, reinterpret_cast<HDC>(wParam)));
     case WM_COMMAND:
         OnCommand(dialog, LOWORD(wParam), HIWORD(wParam));
         return TRUE;

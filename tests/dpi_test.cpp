@@ -794,22 +794,6 @@ TEST_F(ScaleTest, TheFocusRectangleLinesGrowWithTheFramesScale) {
 
 namespace {
 
-// The WCAG contrast ratio of two colours.
-double Contrast(COLORREF a, COLORREF b) {
-    auto luminance = [](COLORREF c) {
-        double sum = 0;
-        const double weights[3] = {0.2126, 0.7152, 0.0722};
-        const int channels[3] = {GetRValue(c), GetGValue(c), GetBValue(c)};
-        for (int i = 0; i < 3; ++i) {
-            const double v = channels[i] / 255.0;
-            sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
-        }
-        return sum;
-    };
-    const double la = luminance(a), lb = luminance(b);
-    return (std::max(la, lb) + 0.05) / (std::min(la, lb) + 0.05);
-}
-
 // The weakest pair of a set of ink colours against a set of background colours.
 double Weakest(const std::set<COLORREF> &ink, const std::set<COLORREF> &back) {
     double weakest = 21;

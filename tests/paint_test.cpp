@@ -987,17 +987,6 @@ TEST_F(PaintTest, TextModeImageStandsFivePixelsDown) {
 
 namespace {
 
-double Luminance(COLORREF c) {
-    double sum = 0;
-    const double weights[3] = {0.2126, 0.7152, 0.0722};
-    const int channels[3] = {GetRValue(c), GetGValue(c), GetBValue(c)};
-    for (int i = 0; i < 3; ++i) {
-        const double v = channels[i] / 255.0;
-        sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
-    }
-    return sum;
-}
-
 // The user's app mode in this test's own prefix, put back as it was.
 class AppMode {
   public:

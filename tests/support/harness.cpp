@@ -1,5 +1,7 @@
 #include "harness.h"
 
+#include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <sstream>
 
@@ -238,4 +240,20 @@ Pixels ReadScreenPixels(const RECT &rect) {
     Pixels out = ReadPixelsFrom(screen, rect.left, rect.top, rect.right - rect.left, rect.bottom - rect.top);
     ReleaseDC(nullptr, screen);
     return out;
+}
+
+double Luminance(COLORREF color) {
+    double sum = 0;
+    const double weights[3] = {0.2126, 0.7152, 0.0722};
+    const int channels[3] = {GetRValue(color), GetGValue(color), GetBValue(color)};
+    for (int i = 0; i < 3; ++i) {
+        const double v = channels[i] / 255.0;
+        sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
+    }
+    return sum;
+}
+
+double Contrast(COLORREF a, COLORREF b) {
+    const double la = Luminance(a), lb = Luminance(b);
+    return (std::max(la, lb) + 0.05) / (std::min(la, lb) + 0.05);
 }

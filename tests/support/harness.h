@@ -85,6 +85,12 @@ inline bool operator==(const RECT &a, const RECT &b) {
 }
 std::ostream &operator<<(std::ostream &out, const RECT &r);
 
+// ---- Colours read back -------------------------------------------------------
+// The relative luminance of a colour and the contrast ratio of two (1 to 21),
+// as the accessibility guidelines define them.
+double Luminance(COLORREF color);
+double Contrast(COLORREF a, COLORREF b);
+
 // ---- The real cursor and the screen -----------------------------------------
 // Puts the cursor at a screen point and waits until it stays there: Wine's X
 // driver can deliver the motion of an earlier warp late and put it back.
