@@ -24,7 +24,7 @@ lines, `#` starts a comment line:
 `find` must occur exactly once in `file`; `\\n`, `\\t` and `\\\\` in find and
 replace stand for a line break, a tab and a backslash. `tests` names test
 programs (`paint_test`, or `paint_test:Filter*` for a GoogleTest filter) and
-end-to-end scripts (`demo_start_e2e`), separated by blanks. A program named
+end-to-end scripts (`demo_journey_e2e`), separated by blanks. A program named
 with a display scale in front (`dpi144_dpi_test`) runs in the scratch build's
 prefix for that DPI, as its CTest entry does.
 
@@ -142,7 +142,10 @@ def test_targets(tests):
     targets = {"qbr_keeper", "qbr_ctl"}
     for t in tests:
         name = t.split(":")[0]
-        targets.add("qbrdemo" if name.endswith("_e2e") else scaled_test(name)[1])
+        if name.endswith("_e2e"):
+            targets.update({"qbrdemo", "qbr_reader"})  # the journeys also read the demo as a screen reader
+        else:
+            targets.add(scaled_test(name)[1])
     return sorted(targets)
 
 

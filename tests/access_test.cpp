@@ -392,20 +392,6 @@ TEST_F(AccessTest, DefaultActionIsACompletedClick) {
     EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
 }
 
-TEST_F(AccessTest, ACallAfterTheToolbarIsGoneAnswersAnError) {
-    HWND pane = Make("Tools", {1, 2});
-    Reader reader(pane);
-    ASSERT_NE(nullptr, reader.object);
-    QBR_DestroyToolbar(pane);
-    Pump();
-    LONG count = 7;
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->get_accChildCount(&count));
-    EXPECT_EQ(0, count);
-    VARIANT v;
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->get_accState(Reader::Child(1), &v));
-    EXPECT_EQ(CO_E_OBJNOTCONNECTED, reader.object->accDoDefaultAction(Reader::Child(1)));
-}
-
 TEST_F(AccessTest, EveryStateChangeShowAndHideIsAnEvent) {
     QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
     HWND pane = Make("Tools", {1, 2, 3});
@@ -456,12 +442,13 @@ TEST_F(AccessTest, EveryStateChangeShowAndHideIsAnEvent) {
 TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     QBR_SetButtonEnabled(manager, 3, 0);
     QBR_SetButtonEnabled(manager, 8, 0);
-    // Made out of the keyboard's order: the order is the docks', then the
-    // floating toolbars'.
+    // Made out of the keyboard's order: the order is the docks' (top, left,
+    // right, bottom), then the floating toolbars'.
     Make("Float", {9, 10}, TBF_VISIBLE | TBF_FLOATING);
     Make("Left", {7, 8}, TBF_VISIBLE | TBF_DOCKED, left);
     Make("A", {1, 2, 0, 3, 4});
     Make("B", {5, 6});
+    Make("Low", {12}, TBF_VISIBLE | TBF_DOCKED, MakeDock(DOCK_BOTTOM));
     Make("Hidden", {11}, TBF_HIDDEN | TBF_DOCKED);
     Make("Empty", {0, 8}); // nothing enabled
     const struct {
@@ -470,7 +457,7 @@ TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     } steps[] = {
         {"A", "host"},    {"Right", "host"},   {"F6", "A 0"},      {"Right", "A 1"},    {"Right", "A 4"},
         {"Right", "A 0"}, {"Left", "A 4"},     {"Home", "A 0"},    {"End", "A 4"},      {"Up", "A 4"},
-        {"Down", "A 4"},  {"Tab", "B 0"},      {"Tab", "Left 0"},  {"Right", "Left 0"}, {"Tab", "Float 0"},
+        {"Down", "A 4"},  {"Tab", "B 0"},      {"Tab", "Left 0"},  {"Right", "Left 0"}, {"Tab", "Low 0"},     {"Tab", "Float 0"},
         {"Tab", "A 0"},   {"+Tab", "Float 0"}, {"End", "Float 1"}, {"Esc", "host"},     {"F6", "A 0"},
         {"F6", "host"},
     };
@@ -483,38 +470,6 @@ TEST_F(AccessTest, KeysWalkTheButtonsAndTheToolbarsInOrder) {
     EXPECT_EQ(expected, trail);
     EXPECT_EQ(frame, GetFocus()) << "the keyboard went back to the host's window";
     EXPECT_EQ(frame, GetActiveWindow()) << "no toolbar took the activation";
-}
-
-TEST_F(AccessTest, EachFrameWalksItsOwnToolbars) {
-    Make("Main", {1, 2});
-    HWND view = CreateRecordingFrame(120, 120, 400, 300);
-    ToolbarManager *viewManager = QBR_CreateManager(view);
-    ASSERT_NE(nullptr, viewManager);
-    std::vector<UINT> ids = {5, 6};
-    QBR_AddButtons(viewManager, ids.data(), 2);
-    QBR_SetImageStrip(viewManager, "TESTSTRIP");
-    HWND viewPane = QBR_CreateToolbar("View", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0,
-                                      QBR_CreateDock(viewManager, view, DOCK_TOP), ids.data(), 2);
-    SetForegroundWindow(view);
-    SetFocus(view);
-    PumpHost(50);
-    Key("F6");
-    Key("Right");
-    UINT index = 9;
-    EXPECT_EQ(1u, AccessFocusedIndex(viewPane, &index));
-    EXPECT_EQ(1u, index);
-    EXPECT_EQ("host", Focus()) << "the main frame's toolbars stay as they were";
-    // The other frame activated: the keyboard goes back there, and F6 walks
-    // that frame's toolbars.
-    SetForegroundWindow(frame);
-    SetFocus(frame);
-    PumpHost(50);
-    EXPECT_EQ(0u, AccessFocusedIndex(viewPane, &index));
-    Key("F6");
-    EXPECT_EQ("Main 0", Focus());
-    QBR_DestroyManager(viewManager);
-    DestroyWindow(view);
-    PumpHost(50);
 }
 
 TEST_F(AccessTest, UpAndDownGoToTheNearestButtonInTheNextRow) {
@@ -653,7 +608,8 @@ TEST_F(AccessTest, AMousePressOrAnotherActiveWindowGivesTheKeyboardBack) {
     EXPECT_EQ("host", Focus());
     DestroyWindow(other);
     SetForegroundWindow(frame);
-    PumpHost(50);
+    for (int round = 0; round < 100 && GetActiveWindow() != frame; ++round) // a loaded machine settles late
+        PumpHost(10);
 
     // While the mouse holds a button down, F6 is not the toolbars'.
     const RECT item = ScreenItem(QBR_GetToolbar(manager, 0), 1);

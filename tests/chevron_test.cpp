@@ -370,27 +370,6 @@ TEST_F(ChevronTest, ASideDockedToolbarIsCutOffAboveTheBottomDock) {
     QBR_DestroyToolbar(column);
 }
 
-// F6 and Tab visit the bottom dock's toolbars after those of the side docks,
-// whatever order the docks were made in.
-TEST_F(ChevronTest, TheKeyboardReachesTheBottomDockAfterTheSideDocks) {
-    HWND bottom = MakeDock(DOCK_BOTTOM);
-    HWND left = MakeDock(DOCK_LEFT);
-    const UINT low[] = {7}, side[] = {8};
-    HWND lowPane = QBR_CreateToolbar("Low", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, bottom, low, 1);
-    HWND sidePane = QBR_CreateToolbar("Side", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, left, side, 1);
-    SetForegroundWindow(frame);
-    SetFocus(frame);
-    PumpHost(50);
-    std::vector<HWND> visited;
-    Key(VK_F6);
-    for (int i = 0; i < 4; ++i) {
-        for (HWND p : {pane, sidePane, lowPane})
-            if (AccessFocusedIndex(p, nullptr)) visited.push_back(p);
-        Key(VK_TAB);
-    }
-    EXPECT_EQ((std::vector<HWND>{pane, sidePane, lowPane, pane}), visited);
-}
-
 // ---- What a reader hears of the chevron ------------------------------------------------
 
 std::vector<LONG> focusChildren;

@@ -1,291 +1,465 @@
-// The demonstration program's resources, read from qbrdemo.exe beside this
-// test, and its status bar window.
+// The demonstration program's main and view windows, run in this process on
+// the program's own resources (demo_test.rc): the program's
+// sources are built in, the main window is made as WinMain makes it, and
+// views are opened with its "Open Another Window" command.
 #include <windows.h>
 
-#include <cstring>
+#include <algorithm>
+#include <fstream>
 #include <string>
+#include <utility>
 #include <vector>
 
-#include "dialog_template.h"
+#include "core/core.h"
 #include "harness.h"
+#include "modal.h"
 #include "quaybar.h"
+#include "toolbar/toolbar.h"
 
-// The status bar is a part of the program, not of the library; the test
-// builds it in directly.
+#include "demo/main.cpp"
+#include "demo/settings.cpp"
 #include "demo/statusbar.cpp"
+#include "demo/tables.cpp"
 
 namespace {
 
-// ---- Resources of qbrdemo.exe ---------------------------------------------
+// ---- Finding the program's windows -------------------------------------------------
 
-class DemoResources : public ::testing::Test {
+struct ClassSearch {
+    const char *name;
+    std::vector<HWND> found;
+};
+
+// A named CALLBACK function: a lambda converts only to the default calling
+// convention, which on 32-bit Windows is not CALLBACK's.
+BOOL CALLBACK CollectWindowOfClass(HWND window, LPARAM data) {
+    auto *s = reinterpret_cast<ClassSearch *>(data);
+    char name[64] = "";
+    GetClassNameA(window, name, sizeof name);
+    if (std::string(name) == s->name) s->found.push_back(window);
+    return TRUE;
+}
+
+std::vector<HWND> WindowsOfClass(const char *className) {
+    ClassSearch search{className, {}};
+    EnumThreadWindows(GetCurrentThreadId(), CollectWindowOfClass, reinterpret_cast<LPARAM>(&search));
+    return search.found;
+}
+
+ToolbarManager *ManagerOfView(HWND view) { return reinterpret_cast<ToolbarManager *>(GetWindowLongPtrA(view, 0)); }
+
+// The pane of the toolbar with this title, or null.
+HWND PaneTitled(ToolbarManager *manager, const char *title) {
+    for (UINT i = 0; i < QBR_GetToolbarCount(manager); ++i) {
+        HWND pane = QBR_GetToolbar(manager, i);
+        char text[64] = "";
+        QBR_GetToolbarTitle(pane, text, sizeof text);
+        if (std::string(text) == title) return pane;
+    }
+    return nullptr;
+}
+
+// The screen centre of the button `id` on a toolbar's pane.
+POINT ButtonCentre(HWND pane, UINT id) {
+    ToolbarRecord *record = RecordOfWindow(pane);
+    for (UINT i = 0; record && ItemAt(record, i); ++i) {
+        if (ItemAt(record, i)->id != id) continue;
+        RECT r = {};
+        GetItemRect(record, i, &r);
+        POINT p = Centre(r);
+        ClientToScreen(pane, &p);
+        return p;
+    }
+    ADD_FAILURE() << "no button " << id;
+    return POINT{-1, -1};
+}
+
+bool MenuChecked(HWND frame, UINT id) { return (GetMenuState(GetMenu(frame), id, MF_BYCOMMAND) & MF_CHECKED) != 0; }
+
+// The button of a group that is on, 0 for none, 9999 for more than one.
+UINT GroupOn(ToolbarManager *manager, UINT first, UINT last) {
+    UINT on = 0;
+    for (UINT id = first; id <= last; ++id)
+        if (QBR_GetButtonState(manager, id) & BS_ON) on = on ? 9999 : id;
+    return on;
+}
+UINT MenuGroupOn(HWND frame, UINT first, UINT last) {
+    UINT on = 0;
+    for (UINT id = first; id <= last; ++id)
+        if (MenuChecked(frame, id)) on = on ? 9999 : id;
+    return on;
+}
+
+int Height(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    return r.bottom - r.top;
+}
+
+// ---- Fixture: the program's main window and its views ----------------------------------
+
+class DemoViewTest : public ::testing::Test {
   protected:
     void SetUp() override {
-        char path[MAX_PATH];
-        GetModuleFileNameA(nullptr, path, MAX_PATH);
-        char *slash = std::strrchr(path, '\\');
-        ASSERT_NE(slash, nullptr);
-        std::strcpy(slash + 1, "qbrdemo.exe");
-        program = LoadLibraryExA(path, nullptr, LOAD_LIBRARY_AS_DATAFILE);
-        ASSERT_NE(program, nullptr) << "cannot open " << path;
+        moduleInstance = GetModuleHandleA(nullptr);
+        // Every test starts from the default toolbars.
+        DeleteFileA(SettingsPath());
+        ASSERT_EQ(RegisterMainWindow(), 1u);
+        mainWindow = FindWindowA("TestQBRApp", nullptr);
+        ASSERT_NE(mainWindow, nullptr);
+        Pump();
+        ASSERT_NE(mainManager, nullptr);
     }
     void TearDown() override {
-        if (program) FreeLibrary(program);
+        ModalSteps::Stop();
+        // Views first: the main window ends the client, which their managers belong to.
+        for (HWND view : WindowsOfClass("TestQBRView"))
+            SendMessageA(view, WM_CLOSE, 0, 0);
+        if (IsWindow(mainWindow)) SendMessageA(mainWindow, WM_CLOSE, 0, 0);
+        Pump();
+        EXPECT_TRUE(WindowsOfClass("TestQBRView").empty());
+        DeleteFileA(SettingsPath());
     }
-    const BYTE *Resource(const char *name, LPCSTR type, DWORD *size = nullptr) {
-        HRSRC found = FindResourceA(program, name, type);
-        if (!found) return nullptr;
-        if (size) *size = SizeofResource(program, found);
-        return static_cast<const BYTE *>(LockResource(LoadResource(program, found)));
+    // Opens a view with the main window's command; gives the new window.
+    HWND OpenView() {
+        std::vector<HWND> before = WindowsOfClass("TestQBRView");
+        SendMessageA(mainWindow, WM_COMMAND, kOpenViewCommand, 0);
+        Pump();
+        for (HWND view : WindowsOfClass("TestQBRView"))
+            if (std::find(before.begin(), before.end(), view) == before.end()) return view;
+        ADD_FAILURE() << "no new view window";
+        return nullptr;
     }
-    std::string String(UINT id) {
-        char text[256] = "";
-        int length = LoadStringA(program, id, text, sizeof text);
-        return std::string(text, length > 0 ? length : 0);
+    // A left click with the real mouse on the button `id` of a pane, the
+    // pane's frame brought to the top first.
+    void ClickButton(HWND frame, HWND pane, UINT id) {
+        SetWindowPos(frame, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE);
+        SetForegroundWindow(frame);
+        Pump();
+        POINT p = ButtonCentre(pane, id);
+        ASSERT_EQ(WindowFromPoint(p), pane) << "button " << id << " is covered";
+        PlaceCursor(p);
+        SendButton(MOUSEEVENTF_LEFTDOWN);
+        Pump();
+        SendButton(MOUSEEVENTF_LEFTUP);
+        Pump();
     }
-    HMODULE program = nullptr;
+    HWND mainWindow = nullptr;
 };
 
-struct TextRow {
-    UINT id;
-    const char *description;
-    const char *quickHelp;  // nullptr: no such string
-    const char *buttonText; // nullptr: no such string
-};
-
-// Every command's texts: the description under its id, the quick help under
-// id + 1000 and the button text under id + 2000; a command without a button
-// has no short texts.
-const TextRow kTexts[] = {
-    {101, "Create a new document", "New", "New"},
-    {102, "Open an existing document", "Open", "Open"},
-    {103, "Close the active document", nullptr, nullptr},
-    {104, "Save the active document", "Save", "Save"},
-    {105, "Save the active document with a new name", nullptr, nullptr},
-    {106, "Print the active document", "Print", "Print"},
-    {107, "Cut the selection and put it on the clipboard", "Cut", "Cut"},
-    {108, "Copy the selection and put it on the clipboard", "Copy", "Copy"},
-    {109, "Insert the clipboard contents", "Paste", "Paste"},
-    {110, "Erase the selection", nullptr, nullptr},
-    {151, "Display program information, version number and copyright", "About", "About"},
-    {152, "Exit the application", nullptr, nullptr},
-    {201, "Select the eraser tool", "Eraser", "Erase"},
-    {202, "Select the pen tool", "Pen", "Pen"},
-    {203, "Select the selection tool", "Selection", "Select"},
-    {204, "Select the brush tool", "Brush", "Brush"},
-    {205, "Select the spray tool", "Spray", "Spray"},
-    {206, "Select the paint bucket tool", "Paint", "Paint"},
-    {207, "Select the line tool", "Line", "Line"},
-    {208, "Select the eyedrop tool", "EyeDrop", "EyeDrop"},
-    {209, "Select the magnify tool", "Magnify", "Magnify"},
-    {210, "Select the rectangle tool", "Rect", "Rect"},
-    {211, "Select the round rectangle tool", "Round", "Round"},
-    {212, "Select the oval tool", "Oval", "Oval"},
-    {301, "Makes the selection bold", "Bold", "Bold"},
-    {302, "Makes the selection italic", "Italic", "Italic"},
-    {303, "Makes the selection underlined", "Underline", "Underline"},
-    {304, "Aligns the paragraph at the left indent", "Left", "Left"},
-    {305, "Centers the paragraph between the indents", "Centered", "Center"},
-    {306, "Aligns the paragraph at the right indent", "Right", "Right"},
-    {307, "Aligns the paragraph at both the left and right indent", "Justified", "Justify"},
-    {401, "Align object towards the top", "Align top", "Top"},
-    {402, "Align object towards the right", "Align right", "Right"},
-    {403, "Align object towards the bottom", "Align bottom", "Bottom"},
-    {404, "Align object towards the left", "Align left", "Left"},
-};
-
-TEST_F(DemoResources, EveryCommandHasItsThreeTextsAndCategoriesTheirNames) {
-    ASSERT_EQ(35u, sizeof(kTexts) / sizeof(kTexts[0]));
-    for (const TextRow &row : kTexts) {
-        SCOPED_TRACE(row.id);
-        EXPECT_EQ(String(row.id), row.description);
-        EXPECT_EQ(String(row.id + 1000), row.quickHelp ? row.quickHelp : "");
-        EXPECT_EQ(String(row.id + 2000), row.buttonText ? row.buttonText : "");
+TEST_F(DemoViewTest, TwoViewsKeepTheirOwnToolbarsButtonStatesAndRadioGroups) {
+    HWND a = OpenView(), b = OpenView();
+    ASSERT_TRUE(a && b);
+    ToolbarManager *ma = ManagerOfView(a), *mb = ManagerOfView(b);
+    ASSERT_TRUE(ma && mb);
+    EXPECT_NE(ma, mb);
+    EXPECT_NE(ma, mainManager);
+    for (ToolbarManager *m : {ma, mb}) {
+        EXPECT_EQ(QBR_GetToolbarCount(m), 2u);
+        EXPECT_NE(PaneTitled(m, "Standard"), nullptr);
+        EXPECT_NE(PaneTitled(m, "Style"), nullptr);
+        EXPECT_EQ(PaneTitled(m, "Palette"), nullptr);
     }
-    const char *categories[] = {"File", "Edit", "Palette", "Style", "Align", "Misc"};
-    for (UINT i = 0; i < 6; ++i)
-        EXPECT_EQ(String(3001 + i), categories[i]);
-    // The library's own strings live in the same table of the program.
-    EXPECT_EQ(String(5101), "Insert Item...");
-}
+    char title[64] = "";
+    GetWindowTextA(a, title, sizeof title);
+    EXPECT_STREQ(title, "View Window");
+    EXPECT_EQ(GetWindow(a, GW_OWNER), nullptr) << "a view is not owned by the main window";
 
-// One menu flattened to "popup|id text|---|..." so a difference reads at once.
-std::string DescribeMenu(HMENU menu) {
-    std::string out;
-    for (int i = 0; i < GetMenuItemCount(menu); ++i) {
-        char text[128] = "";
-        GetMenuStringA(menu, i, text, sizeof text, MF_BYPOSITION);
-        if (HMENU popup = GetSubMenu(menu, i)) {
-            out += std::string("[") + text + ": " + DescribeMenu(popup) + "]";
-            continue;
+    // Each step acts on one frame; afterwards every frame's group is checked,
+    // on its buttons and on its menu.
+    struct Step {
+        const char *what;
+        HWND frame;
+        UINT id;
+        bool realClick; // else the menu's WM_COMMAND
+        UINT expectMain, expectA, expectB;
+    } const steps[] = {
+        {"at the start", nullptr, 0, false, 304, 304, 304},
+        {"click Right in view A", a, 306, true, 304, 306, 304},
+        {"menu Justified in view B", b, 307, false, 304, 306, 307},
+        {"menu Centered in the main window", mainWindow, 305, false, 305, 306, 307},
+        {"click Left in view B", b, 304, true, 305, 306, 304},
+    };
+    for (const Step &s : steps) {
+        SCOPED_TRACE(s.what);
+        if (s.frame && s.realClick) {
+            ToolbarManager *m = s.frame == a ? ma : mb;
+            ClickButton(s.frame, PaneTitled(m, "Style"), s.id);
+        } else if (s.frame) {
+            SendMessageA(s.frame, WM_COMMAND, s.id, 0);
+            Pump();
         }
-        UINT id = GetMenuItemID(menu, i);
-        if (GetMenuState(menu, i, MF_BYPOSITION) & MF_SEPARATOR)
-            out += "---;";
-        else
-            out += std::to_string(id) + " " + text + ";";
+        EXPECT_EQ(GroupOn(mainManager, 304, 307), s.expectMain);
+        EXPECT_EQ(GroupOn(ma, 304, 307), s.expectA);
+        EXPECT_EQ(GroupOn(mb, 304, 307), s.expectB);
+        EXPECT_EQ(MenuGroupOn(mainWindow, 304, 307), s.expectMain);
+        EXPECT_EQ(MenuGroupOn(a, 304, 307), s.expectA);
+        EXPECT_EQ(MenuGroupOn(b, 304, 307), s.expectB);
     }
-    return out;
+
+    // A check button toggles in its own frame only.
+    const UINT boldBefore = QBR_GetButtonState(mainManager, 301);
+    ClickButton(a, PaneTitled(ma, "Style"), 301);
+    EXPECT_EQ(QBR_GetButtonState(ma, 301) & BS_ON, static_cast<UINT>(BS_ON));
+    EXPECT_EQ(QBR_GetButtonState(mb, 301) & BS_ON, 0u);
+    EXPECT_EQ(QBR_GetButtonState(mainManager, 301), boldBefore);
+
+    // The Toolbars submenu of a view lists that view's toolbars.
+    HMENU viewPopup = GetSubMenu(GetMenu(a), 2);
+    HMENU toolbars = GetSubMenu(viewPopup, GetMenuItemCount(viewPopup) - 1);
+    ASSERT_NE(toolbars, nullptr);
+    SendMessageA(a, WM_INITMENUPOPUP, reinterpret_cast<WPARAM>(toolbars), 2);
+    EXPECT_EQ(DescribeMenu(toolbars), "Standard*:8500 | Style*:8501");
+    // Its entry hides that view's toolbar, not the other view's.
+    SendMessageA(a, WM_COMMAND, kToolbarsMenuBase + 1, 0);
+    Pump();
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(ma, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mb, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mainManager, "Style")));
 }
 
-const char kFileMenu[] =
-    "[&File: 101 &New\tCtrl+N;102 &Open...\tCtrl+O;103 &Close;104 &Save\tCtrl+S;105 Save &As...;---;"
-    "106 &Print...\tCtrl+P;---;152 E&xit\tAlt+F4;]";
-const char kEditMenu[] = "[&Edit: 107 Cu&t\tCtrl+X;108 &Copy\tCtrl+C;109 &Paste\tCtrl+V;110 Delete\tDel;]";
-const char kStyleMenu[] = "[&Style: 304 &Left;305 &Centered;306 &Right;307 &Justified;]";
-const char kHelpMenu[] = "[&Help: 153 Contents;---;151 &About QBR...;]";
+TEST_F(DemoViewTest, ViewLayoutIsSavedWhenAViewClosesAndRestoredByTheNextView) {
+    HWND a = OpenView();
+    ASSERT_NE(a, nullptr);
+    // Style hidden in the first view.
+    SendMessageA(a, WM_COMMAND, kToolbarsMenuBase + 1, 0);
+    Pump();
+    ASSERT_FALSE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(a), "Style")));
+    char value[256] = "";
+    EXPECT_EQ(GetPrivateProfileStringA(kViewLayout, "Style", "", value, sizeof value, SettingsPath()), 0u)
+        << "saved before the view closed";
 
-TEST_F(DemoResources, MenusListTheirCommandsInOrder) {
-    struct {
-        const char *name;
-        std::string expected;
-    } const menus[] = {
-        {"Main", std::string(kFileMenu) + kEditMenu +
-                     "[&View: 122 &Open Another Window;---;120 &Quick Help;121 &Button Text;"
-                     "[&Colours: 130 &Follow the System;131 &System Colours;132 &Dark;133 &High Contrast;]]" + kStyleMenu +
-                     "[&Palette: 201 &Eraser;202 &Pen;203 &Selection;204 &Brush;205 Spra&y;206 P&aint;207 &Line;"
-                     "208 E&yedrop;209 &Magnify;210 &Rectangle;211 Ro&und Rectangle;212 &Oval;]" +
-                     kHelpMenu},
-        {"View",
-         std::string(kFileMenu) + kEditMenu + "[&View: 120 &Quick Help;121 &Button Text;]" + kStyleMenu + kHelpMenu},
+    // A second view opened meanwhile has the defaults: nothing was saved yet.
+    HWND b = OpenView();
+    ASSERT_NE(b, nullptr);
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(b), "Style")));
+
+    SendMessageA(a, WM_CLOSE, 0, 0);
+    Pump();
+    GetPrivateProfileStringA(kViewLayout, "Top Dock", "", value, sizeof value, SettingsPath());
+    EXPECT_STREQ(value, "Standard,Style");
+    GetPrivateProfileStringA(kViewLayout, "Style", "", value, sizeof value, SettingsPath());
+    EXPECT_STRNE(value, "");
+    char mainValue[256] = "";
+    EXPECT_EQ(GetPrivateProfileStringA(kMainLayout, "Style", "", mainValue, sizeof mainValue, SettingsPath()), 0u)
+        << "a view wrote the main window's section";
+
+    // The next view restores the hidden Style; the one still open is untouched.
+    HWND c = OpenView();
+    ASSERT_NE(c, nullptr);
+    ToolbarManager *mc = ManagerOfView(c);
+    ASSERT_NE(mc, nullptr);
+    EXPECT_EQ(QBR_GetToolbarCount(mc), 2u);
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(mc, "Style")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(mc, "Standard")));
+    EXPECT_TRUE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(b), "Style")));
+    // Radio group and globals are set up as for a fresh view.
+    EXPECT_EQ(GroupOn(mc, 304, 307), 304u);
+    EXPECT_EQ(MenuGroupOn(c, 304, 307), 304u);
+
+    // Closing the last of them writes what it shows.
+    SendMessageA(b, WM_CLOSE, 0, 0);
+    Pump();
+    SendMessageA(c, WM_CLOSE, 0, 0);
+    Pump();
+    HWND d = OpenView();
+    ASSERT_NE(d, nullptr);
+    EXPECT_FALSE(QBR_IsToolbarVisible(PaneTitled(ManagerOfView(d), "Style"))) << "the view closed last wins";
+}
+
+// The lines of one section of the settings file, as they stand in it.
+std::vector<std::string> SectionLines(const char *section) {
+    std::vector<std::string> lines;
+    std::ifstream file(SettingsPath(), std::ios::binary);
+    bool inside = false;
+    for (std::string line; std::getline(file, line);) {
+        if (!line.empty() && line.back() == '\r') line.pop_back();
+        if (!line.empty() && line[0] == '[') {
+            inside = line == std::string("[") + section + "]";
+        } else if (inside && !line.empty()) {
+            lines.push_back(line);
+        }
+    }
+    return lines;
+}
+
+// The layout table of a manager, key and value a pair.
+std::vector<std::pair<std::string, std::string>> TableOf(ToolbarManager *manager) {
+    std::vector<std::pair<std::string, std::string>> table;
+    UINT count = 0;
+    if (!QBR_CaptureLayout(manager, &count)) return table;
+    for (UINT i = 0; i < count; ++i) {
+        UINT keyLength = 0, valueLength = 0;
+        QBR_GetLayoutEntrySize(i, &keyLength, &valueLength);
+        std::vector<char> key(keyLength + 1), value(valueLength + 1);
+        QBR_GetLayoutEntry(i, key.data(), value.data());
+        table.emplace_back(key.data(), value.data());
+    }
+    QBR_FreeLayout();
+    return table;
+}
+
+// Titles a profile file cannot carry as plain keys are written under escaped
+// keys, in their lines and in the dock's value alike, and come back as they
+// were; the default toolbars keep their plain lines. A title with a comma is
+// written as it stands, and that toolbar alone does not come back. Of two
+// toolbars of one title each keeps its line, and the second finds the
+// value the first has used up.
+TEST_F(DemoViewTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
+    HWND a = OpenView();
+    ASSERT_NE(a, nullptr);
+    ToolbarManager *ma = ManagerOfView(a);
+    // The empty title stands in the middle: a dock's value that ends in a
+    // comma has nothing left to read after it.
+    const std::vector<std::string> titles = {"   ",      "a=b",   ";semi", "[brack",   " both ", "end ",
+                                             "standard", "STYLE", "x,y",   "Twice",    "Twice",  "Twice",
+                                             "%41",      "",      "\"q\"", "tab\there"};
+    const std::vector<std::string> keys = {
+        "%%20%20%20", "%a%3Db", "%%3Bsemi", "%%5Bbrack",   "%%20both%20", "%end%20", "%standard", "%%53%54%59%4C%45",
+        "x,y",        "Twice",  "%%54wice", "%%54wice%#2", "%%2541",      "%",       "%%22q%22",  "%tab%09here"};
+    for (size_t i = 0; i < titles.size(); ++i) {
+        const UINT ids[] = {101, 0, static_cast<UINT>(102 + 2 * (i % 2))};
+        ASSERT_NE(QBR_CreateToolbar(titles[i].c_str(), TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, QBR_GetDock(ma, DOCK_TOP),
+                                    ids, 3),
+                  nullptr);
+    }
+    Pump();
+    const auto table = TableOf(ma);
+    ASSERT_EQ(table.size(), titles.size() + 3);
+    SendMessageA(a, WM_CLOSE, 0, 0);
+    Pump();
+
+    std::string dock = "Standard,Style";
+    std::vector<std::string> expected = {"", "Standard=" + table[1].second, "Style=" + table[2].second};
+    for (size_t i = 0; i < keys.size(); ++i) {
+        dock += "," + keys[i];
+        expected.push_back(keys[i] + "=" + table[i + 3].second);
+    }
+    expected[0] = "Top Dock=" + dock;
+    EXPECT_EQ(SectionLines(kViewLayout), expected);
+
+    HWND b = OpenView();
+    ASSERT_NE(b, nullptr);
+    ToolbarManager *mb = ManagerOfView(b);
+    // Every toolbar but "x,y", in the dock's order; a "Twice" after the
+    // first finds no items and flags 0.
+    std::vector<std::string> back = {"Standard", "Style"};
+    std::vector<UINT> thirdIds = {0, 0};
+    for (size_t i = 0; i < titles.size(); ++i) {
+        if (titles[i] == "x,y") continue;
+        back.push_back(titles[i]);
+        thirdIds.push_back(titles[i] == "Twice" && titles[i - 1] == "Twice" ? 0 : 102 + 2 * (i % 2));
+    }
+    ASSERT_EQ(QBR_GetToolbarCount(mb), back.size());
+    for (UINT i = 2; i < back.size(); ++i) {
+        HWND pane = QBR_GetToolbar(mb, i);
+        char text[256] = "#";
+        QBR_GetToolbarTitle(pane, text, sizeof text);
+        EXPECT_EQ(text, back[i]) << i;
+        if (thirdIds[i]) {
+            EXPECT_EQ(ToolbarIds(pane), (std::vector<UINT>{101, 0, thirdIds[i]})) << back[i];
+            EXPECT_EQ(QBR_GetToolbarFlags(pane), static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED)) << back[i];
+        } else {
+            EXPECT_TRUE(ToolbarIds(pane).empty()) << i;
+            EXPECT_EQ(QBR_GetToolbarFlags(pane), 0u) << i;
+        }
+    }
+    EXPECT_EQ(TableOf(mb)[1], table[1]);
+    EXPECT_EQ(TableOf(mb)[2], table[2]);
+}
+
+// A first start shows Standard and Style docked at the top and Align and
+// Palette floating at their places, Palette wrapped into rows of three.
+TEST_F(DemoViewTest, AFirstStartShowsTheDefaultToolbars) {
+    const struct {
+        const char *title;
+        UINT flags;
+        POINT corner; // of a floating frame
+        int rows;
+    } bars[] = {{"Standard", TBF_VISIBLE | TBF_DOCKED, {}, 1},
+                {"Style", TBF_VISIBLE | TBF_DOCKED, {}, 1},
+                {"Align", TBF_VISIBLE | TBF_FLOATING, {300, 100}, 1},
+                {"Palette", TBF_VISIBLE | TBF_FLOATING, {300, 200}, 4}};
+    ASSERT_EQ(4u, QBR_GetToolbarCount(mainManager));
+    for (const auto &b : bars) {
+        SCOPED_TRACE(b.title);
+        HWND pane = PaneTitled(mainManager, b.title);
+        ASSERT_NE(nullptr, pane);
+        EXPECT_EQ(b.flags, QBR_GetToolbarFlags(pane));
+        RECT frame, area;
+        GetWindowRect(ResolveRoleWindow(pane, ROLE_ACTIVE), &frame);
+        GetItemArea(pane, ROLE_ACTIVE, &area);
+        if (b.flags & TBF_FLOATING) EXPECT_EQ(b.corner.x * 10000 + b.corner.y, frame.left * 10000 + frame.top);
+        EXPECT_EQ(b.rows * 22, area.bottom - area.top);
+    }
+}
+
+// The Palette group of the main window: one tool at a time, on its buttons and
+// in its menu alike, from the first entry to the last.
+TEST_F(DemoViewTest, PaletteIsOneRadioGroupWithItsMenuChecks) {
+    struct Step {
+        const char *what;
+        UINT command; // 0: none
+        UINT on;
+    } const steps[] = {
+        {"at the start", 0, 204}, {"Eraser, the first", 201, 201}, {"Oval, the last", 212, 212},
+        {"Magnify", 209, 209},    {"Magnify again", 209, 209},     {"Pen", 202, 202},
     };
-    for (const auto &m : menus) {
-        SCOPED_TRACE(m.name);
-        HMENU menu = LoadMenuA(program, m.name);
-        ASSERT_NE(menu, nullptr);
-        EXPECT_EQ(DescribeMenu(menu), m.expected);
-        DestroyMenu(menu);
+    for (const Step &s : steps) {
+        SCOPED_TRACE(s.what);
+        if (s.command) SendMessageA(mainWindow, WM_COMMAND, s.command, 0);
+        Pump();
+        EXPECT_EQ(s.on, GroupOn(mainManager, 201, 212));
+        EXPECT_EQ(s.on, MenuGroupOn(mainWindow, 201, 212));
+        EXPECT_EQ(304u, GroupOn(mainManager, 304, 307)) << "the other group stays";
     }
 }
 
-// The strip's pixel at (x, y) as a palette index; rows are stored bottom-up.
-int PixelIndex(const BITMAPINFOHEADER *info, int x, int y) {
-    const BYTE *bits = reinterpret_cast<const BYTE *>(info) + info->biSize + 16 * sizeof(RGBQUAD);
-    const int stride = ((info->biWidth * 4 + 31) / 32) * 4;
-    const BYTE byte = bits[(info->biHeight - 1 - y) * stride + x / 2];
-    return x % 2 ? byte & 15 : byte >> 4;
-}
-
-COLORREF PixelColour(const BITMAPINFOHEADER *info, int x, int y) {
-    const RGBQUAD *palette = reinterpret_cast<const RGBQUAD *>(reinterpret_cast<const BYTE *>(info) + info->biSize);
-    const RGBQUAD &q = palette[PixelIndex(info, x, y)];
-    return RGB(q.rgbRed, q.rgbGreen, q.rgbBlue);
-}
-
-TEST_F(DemoResources, StripsHaveTheirShapeAndTheViewStripReusesTheMainImages) {
-    struct {
-        const char *name;
-        LONG width, height;
-    } const strips[] = {{"Main", 368, 30}, {"View", 240, 15}};
-    for (const auto &s : strips) {
-        SCOPED_TRACE(s.name);
-        auto info = reinterpret_cast<const BITMAPINFOHEADER *>(Resource(s.name, RT_BITMAP));
-        ASSERT_NE(info, nullptr);
-        EXPECT_EQ(info->biWidth, s.width);
-        EXPECT_EQ(info->biHeight, s.height);
-        EXPECT_EQ(info->biBitCount, 4);
-        EXPECT_EQ(info->biCompression, static_cast<DWORD>(BI_RGB));
-        // The top-left pixel of every image is background, and it must be the
-        // exact face colour that loading maps to the system's.
-        EXPECT_EQ(PixelColour(info, 0, 0), RGB(0xC0, 0xC0, 0xC0));
-    }
-    auto main = reinterpret_cast<const BITMAPINFOHEADER *>(Resource("Main", RT_BITMAP));
-    auto view = reinterpret_cast<const BITMAPINFOHEADER *>(Resource("View", RT_BITMAP));
-    ASSERT_TRUE(main && view);
-    // View index -> Main index: 101..151 are the first eight of both
-    // catalogs, 301..307 stand at 20..26 in Main and 8..14 in View.
-    for (int v = 0; v < 15; ++v) {
-        const int m = v < 8 ? v : v + 12;
-        const int mx = (m % 23) * 16, my = (m / 23) * 15;
-        int differing = 0, inked = 0;
-        for (int y = 0; y < 15; ++y)
-            for (int x = 0; x < 16; ++x) {
-                differing += PixelColour(view, v * 16 + x, y) != PixelColour(main, mx + x, my + y);
-                inked += PixelColour(main, mx + x, my + y) != RGB(0xC0, 0xC0, 0xC0);
-            }
-        EXPECT_EQ(differing, 0) << "view image " << v;
-        EXPECT_GT(inked, 10) << "main image " << m << " is empty";
-    }
-    // The four cells behind the last image stay plain face.
-    for (int m = 31; m < 46; ++m)
-        for (int y = 0; y < 15; ++y)
-            for (int x = 0; x < 16; ++x)
-                ASSERT_EQ(PixelColour(main, (m % 23) * 16 + x, (m / 23) * 15 + y), RGB(0xC0, 0xC0, 0xC0)) << m;
-}
-
-// A dialog procedure that handles nothing. Callbacks are named functions, not
-// lambdas: a lambda converts only to the default calling convention, which on
-// 32-bit Windows is not CALLBACK's.
-INT_PTR CALLBACK NoDialogProc(HWND, UINT, WPARAM, LPARAM) { return FALSE; }
-
-TEST_F(DemoResources, IconAndAboutBoxArePresent) {
-    EXPECT_NE(Resource("AppIcon", RT_GROUP_ICON), nullptr);
-
-    auto dialog = reinterpret_cast<const DLGTEMPLATE *>(Resource("About", RT_DIALOG));
-    ASSERT_NE(dialog, nullptr);
-    EXPECT_EQ(dialog->style,
-              static_cast<DWORD>(WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT));
-    EXPECT_EQ((std::vector<int>{11, 209, 120}), (std::vector<int>{dialog->cdit, dialog->cx, dialog->cy}));
-
-    // Build it on this program's instance, hidden: the icon control finds no
-    // "APPICON" here, which does not keep the other controls from being made.
-    DWORD size = 0;
-    const BYTE *bytes = Resource("About", RT_DIALOG, &size);
-    std::vector<BYTE> hidden(bytes, bytes + size);
-    auto copy = reinterpret_cast<DLGTEMPLATE *>(hidden.data());
-    copy->style &= ~WS_VISIBLE;
-    HWND box = CreateDialogIndirectParamA(GetModuleHandleA(nullptr), copy, nullptr, NoDialogProc, 0);
-    ASSERT_NE(box, nullptr);
-    char text[128] = "";
-    GetWindowTextA(box, text, sizeof text);
-    EXPECT_STREQ(text, "About QBR");
-    struct {
-        int id;
-        const char *contains;
-    } const controls[] = {{IDOK, "OK"}, {8001, "QBR.HLP"}, {8002, ""}, {8003, ""}, {8004, "&Help"}};
-    for (const auto &c : controls) {
-        SCOPED_TRACE(c.id);
-        HWND control = GetDlgItem(box, c.id);
-        ASSERT_NE(control, nullptr);
-        GetWindowTextA(control, text, sizeof text);
-        EXPECT_NE(std::string(text).find(c.contains), std::string::npos) << text;
-        EXPECT_GT(std::strlen(text), 0u);
-    }
-    DestroyWindow(box);
-}
-
-// The About box as stored, in dialog units: its frame, its font and every
-// control in order, with its class, text, styles, place and size.
-TEST_F(DemoResources, AboutBoxTemplateReadsBackExactly) {
-    const DialogLayout about = ReadDialogTemplate(program, "About");
-    EXPECT_EQ(static_cast<DWORD>(WS_POPUP | WS_VISIBLE | WS_CAPTION | WS_SYSMENU | DS_MODALFRAME | DS_SETFONT),
-              about.style);
-    EXPECT_EQ((std::vector<int>{0, 0, 209, 120}), (std::vector<int>{about.x, about.y, about.cx, about.cy}));
-    EXPECT_EQ("About QBR", about.caption);
-    EXPECT_EQ(8, about.points);
-    EXPECT_EQ("MS Sans Serif", about.face);
-    constexpr DWORD kShown = WS_CHILD | WS_VISIBLE;
-    const std::vector<DialogControl> expected = {
-        {IDOK, "button", "OK", kShown | BS_DEFPUSHBUTTON | WS_TABSTOP, 158, 3, 45, 14},
-        {-1, "static", "Quaybar (QBR)", kShown | SS_LEFT | WS_GROUP, 30, 6, 113, 9},
-        {-1, "static", "Demonstration App", kShown | SS_LEFT | WS_GROUP, 30, 17, 74, 9},
-        {-1, "static", "Version 1.5", kShown | SS_LEFT | WS_GROUP, 30, 28, 51, 9},
-        {-1, "static", "Copyright (c) 2026 the Quaybar authors", kShown | SS_LEFT | WS_GROUP, 30, 40, 131, 9},
-        {-1, "static", "", kShown | SS_BLACKRECT, 2, 57, 202, 2},
-        {8001, "static", "Press Help to read more in QBR.HLP, or see QBRDEMO.TXT beside this program.",
-         kShown | SS_CENTER | WS_GROUP, 2, 65, 200, 26},
-        {8002, "static", "Quaybar toolbar library\nQuestions: see README.md", kShown | SS_LEFT | WS_GROUP, 3, 92, 112,
-         26},
-        {8003, "static", "Settings: qbrdemo.INI\nbeside the program", kShown | SS_RIGHT | WS_GROUP, 103, 92, 101, 26},
-        {8004, "button", "&Help", kShown | BS_PUSHBUTTON | WS_TABSTOP, 158, 21, 45, 14},
-        {-1, "static", "APPICON", kShown | SS_ICON, 4, 6, 18, 20},
+// The edit control stands from one pixel left of the client area to its
+// right edge, with its top on the top dock's last line (the line the dock
+// closes with) and its bottom on the status bar, as the dock shows, hides and
+// comes back.
+TEST_F(DemoViewTest, TheEditControlStartsOnTheTopDocksLastLine) {
+    HWND view = OpenView();
+    ASSERT_NE(view, nullptr);
+    struct Frame {
+        const char *what;
+        HWND window;
+        ToolbarManager *manager;
+        HWND edit;
+        HWND statusBar;
+    } const frames[] = {
+        {"main window", mainWindow, mainManager, mainEdit, mainStatusBar},
+        {"view window", view, ManagerOfView(view), ViewStateOf(view)->edit, ViewStateOf(view)->statusBar},
     };
-    ASSERT_EQ(expected.size(), about.controls.size());
-    for (size_t i = 0; i < expected.size(); ++i)
-        EXPECT_EQ(expected[i], about.controls[i]) << "control " << i;
+    for (const Frame &f : frames) {
+        SCOPED_TRACE(f.what);
+        HWND top = QBR_GetDock(f.manager, DOCK_TOP);
+        ASSERT_NE(top, nullptr);
+        auto expectEdit = [&](const char *state) {
+            SCOPED_TRACE(state);
+            Pump();
+            RECT client;
+            GetClientRect(f.window, &client);
+            // The space the dock takes: its height less the line it shares.
+            const int topSpace = IsWindowVisible(top) ? Height(top) - 1 : 0;
+            const int statusHeight = Height(f.statusBar);
+            EXPECT_EQ(Rect(-1, topSpace - 1, client.right, client.bottom - statusHeight), WindowRectInParent(f.edit));
+        };
+        expectEdit("both toolbars docked");
+        EXPECT_TRUE(IsWindowVisible(top));
+        for (UINT entry : {0u, 1u}) // Standard and Style hidden: the dock goes
+            SendMessageA(f.window, WM_COMMAND, kToolbarsMenuBase + entry, 0);
+        Pump();
+        EXPECT_FALSE(IsWindowVisible(top));
+        expectEdit("the dock hidden");
+        SendMessageA(f.window, WM_COMMAND, kToolbarsMenuBase + 1, 0); // Style back
+        expectEdit("one toolbar docked again");
+        EXPECT_TRUE(IsWindowVisible(top));
+    }
 }
 
-// ---- Status bar --------------------------------------------------------------
+// ---- The status bar when its width changes ------------------------------------------------
 
 class StatusBarTest : public ::testing::Test {
   protected:
@@ -293,7 +467,6 @@ class StatusBarTest : public ::testing::Test {
         if (!moduleInstance) moduleInstance = GetModuleHandleA(nullptr);
         ASSERT_EQ(RegisterStatusBarClass(), 1u);
         frame = CreateRecordingFrame();
-        ShowWindow(frame, SW_SHOWNORMAL);
         bar = CreateStatusBar(frame);
         ASSERT_NE(bar, nullptr);
         Pump();
@@ -303,87 +476,8 @@ class StatusBarTest : public ::testing::Test {
         DeleteStatusBarFont();
         Pump();
     }
-    std::string Text() const {
-        const char *buffer = reinterpret_cast<const char *>(GetWindowLongPtrA(bar, 0));
-        return buffer ? buffer : "<no buffer>";
-    }
-    HWND frame = nullptr;
-    HWND bar = nullptr;
+    HWND frame = nullptr, bar = nullptr;
 };
-
-TEST_F(StatusBarTest, TextFollowsTheCommandIdAndZeroGivesTheWelcome) {
-    EXPECT_EQ(Text(), "Welcome to the Quaybar Demo!");
-    struct {
-        UINT id;
-        const char *expected;
-    } const cases[] = {
-        {204, "Display help text for identifier #204."},
-        {65535, "Display help text for identifier #65535."},
-        {0, "Welcome to the Quaybar Demo!"},
-    };
-    for (const auto &c : cases) {
-        SetStatusText(bar, c.id);
-        EXPECT_EQ(Text(), c.expected) << c.id;
-    }
-}
-
-// An 8 point "MS Sans Serif" line plus 12 pixels.
-TEST_F(StatusBarTest, HeightFollowsTheFontAndStaysWhenTheFrameResizes) {
-    HDC screen = GetDC(nullptr);
-    HFONT made = CreateFontA(-MulDiv(8, GetDeviceCaps(screen, LOGPIXELSY), 72), 0, 0, 0, FW_NORMAL, 0, 0, 0, 0, 0, 0, 0,
-                             VARIABLE_PITCH | FF_SWISS, "MS Sans Serif");
-    HGDIOBJ old = SelectObject(screen, made);
-    TEXTMETRICA metrics = {};
-    GetTextMetricsA(screen, &metrics);
-    DeleteObject(SelectObject(screen, old));
-    ReleaseDC(nullptr, screen);
-
-    const int expected = metrics.tmHeight - metrics.tmInternalLeading + 12;
-    RECT r = WindowRectInParent(bar);
-    EXPECT_EQ(r.bottom - r.top, expected);
-    EXPECT_EQ(GetParent(bar), frame);
-    SetWindowPos(frame, nullptr, 0, 0, 300, 200, SWP_NOMOVE | SWP_NOZORDER);
-    Pump();
-    r = WindowRectInParent(bar);
-    EXPECT_EQ(r.bottom - r.top, expected);
-}
-
-TEST_F(StatusBarTest, PaintsASunkenPanelInFixedColoursWithTheTextInside) {
-    const int w = 200;
-    SetWindowPos(bar, nullptr, 0, 0, w, 25, SWP_NOZORDER);
-    Pump();
-    const int h = 25;
-    Pixels welcome = ReadWindowPixels(bar);
-    ASSERT_EQ(welcome.width, w);
-    ASSERT_EQ(welcome.height, h);
-    const COLORREF grey = RGB(0xC0, 0xC0, 0xC0), dark = RGB(0x80, 0x80, 0x80), white = RGB(0xFF, 0xFF, 0xFF);
-    struct {
-        int x, y;
-        COLORREF colour;
-        const char *what;
-    } const points[] = {
-        {2, 2, grey, "background"},        {w - 2, h - 3, grey, "background right of the panel"},
-        {50, 0, white, "top line"},        {50, h - 1, dark, "bottom line"},
-        {6, 10, dark, "panel left edge"},  {50, 3, dark, "panel top edge"},
-        {w - 5, 10, white, "panel right"}, {50, h - 3, white, "panel bottom edge"},
-        {w - 6, 10, grey, "panel inside"},
-    };
-    for (const auto &p : points)
-        EXPECT_EQ(welcome.At(p.x, p.y), p.colour) << p.what << " at " << p.x << "," << p.y;
-
-    // The text is drawn inside the panel: some pixels there are neither grey
-    // nor edge colours, and they change with the text.
-    int inked = 0;
-    for (int y = 5; y < h - 3; ++y)
-        for (int x = 10; x < w - 6; ++x)
-            inked += welcome.At(x, y) != grey;
-    EXPECT_GT(inked, 20);
-    SetStatusText(bar, 204);
-    Pixels help = ReadWindowPixels(bar);
-    EXPECT_NE(help.colors, welcome.colors);
-}
-
-// ---- The status bar when its width changes ------------------------------------------------
 
 // Widened or narrowed by SetWindowPos, the bar is painted whole again: no
 // panel edge stays where the old width put it, and the text stays.

@@ -157,22 +157,6 @@ TEST_F(ScaleTest, TheChevronGrowsWithTheFramesScale) {
     EXPECT_EQ(28 * square * square, inked) << "two heads of 7 rows of 2 pixels";
 }
 
-// The floating frame: its caption band (the caption font's, at the screen's
-// scale) and the margins below it at the frame's scale.
-TEST_F(ScaleTest, FloatingFrameItemsStandBelowTheCaptionBand) {
-    const Scaled &s = Here();
-    HWND pane = Make({1, 2}, TBF_VISIBLE | TBF_FLOATING);
-    Pump();
-    HWND frameWindow = ResolveRoleWindow(pane, ROLE_FLOATING);
-    const int top = captionHeight + s.frameTop, l = s.areaLeft, bw = s.buttonWidth, bh = s.buttonHeight;
-    EXPECT_EQ((std::vector<RECT>{Rect(l, top, l + bw, top + bh), Rect(l + bw - 1, top, l + 2 * bw - 1, top + bh)}),
-              ItemRects(pane));
-    RECT client = ClientRectOf(frameWindow);
-    EXPECT_EQ(Rect(0, 0, l + 2 * bw - 1 + l, top + bh + s.frameBottom), client);
-    // The caption font grows with the screen: its band is taller than at 96.
-    if (s.dpi > 96) EXPECT_GT(captionHeight, 10);
-}
-
 // ---- Sharp images -------------------------------------------------------------------
 
 namespace {
@@ -331,23 +315,6 @@ TEST_F(ScaleTest, TheChevronsMenuShowsEachButtonsOwnImageAtTheFramesScale) {
             }
         EXPECT_TRUE(found) << "the menu line's image is not the button's";
     }
-}
-
-// At 96 DPI a frame never sees the strips drawn for larger scales.
-TEST(StripScale, AtTheBaseScaleTheLibraryLoadsExactlyTheGivenStrip) {
-    // Only the run at 96 DPI can show this; the runs at 144 and 192 say so.
-    if (ScreenDpi() != 96) GTEST_SKIP() << "a 96-DPI case, shown by the run at 96 DPI";
-    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
-    HWND frame = CreateRecordingFrame();
-    ToolbarManager *m = QBR_CreateManager(frame);
-    ASSERT_EQ(1u, QBR_SetImageStrip(m, "MAIN"));
-    BITMAP info = {};
-    GetObjectA(m->imageStrip, sizeof info, &info);
-    EXPECT_EQ(368, info.bmWidth);
-    EXPECT_EQ(30, info.bmHeight);
-    QBR_DestroyManager(m);
-    DestroyWindow(frame);
-    QBR_Terminate();
 }
 
 // ---- A new scale for a frame ----------------------------------------------------------

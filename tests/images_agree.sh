@@ -15,7 +15,7 @@ compare() { # committed file, the freshly drawn one, how to draw it again
     fi
 }
 
-for picture in "$here"/demo/images/*.txt; do
+for picture in "$here"/demo/images/*.txt "$here"/tests/support/test_strip.txt; do
     base=${picture%.txt}
     committed=
     for ext in bmp ico; do [ -f "$base.$ext" ] && committed=$base.$ext; done
@@ -38,8 +38,5 @@ for picture in "$here"/demo/images/*.txt; do
     done
 done
 
-python3 "$here/tests/support/make_test_bmp.py" "$scratch/test_strip.bmp"
-compare "$here/tests/support/test_strip.bmp" "$scratch/test_strip.bmp" \
-    "tests/support/make_test_bmp.py tests/support/test_strip.bmp"
 [ "$status" = 0 ] && echo "images: every committed picture matches its source"
 exit "$status"

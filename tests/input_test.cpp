@@ -1,7 +1,8 @@
 // The left mouse button on real toolbars: the real cursor is put in place and
-// each mouse message goes where the window system would send it. The tests
-// look at what the host frame heard, button states and looks, where toolbars
-// went, and the drag frame on the screen itself.
+// each mouse message goes where the window system would send it (or, for
+// clicks, double clicks and border sizing, through the platform's own input
+// queue). The tests read what the host frame heard, looks, places and the
+// drag frame on the screen.
 #include <algorithm>
 #include <functional>
 #include <memory>
@@ -25,16 +26,14 @@ POINT ScreenOf(HWND window, int x, int y) {
     return p;
 }
 POINT Offset(POINT p, int dx, int dy) { return POINT{p.x + dx, p.y + dy}; }
-
 void Mouse(UINT message, POINT p) {
     SendMouse(message, p, message == WM_LBUTTONUP || message == WM_MOUSEMOVE ? 0 : MK_LBUTTON);
 }
 void Down(POINT p) { Mouse(WM_LBUTTONDOWN, p); }
 void Move(POINT p) { Mouse(WM_MOUSEMOVE, p); }
 void Up(POINT p) { Mouse(WM_LBUTTONUP, p); }
-void Click(POINT p) { Down(p), Up(p); }
 
-// The state flags and the capture, as one value.
+// The mouse state flags and the capture, as one value.
 enum : UINT { kPress = 1, kDrag = 2, kClose = 4, kCaptured = 8 };
 UINT TrackState() {
     return (mouseTrack.pressActive ? kPress : 0) | (mouseTrack.dragActive ? kDrag : 0) |
@@ -45,18 +44,16 @@ Heard Press(UINT id) { return {kPressMessage, id & 0xFFFF, 0}; }
 Heard Release(UINT id) { return {kReleaseMessage, (id & 0xFFFF) | 0xFFFF0000u, 0}; }
 Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
 
-// A host around the recording frame: notes the mouse state at every message
-// the library sends it, and runs buttons 1..4 as a radio group.
+// A host around the recording frame that notes the mouse state at every
+// message the library sends it, and can look at the screen when it hears a
+// press.
 std::vector<UINT> stateHeard;
+std::function<void()> atPress;
 WNDPROC recordingProc = nullptr;
-ToolbarManager *hostManager = nullptr;
-bool hostRunsRadio = false;
-
 LRESULT CALLBACK HostProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
     if (message == WM_COMMAND || message == kPressMessage || message == kReleaseMessage || message == WM_SIZE)
         stateHeard.push_back(TrackState());
-    if (message == WM_COMMAND && hostRunsRadio && wParam >= 1 && wParam <= 4)
-        QBR_SetRadioRange(hostManager, 1, 4, static_cast<UINT>(wParam));
+    if (message == kPressMessage && atPress) atPress();
     return CallWindowProcA(recordingProc, window, message, wParam, lParam);
 }
 
@@ -68,7 +65,6 @@ class InputTest : public FrameTest {
         ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
         QBR_SetQuickHelp(0); // no tip windows under the cursor
         top = MakeDock(DOCK_TOP);
-        hostManager = manager;
         recordingProc =
             reinterpret_cast<WNDPROC>(SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(HostProc)));
     }
@@ -76,10 +72,9 @@ class InputTest : public FrameTest {
         EXPECT_EQ(0u, TrackState()) << "a press or drag was left running";
         ReleaseCapture();
         mouseTrack = MouseTrack{};
-        hostRunsRadio = false;
+        atPress = nullptr;
         FrameTest::TearDown();
     }
-    // A toolbar, with the frame's log cleared after it.
     HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr) {
         HWND pane = QBR_CreateToolbar("Tools", flags, 300, 250, 0, 0, dock ? dock : top, ids.data(), UINT(ids.size()));
         Pump();
@@ -94,8 +89,8 @@ class InputTest : public FrameTest {
         return r;
     }
     static POINT Button(HWND pane, UINT index) {
-        RECT r = ItemRect(pane, index);
-        return ScreenOf(Active(pane), (r.left + r.right) / 2, (r.top + r.bottom) / 2);
+        const POINT c = Centre(ItemRect(pane, index));
+        return ScreenOf(Active(pane), c.x, c.y);
     }
     static POINT Empty(HWND pane) { // in the right margin, beside the items
         RECT c = ClientRectOf(Active(pane));
@@ -105,13 +100,11 @@ class InputTest : public FrameTest {
         HWND w = ResolveRoleWindow(pane, ROLE_FLOATING);
         return ScreenOf(w, ClientRectOf(w).right - 4, captionHeight / 2);
     }
-    static POINT CloseBox(HWND pane) { return ScreenOf(ResolveRoleWindow(pane, ROLE_FLOATING), 3, 3); }
     static POINT InDock(HWND dock) { // clear of the line a side dock shares with the top dock
         RECT r;
         GetWindowRect(dock, &r);
         return POINT{(r.left + r.right) / 2, r.top + std::min<LONG>(40, (r.bottom - r.top) / 2)};
     }
-    POINT Outside() { return ScreenOf(frame, 330, 300); } // the frame's own client area
     static std::vector<HWND> Order(HWND dock) {
         std::vector<HWND> out;
         DockArea *area = FindDockRecord(dock);
@@ -123,7 +116,7 @@ class InputTest : public FrameTest {
         return QBR_GetToolbarFlags(pane) & (TBF_VISIBLE | TBF_HIDDEN | TBF_DOCKED | TBF_FLOATING);
     }
     bool Pressed(UINT id) { return QBR_IsButtonPressed(manager, id) != 0; }
-    // What a client rectangle of the toolbar's active window shows now.
+    // What a client rectangle of a window shows after a repaint.
     static std::vector<COLORREF> Look(HWND window, const RECT &r) {
         const Pixels px = ReadWindowPixels(window);
         std::vector<COLORREF> out;
@@ -136,13 +129,14 @@ class InputTest : public FrameTest {
     HWND top = nullptr;
 };
 
-// ---- Button presses -----------------------------------------------------------------
-
+// A completed press acts by the button's behaviour; the host hears the press
+// with the mouse held, the release and the command once all is clear; a
+// notification carries the id's low 16 bits, the command the whole id.
 TEST_F(InputTest, ACompletedPressActsByBehaviour) {
-    struct Case {
+    const struct {
         const char *name;
         UINT behaviour, stateBefore, pressedBefore, stateAfter, pressedAfter;
-    } const cases[] = {
+    } cases[] = {
         {"push", BTN_PUSH, 0, 0, 0, 0},
         {"check off goes on", BTN_CHECK, 0, 0, 1, 0},
         {"check on goes off", BTN_CHECK, 1, 0, 0, 0},
@@ -152,144 +146,122 @@ TEST_F(InputTest, ACompletedPressActsByBehaviour) {
         {"push and check act as check", BTN_PUSH | BTN_CHECK, 0, 0, 1, 0},
         {"neither acts as latch", 0, 0, 0, 0, 1},
     };
-    HWND pane = Make({1, 2, 3});
-    for (const Case &c : cases) {
+    AddButtons(0x12345, 1);
+    HWND pane = Make({1, 0x12345, 3});
+    for (const auto &c : cases) {
         SCOPED_TRACE(c.name);
-        QBR_SetButtonBehaviour(manager, 2, c.behaviour);
-        QBR_SetButtonState(manager, 2, c.stateBefore);
-        QBR_SetButtonPressed(manager, 2, c.pressedBefore);
+        QBR_SetButtonBehaviour(manager, 0x12345, c.behaviour);
+        QBR_SetButtonState(manager, 0x12345, c.stateBefore);
+        QBR_SetButtonPressed(manager, 0x12345, c.pressedBefore);
         Pump();
         ClearFrameLog();
         stateHeard.clear();
         Down(Button(pane, 1));
-        EXPECT_TRUE(Pressed(2));
-        EXPECT_EQ(std::vector<Heard>{Press(2)}, FrameLog()) << Describe(FrameLog());
+        EXPECT_TRUE(Pressed(0x12345));
         Up(Button(pane, 1));
-        EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
-        EXPECT_EQ(c.stateAfter, QBR_GetButtonState(manager, 2));
-        EXPECT_EQ(c.pressedAfter != 0, Pressed(2));
-        // The press is heard with the mouse held; the end only when all is clear.
+        EXPECT_EQ((std::vector<Heard>{{kPressMessage, 0x2345, 0}, {kReleaseMessage, 0xFFFF2345, 0}, Command(0x12345)}),
+                  FrameLog())
+            << Describe(FrameLog());
+        EXPECT_EQ(c.stateAfter, QBR_GetButtonState(manager, 0x12345));
+        EXPECT_EQ(c.pressedAfter != 0, Pressed(0x12345));
         EXPECT_EQ((std::vector<UINT>{kPress | kCaptured, 0, 0}), stateHeard);
     }
+    QBR_SetNotifyMessages(0, 0);
+    ClearFrameLog();
+    Down(Button(pane, 0));
+    Up(Button(pane, 0));
+    EXPECT_EQ(std::vector<Heard>{Command(1)}, FrameLog()) << "notifications switched off";
 }
 
-// A sequence is a script of steps: d, m or u (left down, move, left up) and
-// where: 1 and 2 the first and second button, - off the buttons. `looks`
-// says after each step whether the first button is pressed.
+// Scripts of steps d, m or u (left down, move, left up) at 1 or 2 (the first
+// or second button) or - (off the buttons); `looks` says after each step
+// whether the pressed button looks pressed. Button 2 is a disabled check
+// button: tracked and reported, never pressed-looking, never acting. While
+// the application is inactive (i), a move leaves the look alone.
 TEST_F(InputTest, ThePressedLookFollowsTheCursorAndOnlyAReleaseOnTheButtonActs) {
     HWND pane = Make({1, 2, 3});
+    QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
+    QBR_SetButtonEnabled(manager, 2, 0);
     const std::vector<COLORREF> up1 = Look(pane, 0), up2 = Look(pane, 1);
     QBR_SetButtonPressed(manager, 1, 1);
     const std::vector<COLORREF> down1 = Look(pane, 0);
     QBR_SetButtonPressed(manager, 1, 0);
     ASSERT_NE(up1, down1);
-    struct Sequence {
+    const struct {
         const char *name, *script, *looks;
         bool acts;
-    } const sequences[] = {
+    } sequences[] = {
         {"off, back and released on it", "d1 m- m1 u1", "1010", true},
         {"released off it", "d1 m- u-", "100", false},
         {"released on its neighbour", "d1 m2 u2", "100", false},
         {"released off with the pressed look", "d1 u-", "10", false},
+        {"other presses while one runs change nothing", "d1 d2 d- u1", "1000", true},
+        {"inactive, moved off, active again", "d1 i- m- a- m- u-", "111100", false},
+        {"disabled, released on it", "d2 m- m2 u2", "0000", false},
+        {"disabled, released off it", "d2 m- u-", "000", false},
     };
-    for (const Sequence &s : sequences) {
+    for (const auto &s : sequences) {
         ClearFrameLog();
+        const UINT id = s.script[1] - '0';
         for (int i = 0; s.looks[i]; ++i) {
             SCOPED_TRACE(std::string(s.name) + ", step " + std::to_string(i));
             const char *step = s.script + 3 * i;
             const POINT at = step[1] == '-' ? Empty(pane) : Button(pane, step[1] - '1');
-            Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
+            if (step[0] == 'i' || step[0] == 'a')
+                EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, step[0] == 'a', 0));
+            else
+                Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
             const bool pressed = s.looks[i] == '1';
             EXPECT_EQ(pressed, Pressed(1));
             EXPECT_FALSE(Pressed(2));
             EXPECT_TRUE(Look(pane, 0) == (pressed ? down1 : up1));
-            EXPECT_TRUE(Look(pane, 1) == up2) << "the neighbour never looks pressed";
+            EXPECT_TRUE(Look(pane, 1) == up2) << "the neighbour and the disabled button never look pressed";
         }
-        std::vector<Heard> heard = {Press(1), Release(1)};
-        if (s.acts) heard.push_back(Command(1));
+        std::vector<Heard> heard = {Press(id), Release(id)};
+        if (s.acts) heard.push_back(Command(id));
         EXPECT_EQ(heard, FrameLog()) << s.name << ": " << Describe(FrameLog());
     }
+    EXPECT_EQ(0u, QBR_GetButtonState(manager, 2));
 }
 
-TEST_F(InputTest, ADisabledButtonIsTrackedAndReportedButNeverActs) {
+// What a window shows now, read from its device context without a repaint.
+std::vector<COLORREF> Shown(HWND window, const RECT &r) {
+    HDC dc = GetDC(window);
+    Pixels px = ReadPixelsFrom(dc, r.left, r.top, r.right - r.left, r.bottom - r.top);
+    ReleaseDC(window, dc);
+    return px.colors;
+}
+
+// When the host hears of a press, the button already shows its pressed look
+// in the window: painted, not only invalidated.
+TEST_F(InputTest, ThePressedLookIsShownBeforeTheHostHearsThePress) {
     HWND pane = Make({1, 2, 3});
-    QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
-    QBR_SetButtonEnabled(manager, 2, 0);
-    const std::vector<COLORREF> look = Look(pane, 1);
-    for (bool releaseOn : {true, false}) {
-        SCOPED_TRACE(releaseOn ? "released on it" : "released off it");
-        ClearFrameLog();
-        Down(Button(pane, 1));
-        EXPECT_EQ(kPress | kCaptured, TrackState());
-        Move(Empty(pane));
-        Move(Button(pane, 1));
-        EXPECT_FALSE(Pressed(2));
-        EXPECT_TRUE(Look(pane, 1) == look);
-        Up(releaseOn ? Button(pane, 1) : Empty(pane));
-        EXPECT_EQ((std::vector<Heard>{Press(2), Release(2)}), FrameLog()) << Describe(FrameLog());
-        EXPECT_EQ(0u, QBR_GetButtonState(manager, 2));
-    }
+    const RECT r = ItemRect(pane, 1);
+    Look(pane, 1); // everything painted
+    const std::vector<COLORREF> up = Shown(Active(pane), r);
+    QBR_SetButtonPressed(manager, 2, 1);
+    Look(pane, 1);
+    const std::vector<COLORREF> down = Shown(Active(pane), r);
+    QBR_SetButtonPressed(manager, 2, 0);
+    Look(pane, 1);
+    ASSERT_NE(up, down);
+    std::vector<COLORREF> heard;
+    atPress = [&] { heard = Shown(Active(pane), r); };
+    Down(Button(pane, 1));
+    atPress = nullptr;
+    Up(Button(pane, 1));
+    EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
+    EXPECT_TRUE(heard == down) << (heard == up ? "the host heard the press before the look was shown" : "no look read");
 }
 
-// While the application is inactive, moves over a toolbar do nothing: a press
-// keeps its look off the button until WM_ACTIVATEAPP says the application is
-// active again.
-TEST_F(InputTest, MovesDoNothingWhileTheApplicationIsInactive) {
-    HWND pane = Make({1, 2, 3});
-    Down(Button(pane, 0));
-    ASSERT_TRUE(Pressed(1));
-    EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, FALSE, 0));
-    Move(Empty(pane));
-    EXPECT_TRUE(Pressed(1)) << "a move while inactive";
-    EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, TRUE, 0));
-    Move(Empty(pane));
-    EXPECT_FALSE(Pressed(1)) << "a move once active again";
-    Up(Empty(pane));
-    EXPECT_EQ((std::vector<Heard>{Press(1), Release(1)}), FrameLog()) << Describe(FrameLog());
-}
-
-TEST_F(InputTest, NotificationsCarrySixteenBitsAndCanBeSwitchedOff) {
-    AddButtons(0x12345, 1);
-    HWND pane = Make({0x12345});
-    Click(Button(pane, 0));
-    EXPECT_EQ((std::vector<Heard>{{kPressMessage, 0x2345, 0}, {kReleaseMessage, 0xFFFF2345, 0}, Command(0x12345)}),
-              FrameLog())
-        << Describe(FrameLog());
-    QBR_SetNotifyMessages(0, 0);
-    ClearFrameLog();
-    Click(Button(pane, 0));
-    EXPECT_EQ(std::vector<Heard>{Command(0x12345)}, FrameLog()) << Describe(FrameLog());
-}
-
-TEST_F(InputTest, CheckButtonsMakeARadioGroupWithTheHost) {
-    hostRunsRadio = true;
-    for (UINT id = 1; id <= 4; ++id)
-        QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
-    QBR_SetRadioRange(manager, 1, 4, 1);
-    HWND pane = Make({1, 2, 3, 4});
-    HWND other = Make({4});
-    const std::vector<COLORREF> off4 = Look(other, 0);
-    // Clicking the button that is on leaves it on: the library turns it
-    // off, and the host's answer to the command turns it on again.
-    for (UINT click : {3, 3, 4, 1}) {
-        Click(Button(pane, click - 1));
-        for (UINT id = 1; id <= 4; ++id)
-            EXPECT_EQ(id == click ? 1u : 0u, QBR_GetButtonState(manager, id)) << "click " << click << ", id " << id;
-        EXPECT_EQ(click != 4, Look(other, 0) == off4) << "the other toolbar follows at once, click " << click;
-    }
-}
-
-// Through the platform's input queue, with activation and double click
-// detection. The cursor is settled first: under Wine, GetCursorPos can lag
-// behind an input event that moves it.
+// Through the platform's input queue: a click presses a button and a double
+// click on the empty space floats the toolbar.
 TEST_F(InputTest, RealInputClicksAButtonAndDoubleClicksAToolbarOff) {
-    auto real = [](POINT p, std::vector<DWORD> buttons) {
+    auto real = [](POINT p, int clicks) {
         PlaceCursor(p);
-        for (DWORD flags : buttons) {
-            INPUT in = {};
-            in.type = INPUT_MOUSE;
-            in.mi.dwFlags = flags;
-            SendInput(1, &in, sizeof in);
+        for (int i = 0; i < clicks; ++i) {
+            SendButton(MOUSEEVENTF_LEFTDOWN);
+            SendButton(MOUSEEVENTF_LEFTUP);
         }
     };
     auto pumpUntil = [](auto done) { // bounded: the queue delivers later
@@ -298,12 +270,251 @@ TEST_F(InputTest, RealInputClicksAButtonAndDoubleClicksAToolbarOff) {
         return done();
     };
     HWND pane = Make({1, 2, 3});
-    real(Button(pane, 2), {MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP});
+    real(Button(pane, 2), 1);
     ASSERT_TRUE(pumpUntil([] { return CountHeard(WM_COMMAND) > 0; }));
     EXPECT_EQ((std::vector<Heard>{Press(3), Release(3), Command(3)}), FrameLog()) << Describe(FrameLog());
-    real(Empty(pane), {MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP, MOUSEEVENTF_LEFTDOWN, MOUSEEVENTF_LEFTUP});
+    real(Empty(pane), 2);
     EXPECT_TRUE(pumpUntil([&] { return QBR_IsToolbarFloating(pane) != 0; }));
     pumpUntil([] { return TrackState() == 0; });
+}
+
+// What the window system sends for a double click, where it lands.
+TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
+    enum Where { EmptySpace, CaptionBand, Box, OnButton };
+    struct Case {
+        const char *name;
+        UINT flags;
+        Where where;
+        UINT place;
+        int commands;
+    } const cases[] = {
+        {"docked, empty space: floats", TBF_DOCKED, EmptySpace, TBF_VISIBLE | TBF_FLOATING, 0},
+        {"docked, on a button: only the click", TBF_DOCKED, OnButton, TBF_VISIBLE | TBF_DOCKED, 1},
+        {"floating, caption: docks", TBF_FLOATING, CaptionBand, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"floating, empty space: docks", TBF_FLOATING, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"floating, on a button: only the click", TBF_FLOATING, OnButton, TBF_VISIBLE | TBF_FLOATING, 1},
+        {"floating, close box: hidden", TBF_FLOATING, Box, TBF_HIDDEN | TBF_FLOATING, 0},
+        {"locked docked: stays", TBF_DOCKED | TBF_LOCKED_PLACE, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
+        {"locked floating: stays", TBF_FLOATING | TBF_LOCKED_PLACE, CaptionBand, TBF_VISIBLE | TBF_FLOATING, 0},
+        {"locked floating, close box: hidden", TBF_FLOATING | TBF_LOCKED_PLACE, Box, TBF_HIDDEN | TBF_FLOATING, 0},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND pane = Make({1, 2}, TBF_VISIBLE | c.flags);
+        const POINT p = c.where == EmptySpace    ? Empty(pane)
+                        : c.where == CaptionBand ? Caption(pane)
+                        : c.where == Box         ? ScreenOf(ResolveRoleWindow(pane, ROLE_FLOATING), 3, 3)
+                                                 : Button(pane, 0);
+        // What the window system sends for a double click. On the close box
+        // the first click hides the toolbar already, so there the double
+        // click message comes alone.
+        if (c.where != Box) Down(p), Up(p);
+        Mouse(WM_LBUTTONDBLCLK, p);
+        Up(p);
+        EXPECT_EQ(c.place, Place(pane));
+        EXPECT_EQ(c.commands, CountHeard(WM_COMMAND));
+        EXPECT_EQ(c.commands, CountHeard(kReleaseMessage));
+        QBR_DestroyToolbar(pane);
+    }
+}
+
+// Scripts as above, with b the close box and c the caption beside it;
+// `looks` says whether the box is shown inverted.
+TEST_F(InputTest, TheCloseBoxTracksLikeAButtonAndHides) {
+    struct Sequence {
+        const char *name;
+        UINT flags;
+        const char *script, *looks;
+        bool hidden;
+    } const sequences[] = {
+        {"out and in again", TBF_FLOATING, "db mc mb ub", "1010", true},
+        {"let go outside", TBF_FLOATING, "db mc uc", "100", false},
+        {"locked place", TBF_FLOATING | TBF_LOCKED_PLACE, "db ub", "10", true},
+    };
+    for (const Sequence &s : sequences) {
+        SCOPED_TRACE(s.name);
+        HWND pane = Make({1, 2}, TBF_VISIBLE | s.flags);
+        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT box;
+        CloseBoxRect(floating, &box);
+        const std::vector<COLORREF> plain = Look(floating, box);
+        std::vector<COLORREF> inverted = plain;
+        for (COLORREF &c : inverted)
+            c ^= 0xFFFFFF;
+        for (int i = 0; s.looks[i]; ++i) {
+            const char *step = s.script + 3 * i;
+            const POINT at = step[1] == 'b' ? ScreenOf(ResolveRoleWindow(pane, ROLE_FLOATING), 3, 3) : Caption(pane);
+            Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
+            if (IsWindowVisible(floating))
+                EXPECT_TRUE(Look(floating, box) == (s.looks[i] == '1' ? inverted : plain)) << "step " << i;
+        }
+        EXPECT_EQ(s.hidden ? TBF_HIDDEN | TBF_FLOATING : TBF_VISIBLE | TBF_FLOATING, Place(pane));
+        EXPECT_EQ(s.hidden, !IsWindowVisible(floating));
+        EXPECT_EQ(0, CountHeard(WM_COMMAND) + CountHeard(kPressMessage) + CountHeard(kReleaseMessage));
+        QBR_DestroyToolbar(pane);
+    }
+}
+
+TEST_F(InputTest, DropsDockFloatAndKeepLockedToolbarsOnTheirSide) {
+    HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
+    enum Drop { Outside_, OnTop, OnLeft, OnRight };
+    const UINT kLocked = TBF_LOCKED_PLACE;
+    struct Case {
+        const char *name;
+        UINT flags;
+        Drop drop;
+        UINT place;
+        HWND *dock;           // where the pane stands afterwards
+        bool frameFollows;    // the floating frame is at the drag frame's corner
+        HWND *from = nullptr; // the dock it starts in, if not the top dock
+    } const cases[] = {
+        {"docked, let go outside: floats", TBF_DOCKED, Outside_, TBF_FLOATING, &top, true},
+        {"floating onto the top dock", TBF_FLOATING, OnTop, TBF_DOCKED, &top, false},
+        {"floating onto the hidden left dock", TBF_FLOATING, OnLeft, TBF_DOCKED, &left, false},
+        {"floating onto the hidden right dock", TBF_FLOATING, OnRight, TBF_DOCKED, &right, false},
+        {"floating, let go outside: the frame moves", TBF_FLOATING, Outside_, TBF_FLOATING, &top, true},
+        {"docked onto another dock", TBF_DOCKED, OnLeft, TBF_DOCKED, &left, false},
+        {"the last toolbar leaves a side dock, which hides", TBF_DOCKED, OnRight, TBF_DOCKED, &right, false, &left},
+        {"locked docked, outside: nothing moves", TBF_DOCKED | kLocked, Outside_, TBF_DOCKED, &top, false},
+        {"locked docked onto another dock", TBF_DOCKED | kLocked, OnRight, TBF_DOCKED, &right, false},
+        {"locked floating over a dock: stays floating", TBF_FLOATING | kLocked, OnTop, TBF_FLOATING, &top, true},
+        {"locked floating, outside: the frame moves", TBF_FLOATING | kLocked, Outside_, TBF_FLOATING, &top, true},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND anchor = Make({5, 6}); // keeps the top dock showing
+        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | c.flags, c.from ? *c.from : top);
+        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
+        RECT pressed, frameBefore, frameAfter;
+        GetWindowRect(Active(pane), &pressed);
+        GetWindowRect(floating, &frameBefore);
+        const RECT paneBefore = WindowRectInParent(pane);
+        const POINT from = c.flags & TBF_FLOATING ? Caption(pane) : Empty(pane);
+        const POINT to = c.drop == Outside_ ? ScreenOf(frame, 330, 300)
+                                            : InDock(c.drop == OnTop    ? top
+                                                     : c.drop == OnLeft ? left
+                                                                        : right);
+        Down(from);
+        EXPECT_EQ(kDrag | kCaptured, TrackState());
+        Move(Offset(from, 7, 9));
+        Move(to);
+        Up(to);
+        EXPECT_EQ(c.place | TBF_VISIBLE, Place(pane));
+        EXPECT_EQ(*c.dock, GetParent(pane));
+        EXPECT_EQ(*c.dock, RecordOfWindow(pane)->dockWindow);
+        const std::vector<HWND> order = Order(*c.dock);
+        EXPECT_NE(order.end(), std::find(order.begin(), order.end(), pane));
+        GetWindowRect(floating, &frameAfter);
+        if (c.frameFollows) {
+            EXPECT_EQ(pressed.left + to.x - from.x, frameAfter.left);
+            EXPECT_EQ(pressed.top + to.y - from.y, frameAfter.top);
+        } else {
+            EXPECT_EQ(frameBefore, frameAfter);
+        }
+        if (c.place == TBF_DOCKED && c.flags & TBF_DOCKED && *c.dock == top)
+            EXPECT_EQ(paneBefore, WindowRectInParent(pane));
+        if (*c.dock != top) EXPECT_TRUE(IsWindowVisible(*c.dock)) << "a dropped-on dock shows";
+        if (c.from) EXPECT_FALSE(IsWindowVisible(*c.from)) << "the emptied dock hides";
+        for (UINT state : stateHeard)
+            EXPECT_EQ(0u, state) << "the frame heard of the drop before the state was clear";
+        QBR_DestroyToolbar(pane);
+        QBR_DestroyToolbar(anchor);
+    }
+}
+
+TEST_F(InputTest, DropsReorderADock) {
+    enum Target { OnA, OnB, OnC, AfterAll };
+    struct Case {
+        const char *name;
+        int dragged; // 0 A, 1 B, 2 C
+        Target target;
+        const char *order;
+    } const cases[] = {
+        {"A onto C goes before C", 0, OnC, "BAC"},
+        {"C onto A goes first", 2, OnA, "CAB"},
+        {"A just behind its own place stays", 0, OnB, "ABC"},
+        {"B on itself stays", 1, OnB, "ABC"},
+        {"B past the end goes last", 1, AfterAll, "ACB"},
+    };
+    for (const Case &c : cases) {
+        SCOPED_TRACE(c.name);
+        HWND panes[3] = {Make({1, 2}), Make({3, 4}), Make({5, 6})};
+        RECT last;
+        GetWindowRect(panes[2], &last);
+        const POINT to =
+            c.target == AfterAll ? POINT{last.right + 30, (last.top + last.bottom) / 2} : Button(panes[c.target], 0);
+        Down(Empty(panes[c.dragged]));
+        Move(to);
+        Up(to);
+        std::string order;
+        for (HWND pane : Order(top))
+            order += static_cast<char>('A' + (std::find(panes, panes + 3, pane) - panes));
+        EXPECT_EQ(c.order, order);
+        // The dock packs in list order: each pane starts right of the one before.
+        const std::vector<HWND> packed = Order(top);
+        for (size_t i = 1; i < packed.size(); ++i)
+            EXPECT_LT(WindowRectInParent(packed[i - 1]).left, WindowRectInParent(packed[i]).left);
+        for (HWND pane : panes)
+            QBR_DestroyToolbar(pane);
+    }
+}
+
+// The frame is four 2-pixel strips along the inside of its rectangle that meet
+// without overlap, inverted through a checker of single pixels whose rows are
+// 0xAA, 0x55, ... from the screen's own origin: a pixel of the band is inverted
+// exactly where its screen x + y is even; nothing else changes.
+void ExpectExactFrame(const Pixels &before, const RECT &area, const RECT &frame, const char *what) {
+    const Pixels now = ReadScreenPixels(area);
+    RECT inside = frame;
+    InflateRect(&inside, -2, -2);
+    int wrong = 0;
+    for (int y = 0; y < now.height; ++y)
+        for (int x = 0; x < now.width; ++x) {
+            const POINT s = {area.left + x, area.top + y};
+            const bool band = PtInRect(&frame, s) && !PtInRect(&inside, s);
+            const bool inverted = band && (s.x + s.y) % 2 == 0;
+            const COLORREF want = inverted ? before.At(x, y) ^ 0xFFFFFF : before.At(x, y);
+            if (now.At(x, y) != want && ++wrong <= 5)
+                ADD_FAILURE() << what << ": " << s.x << "," << s.y << (band ? " in the band" : " outside the band")
+                              << (inverted ? ", should be inverted" : ", should be kept");
+        }
+    EXPECT_EQ(0, wrong) << what;
+}
+
+TEST_F(InputTest, TheDragFrameIsAnExactCheckerOfFourStrips) {
+    // Rectangles of both parities of corner, width and height, down to the
+    // smallest with a left strip.
+    const RECT frames[] = {Rect(300, 200, 340, 230), Rect(301, 201, 338, 227), Rect(310, 211, 315, 216),
+                           Rect(320, 221, 324, 226)};
+    for (const RECT &f : frames) {
+        const RECT area = {f.left - 4, f.top - 4, f.right + 4, f.bottom + 4};
+        const Pixels before = ReadScreenPixels(area);
+        DrawDragFrame(&f);
+        ExpectExactFrame(before, area, f, "drawn");
+        DrawDragFrame(&f);
+        EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors) << "drawn twice";
+    }
+    // A real drag: the frame at the toolbar's outer rectangle, then where a
+    // move by an odd distance takes it.
+    HWND pane = Make({1, 2, 3});
+    RECT outer;
+    GetWindowRect(pane, &outer);
+    const RECT area = {outer.left - 10, outer.top - 10, outer.right + 50, outer.bottom + 50};
+    const POINT from = Empty(pane);
+    const Pixels before = ReadScreenPixels(area);
+    Down(from);
+    ExpectExactFrame(before, area, outer, "at the press");
+    Move(Offset(from, 21, 13));
+    RECT moved = outer;
+    OffsetRect(&moved, 21, 13);
+    ExpectExactFrame(before, area, moved, "moved");
+    Move(Offset(from, 20, 13));
+    OffsetRect(&moved, -1, 0);
+    ExpectExactFrame(before, area, moved, "moved back one pixel");
+    Move(from);
+    EXPECT_EQ(outer, mouseTrack.dragFrame) << "back at the start";
+    Up(from);
+    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
 }
 
 // ---- Sizing a floating toolbar by its border --------------------------------
@@ -339,11 +550,9 @@ void MoveCursorStep(POINT p) {
 
 // With the contents shown while sizing, the window system resizes a frame at
 // every mouse move of a border drag. However many steps the drag takes, the
-// frame never gets smaller than one button, and when the user lets go the
-// items are wrapped for the width chosen and the frame is exactly what one
-// refit of that width gives. The drags go through the platform's own sizing
-// loop with the real cursor and buttons, one after the other on one toolbar
-// of eight buttons (one row, 205 pixels wide at the start).
+// frame never gets smaller than one button, and when the user lets go it is
+// exactly what one refit of the chosen width gives. The drags go through the
+// platform's own sizing loop with the real cursor and buttons.
 TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
     struct Case {
         const char *name;
@@ -429,442 +638,6 @@ TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
     }
     EXPECT_EQ(TBF_VISIBLE | TBF_FLOATING, Place(pane));
     EXPECT_EQ(0u, borderSizing);
-}
-
-// ---- The close box ---------------------------------------------------------------
-
-// Scripts as above, with b the close box and c the caption beside it;
-// `looks` says whether the box is shown inverted.
-TEST_F(InputTest, TheCloseBoxTracksLikeAButtonAndHides) {
-    struct Sequence {
-        const char *name;
-        UINT flags;
-        const char *script, *looks;
-        bool hidden;
-    } const sequences[] = {
-        {"out and in again", TBF_FLOATING, "db mc mb ub", "1010", true},
-        {"let go outside", TBF_FLOATING, "db mc uc", "100", false},
-        {"locked place", TBF_FLOATING | TBF_LOCKED_PLACE, "db ub", "10", true},
-    };
-    for (const Sequence &s : sequences) {
-        SCOPED_TRACE(s.name);
-        HWND pane = Make({1, 2}, TBF_VISIBLE | s.flags);
-        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
-        RECT box;
-        CloseBoxRect(floating, &box);
-        const std::vector<COLORREF> plain = Look(floating, box);
-        std::vector<COLORREF> inverted = plain;
-        for (COLORREF &c : inverted)
-            c ^= 0xFFFFFF;
-        for (int i = 0; s.looks[i]; ++i) {
-            const char *step = s.script + 3 * i;
-            const POINT at = step[1] == 'b' ? CloseBox(pane) : Caption(pane);
-            Mouse(step[0] == 'd' ? WM_LBUTTONDOWN : step[0] == 'm' ? WM_MOUSEMOVE : WM_LBUTTONUP, at);
-            if (IsWindowVisible(floating))
-                EXPECT_TRUE(Look(floating, box) == (s.looks[i] == '1' ? inverted : plain)) << "step " << i;
-        }
-        EXPECT_EQ(s.hidden ? TBF_HIDDEN | TBF_FLOATING : TBF_VISIBLE | TBF_FLOATING, Place(pane));
-        EXPECT_EQ(s.hidden, !IsWindowVisible(floating));
-        EXPECT_EQ(0, CountHeard(WM_COMMAND) + CountHeard(kPressMessage) + CountHeard(kReleaseMessage));
-        QBR_DestroyToolbar(pane);
-    }
-}
-
-// ---- Double clicks -----------------------------------------------------------------
-
-TEST_F(InputTest, DoubleClicksTearOffAndDockAgain) {
-    enum Where { EmptySpace, CaptionBand, Box, OnButton };
-    struct Case {
-        const char *name;
-        UINT flags;
-        Where where;
-        UINT place;
-        int commands;
-    } const cases[] = {
-        {"docked, empty space: floats", TBF_DOCKED, EmptySpace, TBF_VISIBLE | TBF_FLOATING, 0},
-        {"docked, on a button: only the click", TBF_DOCKED, OnButton, TBF_VISIBLE | TBF_DOCKED, 1},
-        {"floating, caption: docks", TBF_FLOATING, CaptionBand, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"floating, empty space: docks", TBF_FLOATING, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"floating, on a button: only the click", TBF_FLOATING, OnButton, TBF_VISIBLE | TBF_FLOATING, 1},
-        {"floating, close box: hidden", TBF_FLOATING, Box, TBF_HIDDEN | TBF_FLOATING, 0},
-        {"locked docked: stays", TBF_DOCKED | TBF_LOCKED_PLACE, EmptySpace, TBF_VISIBLE | TBF_DOCKED, 0},
-        {"locked floating: stays", TBF_FLOATING | TBF_LOCKED_PLACE, CaptionBand, TBF_VISIBLE | TBF_FLOATING, 0},
-        {"locked floating, close box: hidden", TBF_FLOATING | TBF_LOCKED_PLACE, Box, TBF_HIDDEN | TBF_FLOATING, 0},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.name);
-        HWND pane = Make({1, 2}, TBF_VISIBLE | c.flags);
-        const POINT p = c.where == EmptySpace    ? Empty(pane)
-                        : c.where == CaptionBand ? Caption(pane)
-                        : c.where == Box         ? CloseBox(pane)
-                                                 : Button(pane, 0);
-        // What the window system sends for a double click. On the close box
-        // the first click hides the toolbar already, so there the double
-        // click message comes alone.
-        if (c.where != Box) Click(p);
-        Mouse(WM_LBUTTONDBLCLK, p);
-        Up(p);
-        EXPECT_EQ(c.place, Place(pane));
-        EXPECT_EQ(c.commands, CountHeard(WM_COMMAND));
-        EXPECT_EQ(c.commands, CountHeard(kReleaseMessage));
-        QBR_DestroyToolbar(pane);
-    }
-}
-
-// ---- Toolbar drags -----------------------------------------------------------------
-
-// The bottom dock takes a dragged toolbar, gives it back to a double click
-// after a tear-off, and lets it go again when dragged out; it hides emptied.
-TEST_F(InputTest, ToolbarsAreDraggedIntoTheBottomDockAndOut) {
-    HWND bottom = MakeDock(DOCK_BOTTOM);
-    HWND anchor = Make({5, 6}); // keeps the top dock showing
-    HWND pane = Make({1, 2, 3});
-    const POINT into = InDock(bottom);
-    const POINT from = Empty(pane);
-    Down(from);
-    Move(Offset(from, 7, 9));
-    Move(into);
-    Up(into);
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
-    EXPECT_EQ(bottom, GetParent(pane));
-    EXPECT_EQ(bottom, QBR_GetToolbarDock(pane));
-    EXPECT_EQ(std::vector<HWND>{pane}, Order(bottom));
-    EXPECT_EQ(std::vector<HWND>{anchor}, Order(top));
-    EXPECT_TRUE(IsWindowVisible(bottom));
-    EXPECT_EQ(ClientRectOf(frame).bottom, WindowRectInParent(bottom).bottom) << "on the frame's bottom edge";
-    for (UINT state : stateHeard)
-        EXPECT_EQ(0u, state);
-
-    // A double click tears it off, another on the caption brings it back here.
-    Click(Empty(pane));
-    Mouse(WM_LBUTTONDBLCLK, Empty(pane));
-    Up(Empty(pane));
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
-    EXPECT_FALSE(IsWindowVisible(bottom));
-    Click(Caption(pane));
-    Mouse(WM_LBUTTONDBLCLK, Caption(pane));
-    Up(Caption(pane));
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), Place(pane));
-    EXPECT_EQ(bottom, GetParent(pane));
-    EXPECT_TRUE(IsWindowVisible(bottom));
-
-    // Dragged out onto the frame's client area it floats; the dock hides.
-    const POINT again = Empty(pane);
-    Down(again);
-    Move(Offset(again, 7, -9));
-    Move(Outside());
-    Up(Outside());
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), Place(pane));
-    EXPECT_FALSE(IsWindowVisible(bottom));
-    QBR_DestroyToolbar(pane);
-    QBR_DestroyToolbar(anchor);
-}
-
-
-TEST_F(InputTest, DropsDockFloatAndKeepLockedToolbarsOnTheirSide) {
-    HWND left = MakeDock(DOCK_LEFT), right = MakeDock(DOCK_RIGHT);
-    enum Drop { Outside_, OnTop, OnLeft, OnRight };
-    const UINT kLocked = TBF_LOCKED_PLACE;
-    struct Case {
-        const char *name;
-        UINT flags;
-        Drop drop;
-        UINT place;
-        HWND *dock;           // where the pane stands afterwards
-        bool frameFollows;    // the floating frame is at the drag frame's corner
-        HWND *from = nullptr; // the dock it starts in, if not the top dock
-    } const cases[] = {
-        {"docked, let go outside: floats", TBF_DOCKED, Outside_, TBF_FLOATING, &top, true},
-        {"floating onto the top dock", TBF_FLOATING, OnTop, TBF_DOCKED, &top, false},
-        {"floating onto the hidden left dock", TBF_FLOATING, OnLeft, TBF_DOCKED, &left, false},
-        {"floating onto the hidden right dock", TBF_FLOATING, OnRight, TBF_DOCKED, &right, false},
-        {"floating, let go outside: the frame moves", TBF_FLOATING, Outside_, TBF_FLOATING, &top, true},
-        {"docked onto another dock", TBF_DOCKED, OnLeft, TBF_DOCKED, &left, false},
-        {"the last toolbar leaves a side dock, which hides", TBF_DOCKED, OnRight, TBF_DOCKED, &right, false, &left},
-        {"locked docked, outside: nothing moves", TBF_DOCKED | kLocked, Outside_, TBF_DOCKED, &top, false},
-        {"locked docked onto another dock", TBF_DOCKED | kLocked, OnRight, TBF_DOCKED, &right, false},
-        {"locked floating over a dock: stays floating", TBF_FLOATING | kLocked, OnTop, TBF_FLOATING, &top, true},
-        {"locked floating, outside: the frame moves", TBF_FLOATING | kLocked, Outside_, TBF_FLOATING, &top, true},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.name);
-        HWND anchor = Make({5, 6}); // keeps the top dock showing
-        HWND pane = Make({1, 2, 3}, TBF_VISIBLE | c.flags, c.from ? *c.from : top);
-        HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
-        RECT pressed, frameBefore, frameAfter;
-        GetWindowRect(Active(pane), &pressed);
-        GetWindowRect(floating, &frameBefore);
-        const RECT paneBefore = WindowRectInParent(pane);
-        const POINT from = c.flags & TBF_FLOATING ? Caption(pane) : Empty(pane);
-        const POINT to = c.drop == Outside_ ? Outside()
-                                            : InDock(c.drop == OnTop    ? top
-                                                     : c.drop == OnLeft ? left
-                                                                        : right);
-        Down(from);
-        EXPECT_EQ(kDrag | kCaptured, TrackState());
-        Move(Offset(from, 7, 9));
-        Move(to);
-        Up(to);
-        EXPECT_EQ(c.place | TBF_VISIBLE, Place(pane));
-        EXPECT_EQ(*c.dock, GetParent(pane));
-        EXPECT_EQ(*c.dock, RecordOfWindow(pane)->dockWindow);
-        const std::vector<HWND> order = Order(*c.dock);
-        EXPECT_NE(order.end(), std::find(order.begin(), order.end(), pane));
-        GetWindowRect(floating, &frameAfter);
-        if (c.frameFollows) {
-            EXPECT_EQ(pressed.left + to.x - from.x, frameAfter.left);
-            EXPECT_EQ(pressed.top + to.y - from.y, frameAfter.top);
-        } else {
-            EXPECT_EQ(frameBefore, frameAfter);
-        }
-        if (c.place == TBF_DOCKED && c.flags & TBF_DOCKED && *c.dock == top)
-            EXPECT_EQ(paneBefore, WindowRectInParent(pane));
-        if (*c.dock != top) EXPECT_TRUE(IsWindowVisible(*c.dock)) << "a dropped-on dock shows";
-        if (c.from) EXPECT_FALSE(IsWindowVisible(*c.from)) << "the emptied dock hides";
-        for (UINT state : stateHeard)
-            EXPECT_EQ(0u, state) << "the frame heard of the drop before the state was clear";
-        QBR_DestroyToolbar(pane);
-        QBR_DestroyToolbar(anchor);
-    }
-}
-
-TEST_F(InputTest, DropsReorderADock) {
-    enum Target { OnA, OnB, OnC, AfterAll };
-    struct Case {
-        const char *name;
-        int dragged; // 0 A, 1 B, 2 C
-        Target target;
-        const char *order;
-    } const cases[] = {
-        {"A onto C goes before C", 0, OnC, "BAC"},
-        {"C onto A goes first", 2, OnA, "CAB"},
-        {"A just behind its own place stays", 0, OnB, "ABC"},
-        {"B on itself stays", 1, OnB, "ABC"},
-        {"B past the end goes last", 1, AfterAll, "ACB"},
-    };
-    for (const Case &c : cases) {
-        SCOPED_TRACE(c.name);
-        HWND panes[3] = {Make({1, 2}), Make({3, 4}), Make({5, 6})};
-        RECT last;
-        GetWindowRect(panes[2], &last);
-        const POINT to =
-            c.target == AfterAll ? POINT{last.right + 30, (last.top + last.bottom) / 2} : Button(panes[c.target], 0);
-        Down(Empty(panes[c.dragged]));
-        Move(to);
-        Up(to);
-        std::string order;
-        for (HWND pane : Order(top))
-            order += static_cast<char>('A' + (std::find(panes, panes + 3, pane) - panes));
-        EXPECT_EQ(c.order, order);
-        // The dock packs in list order: each pane starts right of the one before.
-        const std::vector<HWND> packed = Order(top);
-        for (size_t i = 1; i < packed.size(); ++i)
-            EXPECT_LT(WindowRectInParent(packed[i - 1]).left, WindowRectInParent(packed[i]).left);
-        for (HWND pane : panes)
-            QBR_DestroyToolbar(pane);
-    }
-}
-
-// Inside the 2-pixel band of `frame` every pixel is kept or exactly inverted,
-// about half of them inverted (a checker); everywhere else nothing changed.
-void ExpectFrameOnScreen(const Pixels &before, const RECT &area, const RECT &frame) {
-    const Pixels now = ReadScreenPixels(area);
-    int band = 0, inverted = 0, changedOutside = 0;
-    for (int y = 0; y < now.height; ++y)
-        for (int x = 0; x < now.width; ++x) {
-            const POINT s = {area.left + x, area.top + y};
-            RECT inside = frame;
-            InflateRect(&inside, -2, -2);
-            const COLORREF was = before.At(x, y), is = now.At(x, y);
-            if (PtInRect(&frame, s) && !PtInRect(&inside, s)) {
-                ++band;
-                inverted += is == (was ^ 0xFFFFFF);
-                EXPECT_TRUE(is == was || is == (was ^ 0xFFFFFF)) << s.x << "," << s.y;
-            } else {
-                changedOutside += is != was;
-            }
-        }
-    EXPECT_EQ(0, changedOutside);
-    EXPECT_TRUE(inverted * 10 > band * 4 && inverted * 10 < band * 6) << inverted << " of " << band;
-}
-
-TEST_F(InputTest, TheDragFrameIsInvertedOnTheScreenAndErasedAfter) {
-    HWND pane = Make({1, 2, 3});
-    RECT outer, after;
-    GetWindowRect(pane, &outer);
-    const RECT area = {outer.left - 30, outer.top - 20, outer.right + 60, outer.bottom + 60};
-    const POINT from = Empty(pane);
-    const Pixels before = ReadScreenPixels(area);
-    Down(from);
-    ExpectFrameOnScreen(before, area, outer);
-    Move(Offset(from, 40, 25));
-    RECT moved = outer;
-    OffsetRect(&moved, 40, 25);
-    EXPECT_EQ(moved, mouseTrack.dragFrame);
-    ExpectFrameOnScreen(before, area, moved);
-    // Back to its own place and let go: nothing moves, the screen is as it was.
-    Move(from);
-    Up(from);
-    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
-    GetWindowRect(pane, &after);
-    EXPECT_EQ(outer, after);
-}
-
-// ---- The order of tests --------------------------------------------------------------
-
-TEST_F(InputTest, ARunningPressOrDragHoldsOffOtherPresses) {
-    HWND pane = Make({1, 2, 3});
-    Down(Button(pane, 0));
-    Down(Button(pane, 1));
-    Down(Empty(pane));
-    EXPECT_EQ(kPress | kCaptured, TrackState());
-    Up(Button(pane, 0));
-    EXPECT_EQ((std::vector<Heard>{Press(1), Release(1), Command(1)}), FrameLog()) << Describe(FrameLog());
-    ClearFrameLog();
-    Down(Empty(pane));
-    Down(Button(pane, 1));
-    EXPECT_EQ(kDrag | kCaptured, TrackState());
-    EXPECT_FALSE(Pressed(2));
-    Up(Empty(pane));
-    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
-}
-
-// A close box release outside every toolbar window is missed. Until the next
-// left release on a toolbar, moves run only the close box tracking, and a
-// drag begun meanwhile outlives that release and ends with the next.
-TEST_F(InputTest, AMissedCloseBoxReleaseServesTheNextOneFirst) {
-    HWND floatingPane = Make({1}, TBF_VISIBLE | TBF_FLOATING);
-    HWND pane = Make({2, 3});
-    Down(CloseBox(floatingPane));
-    ASSERT_EQ(frame, WindowFromPoint(Outside()));
-    Up(Outside());
-    EXPECT_EQ(kClose, TrackState());
-    Down(Empty(pane));
-    EXPECT_EQ(kClose | kDrag | kCaptured, TrackState());
-    const RECT frameAtPress = mouseTrack.dragFrame;
-    Move(Offset(Empty(pane), -30, 0));
-    EXPECT_EQ(frameAtPress, mouseTrack.dragFrame) << "the drag frame must not follow";
-    Up(Empty(pane));
-    EXPECT_EQ(kDrag | kCaptured, TrackState());
-    Up(Empty(pane));
-    EXPECT_EQ(0u, TrackState());
-    EXPECT_EQ(TBF_VISIBLE | TBF_FLOATING, Place(floatingPane));
-    EXPECT_EQ(TBF_VISIBLE | TBF_DOCKED, Place(pane));
-    InvalidateRect(pane, nullptr, TRUE); // the close box tracking drew on it
-}
-
-// ---- The drag frame to the pixel ------------------------------------------------------
-
-// The frame is four 2-pixel strips along the inside of its rectangle that meet
-// without overlap, inverted through a checker of single pixels whose rows are
-// 0xAA, 0x55, ... from the screen's own origin: a pixel of the band is inverted
-// exactly where its screen x + y is even; nothing else changes.
-void ExpectExactFrame(const Pixels &before, const RECT &area, const RECT &frame, const char *what) {
-    const Pixels now = ReadScreenPixels(area);
-    RECT inside = frame;
-    InflateRect(&inside, -2, -2);
-    int wrong = 0;
-    for (int y = 0; y < now.height; ++y)
-        for (int x = 0; x < now.width; ++x) {
-            const POINT s = {area.left + x, area.top + y};
-            const bool band = PtInRect(&frame, s) && !PtInRect(&inside, s);
-            const bool inverted = band && (s.x + s.y) % 2 == 0;
-            const COLORREF want = inverted ? before.At(x, y) ^ 0xFFFFFF : before.At(x, y);
-            if (now.At(x, y) != want && ++wrong <= 5)
-                ADD_FAILURE() << what << ": " << s.x << "," << s.y << (band ? " in the band" : " outside the band")
-                              << (inverted ? ", should be inverted" : ", should be kept");
-        }
-    EXPECT_EQ(0, wrong) << what;
-}
-
-TEST_F(InputTest, TheDragFrameIsAnExactCheckerOfFourStrips) {
-    // Rectangles of both parities of corner, width and height, down to the
-    // smallest with a left strip.
-    const RECT frames[] = {Rect(300, 200, 340, 230), Rect(301, 201, 338, 227), Rect(310, 211, 315, 216),
-                           Rect(320, 221, 324, 226)};
-    for (const RECT &f : frames) {
-        const RECT area = {f.left - 4, f.top - 4, f.right + 4, f.bottom + 4};
-        const Pixels before = ReadScreenPixels(area);
-        DrawDragFrame(&f);
-        ExpectExactFrame(before, area, f, "drawn");
-        DrawDragFrame(&f);
-        EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors) << "drawn twice";
-    }
-    // A real drag: the frame at the toolbar's outer rectangle, then where a
-    // move by an odd distance takes it.
-    HWND pane = Make({1, 2, 3});
-    RECT outer;
-    GetWindowRect(pane, &outer);
-    const RECT area = {outer.left - 10, outer.top - 10, outer.right + 50, outer.bottom + 50};
-    const POINT from = Empty(pane);
-    const Pixels before = ReadScreenPixels(area);
-    Down(from);
-    ExpectExactFrame(before, area, outer, "at the press");
-    Move(Offset(from, 21, 13));
-    RECT moved = outer;
-    OffsetRect(&moved, 21, 13);
-    ExpectExactFrame(before, area, moved, "moved");
-    Move(Offset(from, 20, 13));
-    OffsetRect(&moved, -1, 0);
-    ExpectExactFrame(before, area, moved, "moved back one pixel");
-    Move(from);
-    EXPECT_EQ(outer, mouseTrack.dragFrame) << "back at the start";
-    Up(from);
-    EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors);
-}
-
-// ---- The pressed look before the press message --------------------------------------------
-
-// What a window shows now, read from its device context without a repaint
-// (0x00RRGGBB words as the DIB holds them, for comparing with each other).
-std::vector<COLORREF> Shown(HWND window, const RECT &r) {
-    HDC dc = GetDC(window);
-    HDC memory = CreateCompatibleDC(dc);
-    BITMAPINFO info = {};
-    info.bmiHeader = {sizeof(BITMAPINFOHEADER), r.right - r.left, -(r.bottom - r.top), 1, 32, BI_RGB, 0, 0, 0, 0, 0};
-    void *bits = nullptr;
-    HBITMAP bitmap = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
-    HGDIOBJ old = SelectObject(memory, bitmap);
-    BitBlt(memory, 0, 0, r.right - r.left, r.bottom - r.top, dc, r.left, r.top, SRCCOPY);
-    GdiFlush();
-    std::vector<COLORREF> out(static_cast<const DWORD *>(bits),
-                              static_cast<const DWORD *>(bits) + (r.right - r.left) * (r.bottom - r.top));
-    SelectObject(memory, old);
-    DeleteObject(bitmap);
-    DeleteDC(memory);
-    ReleaseDC(window, dc);
-    return out;
-}
-
-std::function<void()> atPress;
-WNDPROC hostProc = nullptr;
-LRESULT CALLBACK PressWatcher(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
-    if (message == kPressMessage && atPress) atPress();
-    return CallWindowProcA(hostProc, window, message, wParam, lParam);
-}
-
-// When the host hears of a press, the button already shows its pressed look
-// in the window: painted, not only invalidated.
-TEST_F(InputTest, ThePressedLookIsShownBeforeTheHostHearsThePress) {
-    HWND pane = Make({1, 2, 3});
-    const RECT r = ItemRect(pane, 1);
-    Look(pane, 1); // everything painted
-    const std::vector<COLORREF> up = Shown(Active(pane), r);
-    QBR_SetButtonPressed(manager, 2, 1);
-    Look(pane, 1);
-    const std::vector<COLORREF> down = Shown(Active(pane), r);
-    QBR_SetButtonPressed(manager, 2, 0);
-    Look(pane, 1);
-    ASSERT_NE(up, down);
-    std::vector<COLORREF> heard;
-    atPress = [&] { heard = Shown(Active(pane), r); };
-    hostProc = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(PressWatcher)));
-    Down(Button(pane, 1));
-    SetWindowLongPtrA(frame, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(hostProc));
-    atPress = nullptr;
-    Up(Button(pane, 1));
-    EXPECT_EQ((std::vector<Heard>{Press(2), Release(2), Command(2)}), FrameLog()) << Describe(FrameLog());
-    EXPECT_TRUE(heard == down) << (heard == up ? "the host heard the press before the look was shown" : "no look read");
 }
 
 } // namespace

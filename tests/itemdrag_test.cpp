@@ -225,24 +225,6 @@ void CALLBACK CloseMenu(HWND, UINT, UINT_PTR, DWORD) {
     EndMenu();
 }
 
-// With customising off a right press on a button takes nothing and opens no
-// menu.
-TEST_F(ItemDragTest, CustomisingOffARightPressOnAButtonDoesNothing) {
-    QBR_SetCustomize(0);
-    HWND a = Make(A0, kDocked, 350), b = Make(B0, kDocked, 150);
-    PlaceCursor(ScreenPoint(a, {'A', kOnItem, 2}));
-    menuSeen = false;
-    const UINT_PTR timer = SetTimer(nullptr, 0, 10, CloseMenu);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_RBUTTON, 0);
-    KillTimer(nullptr, timer);
-    EXPECT_FALSE(menuSeen);
-    EXPECT_EQ(nullptr, GetCapture());
-    EXPECT_EQ(0u, mouseTrack.dragActive);
-    RightDrag(a, ScreenPoint(a, {'A', kOnItem, 2}), ScreenPoint(b, {'B', kOnItem, 8}), 0, 0);
-    EXPECT_EQ(Text(A0), Text(Read(a)));
-    EXPECT_EQ(Text(B0), Text(Read(b)));
-}
-
 // A right press off the buttons (a separator, the empty end, on a pane or a
 // floating frame) opens the toolbar menu at the press and starts no drag.
 TEST_F(ItemDragTest, ARightPressOffTheButtonsOpensTheMenuAtThePress) {
@@ -301,79 +283,6 @@ TEST_F(ItemDragTest, ARightPressOnTheDockOpensTheMenuThereOwnedByTheFirstToolbar
     for (auto &owner : ownerProcs)
         SetWindowLongPtrA(owner.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(owner.second));
     ownerProcs.clear();
-}
-
-// The frame starts as the item's rectangle on the screen, inverted there, and
-// is gone again after the release; the pressed window holds the mouse between.
-TEST_F(ItemDragTest, TheFrameStartsOnTheItemAndTheWindowHoldsTheMouse) {
-    HWND a = Make(A0, kDocked, 350);
-    ToolbarRecord *record = RecordOfWindow(a);
-    RECT item;
-    ASSERT_EQ(1u, GetItemRect(record, 1, &item));
-    ClientRectToScreen(a, &item);
-    UpdateWindow(a);
-    // The first pixels of the frame's top strip, where the checkerboard shows.
-    auto topStrip = [&] {
-        return ReadScreenPixels(Rect(item.left + 2, item.top, item.left + 10, item.top + 1)).colors;
-    };
-    const std::vector<COLORREF> before = topStrip();
-    const POINT press = ScreenPoint(a, {'A', kOnItem, 2});
-    PlaceCursor(press);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_RBUTTON, 0);
-    EXPECT_EQ(a, GetCapture());
-    EXPECT_EQ(1u, mouseTrack.dragActive);
-    EXPECT_EQ(item, mouseTrack.dragFrame);
-    EXPECT_NE(before, topStrip()) << "the frame is inverted onto the item's top edge";
-    SendMessageA(a, WM_RBUTTONUP, 0, 0);
-    EXPECT_EQ(nullptr, GetCapture());
-    EXPECT_EQ(before, topStrip());
-    EXPECT_EQ(Text(A0), Text(Read(a)));
-}
-
-// While a frame drag runs a further right press is not taken; a release with
-// no drag does nothing; a right release ending a toolbar drag, which carries
-// no item, only ends it.
-TEST_F(ItemDragTest, ExtraPressesAndStrayReleasesChangeNothing) {
-    HWND a = Make(A0, kDocked, 350), b = Make(B0, kDocked, 150);
-    POINT p = ScreenPoint(a, {'A', kOnItem, 2});
-    PlaceCursor(p);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_RBUTTON, 0);
-    p = ScreenPoint(a, {'A', kOnItem, 4});
-    PlaceCursor(p);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_RBUTTON | kCtrl, 0);
-    p = ScreenPoint(b, {'B', kOnItem, 8});
-    PlaceCursor(p);
-    SendMessageA(a, WM_MOUSEMOVE, MK_RBUTTON, 0);
-    SendMessageA(a, WM_RBUTTONUP, 0, 0);
-    Pump();
-    EXPECT_EQ(Text({1, 3, 4, 5}), Text(Read(a))) << "the first press's item moved, not copied";
-    EXPECT_EQ(Text({7, 2, 8, 9}), Text(Read(b)));
-
-    p = ScreenPoint(a, {'A', kFrameSpace});
-    PlaceCursor(p);
-    SendMessageA(a, WM_RBUTTONUP, 0, 0);
-    Pump();
-    EXPECT_EQ(Text({1, 3, 4, 5}), Text(Read(a)));
-
-    // A button press holds the mouse: a right press then starts no item drag.
-    PlaceCursor(ScreenPoint(a, {'A', kOnItem, 3}));
-    SendMessageA(a, WM_LBUTTONDOWN, MK_LBUTTON, 0);
-    SendMessageA(a, WM_RBUTTONDOWN, MK_LBUTTON | MK_RBUTTON, 0);
-    EXPECT_EQ(0u, mouseTrack.dragActive);
-    PlaceCursor(ScreenPoint(a, {'A', kFrameSpace}));
-    SendMessageA(a, WM_LBUTTONUP, 0, 0);
-
-    // A toolbar drag, begun by a left press beside the buttons and ended by
-    // the right button over the toolbar's own end, carries no item.
-    PlaceCursor(ScreenPoint(a, {'A', kAfterEnd}));
-    SendMessageA(a, WM_LBUTTONDOWN, MK_LBUTTON, 0);
-    ASSERT_EQ(1u, mouseTrack.dragActive);
-    SendMessageA(a, WM_RBUTTONUP, 0, 0);
-    Pump();
-    EXPECT_EQ(nullptr, GetCapture());
-    EXPECT_EQ(0u, mouseTrack.dragActive);
-    EXPECT_EQ(Text({1, 3, 4, 5}), Text(Read(a)));
-    EXPECT_EQ(Text({7, 2, 8, 9}), Text(Read(b)));
 }
 
 } // namespace

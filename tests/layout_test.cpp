@@ -115,20 +115,6 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     EXPECT_EQ(pane.bottom, ClientRectOf(restoredTop).bottom);
 }
 
-// Two toolbars of one title: each restore looks for the first line of that
-// title, and the first restore uses its value up, so the second toolbar gets
-// the empty value (no items, flags 0) and the second line is never read.
-TEST_F(LayoutTest, TheFirstLineOfATitleServesAndIsUsedUp) {
-    otherManager = SecondManager();
-    Apply(otherManager, other,
-          {{"Top Dock", "Twin,Twin"}, {"Twin", "1,101,17,0,0,0,0"}, {"Twin", "2,102,103,33,300,100,400,160"}});
-    ASSERT_EQ(2u, QBR_GetToolbarCount(otherManager));
-    EXPECT_EQ(std::vector<UINT>{101}, ToolbarIds(QBR_GetToolbar(otherManager, 0)));
-    EXPECT_EQ(17u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 0)));
-    EXPECT_EQ(std::vector<UINT>{}, ToolbarIds(QBR_GetToolbar(otherManager, 1)));
-    EXPECT_EQ(0u, QBR_GetToolbarFlags(QBR_GetToolbar(otherManager, 1)));
-}
-
 TEST_F(LayoutTest, DamagedValuesAreReadAsTheyStandWithoutHarm) {
     otherManager = SecondManager();
     std::string huge(5000, '9');
@@ -206,31 +192,6 @@ TEST_F(LayoutTest, CountsAreReadAsTheyStand) {
     EXPECT_EQ("Twelve,Most,Top Dock", again[0].second) << "a skipped toolbar has no place in its dock";
 }
 
-// A value of a megabyte restores as a short one does: a dock value of 100,000
-// titles that name nothing before the real one, and a toolbar value of 60,000
-// ids, most of them padded ids the catalog lacks, read in time linear in
-// their length (the benchmark measures it).
-TEST_F(LayoutTest, AMegabyteLineRestores) {
-    otherManager = SecondManager();
-    std::string titles, items = "60000";
-    for (int i = 0; i < 100000; ++i)
-        titles += "Nobody" + std::to_string(i % 10) + ",";
-    titles += "Long";
-    const UINT known[] = {101, 0, 102, 103, 0, 110};
-    for (int i = 0; i < 60000; ++i)
-        items += i % 10000 == 5000 ? "," + std::to_string(known[i / 10000]) : ",000000000000099999";
-    items += ",33,300,100,420,150";
-    ASSERT_GT(titles.size() + items.size(), 1800000u);
-    Apply(otherManager, other, {{"Top Dock", titles}, {"Long", items}});
-    ASSERT_EQ(1u, QBR_GetToolbarCount(otherManager));
-    HWND pane = QBR_GetToolbar(otherManager, 0);
-    EXPECT_EQ((std::vector<UINT>{101, 0, 102, 103, 0, 110}), ToolbarIds(pane));
-    EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_FLOATING), QBR_GetToolbarFlags(pane));
-    RECT frameRect;
-    GetWindowRect(ResolveRoleWindow(pane, ROLE_FLOATING), &frameRect);
-    EXPECT_EQ(Rect(300, 100, 420, 150), frameRect);
-}
-
 // Keys are titles as they stand, whatever a settings file makes of them, and
 // a dock's value joins them with commas. A title with a comma comes back as
 // two titles that name no entry: that toolbar alone is lost. Two toolbars of
@@ -270,28 +231,6 @@ TEST_F(LayoutTest, TitlesGoThroughTheTableAsTheyStand) {
             EXPECT_EQ(static_cast<UINT>(TBF_VISIBLE | TBF_DOCKED), QBR_GetToolbarFlags(pane)) << back[i];
         }
     }
-}
-
-// In a file two toolbars of one title share one line, the later write wins,
-// and a toolbar titled like a dock key takes that dock's line: applied, such
-// a table brings back no toolbar of that dock, and the toolbar itself finds
-// its value used up.
-TEST_F(LayoutTest, ATitleLikeADockKeyTakesThatDocksLine) {
-    otherManager = SecondManager();
-    Apply(otherManager, other,
-          {{"Top Dock", "1,104,17,0,0,90,40"},
-           {"Standard", "1,101,17,0,0,90,40"},
-           {"Left Dock", "Top Dock,Column"},
-           {"Column", "1,102,17,0,0,90,40"}});
-    ASSERT_NE(nullptr, QBR_GetDock(otherManager, DOCK_TOP)) << "the dock is made from its key";
-    ASSERT_EQ(2u, QBR_GetToolbarCount(otherManager)) << "no toolbar of the top dock";
-    HWND named = QBR_GetToolbar(otherManager, 0);
-    char title[256] = "";
-    QBR_GetToolbarTitle(named, title, sizeof title);
-    EXPECT_STREQ("Top Dock", title);
-    EXPECT_TRUE(ToolbarIds(named).empty());
-    EXPECT_EQ(0u, QBR_GetToolbarFlags(named));
-    EXPECT_EQ((std::vector<UINT>{102}), ToolbarIds(QBR_GetToolbar(otherManager, 1)));
 }
 
 TEST_F(LayoutTest, EmptyManagerAndEmptyDock) {

@@ -7,7 +7,7 @@
 # must hug its toolbars; after each view window and each button-text round
 # trip the library must hold as many memory blocks and GDI objects as before.
 #   QBR_LONG_SEED     repeat a session (the seed is printed at the start; CI uses 1)
-#   QBR_LONG_SECONDS  how long to keep making gestures (default 60)
+#   QBR_LONG_SECONDS  how long to keep making gestures (default 20)
 #   QBR_LONG_BATCH    gestures between two checks (default 4)
 set -u
 . "$(dirname "$0")/lib.sh" "$1"
@@ -16,7 +16,7 @@ set -u
 # CI replays one known session so that its verdict does not depend on the
 # day; local runs draw a new seed each time to find new faults.
 if [ "${CI:-}" = true ]; then seed=${QBR_LONG_SEED:-1}; else seed=${QBR_LONG_SEED:-$(($(date +%s) % 32768))}; fi
-seconds=${QBR_LONG_SECONDS:-60}
+seconds=${QBR_LONG_SECONDS:-20}
 batch=${QBR_LONG_BATCH:-4} # gestures between two checks; 1 finds the one that broke something
 echo "seed $seed, $seconds s of gestures (QBR_LONG_SEED=$seed to repeat)"
 RANDOM=$seed

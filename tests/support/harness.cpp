@@ -156,7 +156,7 @@ RECT ClientRectOf(HWND window) {
 
 // Copies a rectangle of a device context into a top-down 32-bit DIB and
 // hands back its colours.
-static Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height) {
+Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height) {
     Pixels out;
     out.width = width;
     out.height = height;

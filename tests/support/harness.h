@@ -77,6 +77,8 @@ struct Pixels {
     COLORREF At(int x, int y) const { return colors[static_cast<size_t>(y) * width + x]; }
 };
 Pixels ReadWindowPixels(HWND window);
+// A rectangle of a device context as it stands, without a repaint.
+Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height);
 
 // A rectangle in the tests' own notation.
 inline RECT Rect(int l, int t, int r, int b) { return RECT{l, t, r, b}; }

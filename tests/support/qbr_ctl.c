@@ -5,7 +5,6 @@
      qbr_ctl zorder            list visible top-level windows, topmost first
      qbr_ctl foreground        print the title of the foreground window
      qbr_ctl childrect TITLE CHILD  the same for a child window of it, found by its title
-     qbr_ctl status TITLE      print the line of the status bar of that window
      qbr_ctl statusrect TITLE  the status bar's outer rectangle and 1 if visible
      qbr_ctl rect TITLE        print its outer rectangle (left top right bottom) and 1 if visible
      qbr_ctl toolbars TITLE    every toolbar window of that frame (panes and floating frames):
@@ -102,8 +101,6 @@ int main(int argc, char **argv) {
     if (argc < 3) return 2;
     window = FindWindowA(NULL, argv[2]);
     if (!window) return 1;
-    if (strcmp(argv[1], "raise") == 0)
-        return SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE) ? 0 : 1;
     if (strcmp(argv[1], "toolbars") == 0) {
         EnumThreadWindows(GetWindowThreadProcessId(window, NULL), PrintToolbarTop, (LPARAM)window);
         return 0;
@@ -137,16 +134,6 @@ int main(int argc, char **argv) {
         if (!foundChild) return 1;
         GetWindowRect(foundChild, &r);
         printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(foundChild) ? 1 : 0);
-        return 0;
-    }
-    if (strcmp(argv[1], "status") == 0) {
-        /* The status bar's line, asked with WM_GETTEXT: GetWindowText would
-           not ask a window of another process. */
-        char text[256] = "";
-        HWND bar = FindWindowExA(window, NULL, "StatusBar", NULL);
-        if (!bar) return 1;
-        SendMessageA(bar, WM_GETTEXT, sizeof(text), (LPARAM)text);
-        printf("%s\n", text);
         return 0;
     }
     if (strcmp(argv[1], "statusrect") == 0) {
