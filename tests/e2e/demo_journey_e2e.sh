@@ -1,20 +1,16 @@
 #!/usr/bin/env bash
-# One user's session, with real X input only: toolbars torn off and docked at
-# the sides, a button moved to another toolbar with the right mouse button,
-# separators made and unmade by the sideways nudge, button text switched on
-# from the keyboard; then the arrangement survives a close and a restart (to
-# the pixel, but for the shape of the side-docked toolbars, which a restart
-# measures anew), and the next close writes the same lines. Leaves
-# BUILD_DIR/e2e/journey-*.png to look at.
+# One user's session with real X input: toolbars torn off and docked at the
+# sides, a button moved by a right drag, separators made and unmade by the
+# nudge, button text on from the keyboard; the arrangement survives a restart
+# (to the pixel but for side-docked shapes, measured anew) and the next close
+# writes the same lines. Leaves BUILD_DIR/e2e/journey-*.png to look at.
 set -u
 . "$(dirname "$0")/lib.sh" "$1"
 . "$(dirname "$0")/gestures.sh"
 
 main_section() { tr -d '\r' <"$ini" | awk '/^\[/ { inside = ($0 == "[Main Layout]"); next } inside && NF'; }
-# Every toolbar window of the main frame and the top dock, in a stable order.
-# The panes in the side docks and the side docks themselves are left out: a
-# toolbar dropped into a side dock keeps the shape it had, while a restart
-# measures it anew for its dock; in_side_dock checks those.
+# Every toolbar window and the top dock, sorted; side-docked panes are left
+# out (a restart measures them anew; in_side_dock checks those).
 arrangement() {
     { ctl toolbars "$main" | grep -v -e '^pane .* Standard$' -e '^pane .* Palette$'; dock_rect "$main" top | sed 's/^/top dock /'; } | sort
 }
@@ -40,16 +36,13 @@ ldrag $x $y 600 400
 read -r fv fl ft fr fb <<<"$(toolbar_rect "$main" frame Standard)"
 read -r pv _ <<<"$(toolbar_rect "$main" pane Standard)"
 [ "$fv $pv" = "1 0" ] || fail "Standard not torn off: frame visible $fv, pane visible $pv"
-# The floating frame takes the drag frame's corner: the pane's corner moved
-# as far as the cursor did.
+# The frame's corner moved as far as the cursor did.
 [ "$fl $ft" = "$((l + 600 - x)) $((t + 400 - y))" ] || fail "Standard floats at $fl,$ft, not where it was let go"
 read -r v l2 _ <<<"$(toolbar_rect "$main" pane Style)"
 [ "$l2" = "$sl" ] || [ "$l2" -lt "$sl" ] || fail "Style did not close the gap: $sl -> $l2"
 shot journey-1-torn-off
 
-# ---- The sides: with no stored layout the program makes only a top dock ----
-# A drop at the left edge of the client area, where a left dock would be,
-# finds no dock: the frame only moves there. The same at the right edge.
+# ---- No stored layout: only a top dock; drops at the side edges only move frames ----
 [ -z "$(dock_rect "$main" left)$(dock_rect "$main" right)" ] || fail "a side dock exists on a first start"
 read -r x y <<<"$(caption_point $fl $ft $fr $fb)"
 ldrag $x $y $((ml + 4 + 10)) $((mt + 150))
@@ -66,18 +59,15 @@ stop_demo "first close"
 case "$(ini_value 'Main Layout' Standard)" in 10,101,102,104,0,107,108,109,0,106,151,33,*) ;;
 *) fail "Standard line after tearing off: $(ini_value 'Main Layout' Standard)" ;; esac
 
-# Side docks come only from a stored layout. A dock line that names no stored
-# toolbar makes the dock and leaves it empty: hidden, a drop target of one
-# button's width along its edge.
+# A stored dock line naming no toolbar makes an empty, hidden side dock: a drop target.
 awk '{ print } /^\[Main Layout\]/ { printf "Left Dock=none\r\nRight Dock=none\r\n" }' "$ini" >"$ini.new" && mv "$ini.new" "$ini"
 start_demo "with side docks"
 read -r lv ll lt lr lb <<<"$(dock_rect "$main" left)"
 read -r rv rl rt rr rb <<<"$(dock_rect "$main" right)"
 [ "$lv" = 0 ] && [ "$rv" = 0 ] || fail "empty side docks are not hidden: left '$lv' right '$rv'"
 
-# Drags the floating toolbar $1 by its caption onto the side dock $2 and
-# checks that it is docked there; sets the pane's rectangle (kl kt kr kb) and
-# the dock's (dl dt dr db) as they are after the drop.
+# Drags floating $1 by its caption onto side dock $2; sets the pane's
+# (kl kt kr kb) and the dock's (dl dt dr db) rectangles after the drop.
 dock_by_caption() {
     local v l t r b x y pv fv dv
     read -r v l t r b <<<"$(toolbar_rect "$main" frame "$1")"
@@ -93,11 +83,8 @@ dock_by_caption() {
 # ---- Dock "Standard" on the left ----
 dock_by_caption Standard left
 pl=$kl pt=$kt pr=$kr pb=$kb
-# A drop measures nothing: the toolbar keeps its row shape in the side dock
-# until its items change.
 [ "$pl" -ge $((dl - 1)) ] && [ "$pr" -le $((dr + 1)) ] && [ "$pt" -ge $((dt - 1)) ] ||
     fail "Standard is not inside the left dock: $pl $pt $pr $pb in $dl $dt $dr $db"
-[ $((pb - pt)) -gt $((pr - pl)) ] || echo "NOTE: Standard keeps its row shape in the left dock until a restart: $pl $pt $pr $pb"
 
 # ---- Dock "Palette" on the right ----
 dock_by_caption Palette right
@@ -116,17 +103,15 @@ read -r v l2 t2 r2 b2 <<<"$(toolbar_rect "$main" pane Standard)"
 sr=$r
 
 # ---- Separators by the sideways nudge on Style (301,302,303,|,304..307,101) ----
-# 302 pushed right: no separator after it, so one opens before it.
+# 302 pushed right opens a separator before it; 303 pushed right closes the
+# one after it; a push of 2 pixels does nothing.
 read -r x y <<<"$(button_centre $sl $st 1)"
 nudge $x $y 5
 read -r v l t r b <<<"$(toolbar_rect "$main" pane Style)"
 [ $((r - l)) = $((sr - sl + 9)) ] || fail "no separator added before 302: width $((sr - sl)) -> $((r - l))"
-# 303, now behind 301, the separator and 302, pushed right: the separator
-# after it goes.
 nudge $((sl + 1 + 6 + 23 + 9 + 23 + 12)) $y 5
 read -r v l t r b <<<"$(toolbar_rect "$main" pane Style)"
 [ $((r - l)) = $((sr - sl)) ] || fail "the separator after 303 was not removed: width $((r - l)), expected $((sr - sl))"
-# A push of 2 pixels does nothing: it takes 3.
 nudge $((sl + 1 + 6 + 12)) $y 2
 read -r v l t r b <<<"$(toolbar_rect "$main" pane Style)"
 [ $((r - l)) = $((sr - sl)) ] || fail "a 2-pixel nudge changed Style: width $((r - l))"
@@ -136,10 +121,7 @@ shot journey-4-customised
 xdotool mousemove $((ml + 300)) $((mb - 100)) click 1 # the edit control takes the focus
 settle
 read -r v l t r b <<<"$(toolbar_rect "$main" pane Standard)"
-xdotool key alt+v
-sleep 0.4
-xdotool key b
-settle
+xdotool key alt+v; sleep 0.4; xdotool key b; settle
 read -r v l2 t2 r2 b2 <<<"$(toolbar_rect "$main" pane Standard)"
 [ $((r2 - l2)) -gt $((r - l + 20)) ] && [ $((b2 - t2)) -gt $((b - t)) ] || fail "button text did not enlarge Standard: $l $t $r $b -> $l2 $t2 $r2 $b2"
 shot journey-5-button-text

@@ -1,21 +1,14 @@
 #!/usr/bin/env bash
-# The demonstration program without a mouse: real X key presses move the
-# keyboard through the toolbars, press buttons and open the toolbar menu, and
-# a screen reader in another process (qbr_reader) reads what a person would
-# hear. The settings file keeps what the keys changed. The same journey
-# passes at every display scale: the DPI is the optional second argument
-# (bash demo_keyboard_e2e.sh BUILD_DIR 192).
+# Without a mouse: real X keys move through the toolbars, press buttons and
+# open the toolbar menu, and a screen reader in another process (qbr_reader)
+# reads what a person would hear; the settings file keeps what the keys
+# changed. The DPI is the optional second argument (BUILD_DIR 192).
 set -u
 . "$(dirname "$0")/lib.sh" "$1" "${2:-96}"
 rm -f "$ini"
 start_demo "keyboard"
 
-reader() { wine "$build/bin/qbr_reader.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; }
 keys() { xdotool key --delay 60 "$@"; sleep 0.4; }
-# The line of one item as the reader lists it: toolbar, then the item's name.
-item() { reader list "$main" | awk -v t="toolbar \"$1\"" -v n="\"$2\"" '
-    /^toolbar/ { inside = ($0 == t); next }
-    inside && index($0, n) { print; exit }'; }
 expect_focus() { local got; got=$(reader focus "$main"); [ "$got" = "$1" ] || fail "focus: '$got', expected '$1' ($2)"; }
 expect_item() { local got; got=$(item "$1" "$2"); [ "$got" = "$3" ] || fail "$1/$2 reads '$got', expected '$3'"; }
 

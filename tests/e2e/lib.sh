@@ -37,6 +37,11 @@ fail() {
     fi
     exit 1
 }
+# The screen reader's view from another process; the line of item "$2" of toolbar "$1".
+reader() { wine "$build/bin/qbr_reader.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; }
+item() { reader list "$main" | awk -v t="toolbar \"$1\"" -v n="\"$2\"" '
+    /^toolbar/ { inside = ($0 == t); next }
+    inside && index($0, n) { print; exit }'; }
 shot() { /usr/bin/import -display "$DISPLAY" -window root "$out/$1$suffix.png"; }
 
 # Starts the program and waits for its main window and its first paint.
