@@ -37,36 +37,27 @@ VARIANT Child(LONG id) {
     return v;
 }
 
-std::string Name(IAccessible *object, LONG id) {
+// get_accName or get_accDefaultAction of one child, as text.
+std::string Text(IAccessible *object, LONG id, HRESULT (STDMETHODCALLTYPE IAccessible::*get)(VARIANT, BSTR *)) {
     BSTR text = nullptr;
-    object->get_accName(Child(id), &text);
+    (object->*get)(Child(id), &text);
     return Narrow(text);
 }
-
-std::string Action(IAccessible *object, LONG id) {
-    BSTR text = nullptr;
-    object->get_accDefaultAction(Child(id), &text);
-    return Narrow(text);
-}
+std::string Name(IAccessible *object, LONG id) { return Text(object, id, &IAccessible::get_accName); }
+std::string Action(IAccessible *object, LONG id) { return Text(object, id, &IAccessible::get_accDefaultAction); }
 
 std::string Role(IAccessible *object, LONG id) {
+    static const struct {
+        LONG role;
+        const char *name;
+    } kNames[] = {{ROLE_SYSTEM_TOOLBAR, "toolbar"},     {ROLE_SYSTEM_PUSHBUTTON, "push"},
+                  {ROLE_SYSTEM_CHECKBUTTON, "check"},   {ROLE_SYSTEM_RADIOBUTTON, "radio"},
+                  {ROLE_SYSTEM_SEPARATOR, "separator"}, {ROLE_SYSTEM_BUTTONMENU, "buttonmenu"}};
     VARIANT v;
     VariantInit(&v);
     if (object->get_accRole(Child(id), &v) != S_OK || v.vt != VT_I4) return "?";
-    switch (v.lVal) {
-    case ROLE_SYSTEM_TOOLBAR:
-        return "toolbar";
-    case ROLE_SYSTEM_PUSHBUTTON:
-        return "push";
-    case ROLE_SYSTEM_CHECKBUTTON:
-        return "check";
-    case ROLE_SYSTEM_RADIOBUTTON:
-        return "radio";
-    case ROLE_SYSTEM_SEPARATOR:
-        return "separator";
-    case ROLE_SYSTEM_BUTTONMENU:
-        return "buttonmenu";
-    }
+    for (const auto &n : kNames)
+        if (n.role == v.lVal) return n.name;
     return std::to_string(v.lVal);
 }
 
