@@ -18,8 +18,12 @@ in_bottom_dock() {
         fail "Style is not shown in the bottom dock: $v $l $t $r $b in $dv $dl $dt $dr $db"
 }
 
+# A settings file of a release without the bottom dock: the dock is made anyway.
 rm -f "$ini"
 start_demo "first start"
+stop_demo "first start"
+sed -i '/^Bottom Dock=/d' "$ini"
+start_demo "a file without the bottom dock"
 read -r ml mt mr mb mv <<<"$(ctl rect "$main")"
 [ -z "$(item Style 'More buttons')" ] || fail "a chevron at the full width"
 ldrag $((mr - 2)) $(((mt + mb) / 2)) $((ml + 330 - 2)) $(((mt + mb) / 2))
