@@ -173,16 +173,16 @@ Heard Release(UINT id) { return {kReleaseMessage, (id & 0xFFFF) | 0xFFFF0000u, 0
 Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
 using Heards = std::vector<Heard>;
 
-// ---- Screen readers ----------------------------------------------------------------------------
-
-TEST_F(AccessTest, ReadsEveryItemAndDoesItsDefaultAction) {
+// Each item as a reader reads it, its default action a click completed from
+// the message loop; each change of its state is there when a reader asks,
+// and told once.
+TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
     for (UINT id : {3u, 5u, 6u})
         QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
     QBR_SetButtonBehaviour(manager, 4, BTN_LATCH);
     QBR_SetRadioRange(manager, 5, 6, 6);
     HWND pane = Make("Tools", {1, 0, 3, 4, 5, 6});
     Reader reader(pane);
-    ASSERT_NE(nullptr, reader.object);
     ASSERT_EQ(6, reader.Count());
     EXPECT_EQ(6, Reader(ResolveRoleWindow(pane, ROLE_FLOATING)).Count()) << "the floating frame reads the same";
     EXPECT_EQ(-1, reader.Role(7));
@@ -200,11 +200,10 @@ TEST_F(AccessTest, ReadsEveryItemAndDoesItsDefaultAction) {
         {CHILDID_SELF, ROLE_SYSTEM_TOOLBAR, "Tools", "(none)", "(none)", DISP_E_MEMBERNOTFOUND},
     };
     for (const auto &item : items) {
-        SCOPED_TRACE(item.child);
-        EXPECT_EQ(item.role, reader.Role(item.child));
-        EXPECT_EQ(item.name, reader.Name(item.child));
-        EXPECT_EQ(item.description, reader.Description(item.child));
-        EXPECT_EQ(item.action, reader.Action(item.child));
+        EXPECT_EQ(item.role, reader.Role(item.child)) << item.child;
+        EXPECT_EQ(item.name, reader.Name(item.child)) << item.child;
+        EXPECT_EQ(item.description, reader.Description(item.child)) << item.child;
+        EXPECT_EQ(item.action, reader.Action(item.child)) << item.child;
     }
     QBR_SetButtonEnabled(manager, 4, 0);
     for (const auto &item : items)
@@ -214,8 +213,38 @@ TEST_F(AccessTest, ReadsEveryItemAndDoesItsDefaultAction) {
     const Heards clicks = {Press(1),   Release(1), Command(1), Press(3),  Release(3),
                            Command(3), Press(5),   Release(5), Command(5)};
     EXPECT_EQ(clicks, FrameLog()) << Describe(FrameLog());
-    EXPECT_EQ(0u, QBR_IsButtonPressed(manager, 1));
     EXPECT_EQ("Uncheck", reader.Action(3));
+
+    const LONG F = STATE_SYSTEM_FOCUSABLE, U = STATE_SYSTEM_UNAVAILABLE, P = STATE_SYSTEM_PRESSED;
+    const LONG I = STATE_SYSTEM_INVISIBLE, M = STATE_SYSTEM_MIXED, C = STATE_SYSTEM_CHECKED;
+    const struct {
+        UINT (*set)(ToolbarManager *, UINT, UINT);
+        UINT id, value;
+        const char *heard;
+        LONG state1, state3;
+    } rows[] = {
+        {QBR_SetButtonState, 3, 1, "", F, F | C}, // no change
+        {QBR_SetButtonState, 3, 2, "state 3; ", F, F | M},
+        {QBR_SetButtonEnabled, 1, 0, "state 1; ", U, F | M},
+        {QBR_SetButtonPressed, 1, 1, "state 1; ", U | P, F | M},
+        {SetRadioPair, 5, 6, "state 5; ", U | P, F | M}, // 5 on by its click, 6 on already
+        {SetFlags, 0, TBF_HIDDEN, "hide 0; ", U | P | I, F | M | I},
+        {SetFlags, 0, TBF_VISIBLE, "show 0; ", U | P, F | M},
+    };
+    for (const auto &row : rows) {
+        events.clear();
+        row.set(manager, row.id, row.value);
+        PumpFor(50); // out-of-context events arrive through the queue
+        EXPECT_EQ(row.heard, events) << "row " << &row - rows;
+        EXPECT_EQ(row.state1, reader.State(1)) << "row " << &row - rows;
+        EXPECT_EQ(row.state3, reader.State(3)) << "row " << &row - rows;
+    }
+    // A mouse press draws its pressed look without the catalog: it is told too.
+    events.clear();
+    SendMouse(WM_LBUTTONDOWN, Centre(ScreenItem(pane, 2)), MK_LBUTTON);
+    PumpFor(50);
+    EXPECT_EQ("state 3; ", events);
+    SendMouse(WM_LBUTTONUP, Centre(ScreenItem(pane, 2)), 0);
 }
 
 // Every item a user can see has its place, and a hit test there finds it;
@@ -265,44 +294,6 @@ TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
         for (const auto &walk : walks)
             EXPECT_EQ(walk[2], reader.Navigate(walk[0], walk[1])) << walk[0] << " from " << walk[1];
     }
-}
-
-// Each change a reader could see is told once, and is there when it asks.
-TEST_F(AccessTest, StatesFollowTheButtonsAndEveryChangeIsAnEvent) {
-    QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
-    HWND pane = Make("Tools", {1, 2, 3});
-    Reader reader(pane);
-    const LONG F = STATE_SYSTEM_FOCUSABLE, U = STATE_SYSTEM_UNAVAILABLE, P = STATE_SYSTEM_PRESSED;
-    const LONG I = STATE_SYSTEM_INVISIBLE, M = STATE_SYSTEM_MIXED, C = STATE_SYSTEM_CHECKED;
-    const struct {
-        UINT (*set)(ToolbarManager *, UINT, UINT);
-        UINT id, value;
-        const char *heard;
-        LONG state1, state2;
-    } rows[] = {
-        {QBR_SetButtonState, 2, 1, "state 2; ", F, F | C},
-        {QBR_SetButtonState, 2, 1, "", F, F | C}, // no change
-        {QBR_SetButtonState, 2, 2, "state 2; ", F, F | M},
-        {QBR_SetButtonEnabled, 1, 0, "state 1; ", U, F | M},
-        {QBR_SetButtonPressed, 1, 1, "state 1; ", U | P, F | M},
-        {SetRadioPair, 1, 1, "state 1; state 2; ", U | P | C, F},
-        {SetFlags, 0, TBF_HIDDEN, "hide 0; ", U | P | C | I, F | I},
-        {SetFlags, 0, TBF_VISIBLE, "show 0; ", U | P | C, F},
-    };
-    for (const auto &row : rows) {
-        events.clear();
-        row.set(manager, row.id, row.value);
-        PumpFor(50); // out-of-context events arrive through the queue
-        EXPECT_EQ(row.heard, events) << "row " << &row - rows;
-        EXPECT_EQ(row.state1, reader.State(1)) << "row " << &row - rows;
-        EXPECT_EQ(row.state2, reader.State(2)) << "row " << &row - rows;
-    }
-    // A mouse press draws its pressed look without the catalog: it is told too.
-    events.clear();
-    SendMouse(WM_LBUTTONDOWN, Centre(ScreenItem(pane, 2)), MK_LBUTTON);
-    PumpFor(50);
-    EXPECT_EQ("state 3; ", events);
-    SendMouse(WM_LBUTTONUP, Centre(ScreenItem(pane, 2)), 0);
 }
 
 // ---- The keyboard ---------------------------------------------------------------------------
