@@ -230,9 +230,9 @@ TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
 // A frame moved to another scale (WM_DPICHANGED handed to the library, as the
 // README's host does) takes the suggested rectangle, and every dock, pane and
 // floating frame has the rectangle and the pixels of one made at that scale
-// (the floating frame's size: FloatingFramesSurvive...), so the floating
-// toolbar keeps its place and its three rows of three; the labels grow or shrink with
-// the scale (their font's ink, as installed).
+// (whose sizes the other tests check), so the floating toolbar keeps its
+// place and its three rows of three; the labels grow or shrink with the
+// scale (their font's ink, as installed).
 TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
     const int here = ScreenDpi(), other = here == 96 ? 144 : here == 144 ? 192 : 96;
     RECT suggested = {60, 50, 760, 500};
