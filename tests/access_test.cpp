@@ -338,15 +338,23 @@ TEST_F(AccessTest, KeysWalkTheButtonsRowsAndToolbarsInOrder) {
     EXPECT_EQ(down1, Focus());
 }
 
-// The focused button is read focused, announced, and shows the focus
-// rectangle 3 pixels inside it; Space presses it as the left button does, and
-// a press let go after moving away is no click.
+// The focused button is read focused, announced, shows the focus rectangle 3
+// pixels inside it and, after one period, its quick help tip below it; Space
+// presses it as the left button does, and a press let go after moving away is
+// no click.
 TEST_F(AccessTest, SpacePressesTheFocusedButtonAsTheLeftButtonDoes) {
-    HWND pane = Make("Tools", {1, 2});
+    QBR_SetQuickHelp(1);
+    HWND pane = Make("Tools", {1, 2}), help = CurrentClient()->helpWindow;
     const Pixels before = ReadWindowPixels(pane);
     Key("F6");
     EXPECT_EQ("focus 1", LastFocus());
     EXPECT_EQ(STATE_SYSTEM_FOCUSABLE | STATE_SYSTEM_FOCUSED, Reader(pane).State(1));
+    EXPECT_FALSE(IsWindowVisible(help)) << "not before one period";
+    PumpHost(400);
+    RECT tip;
+    GetWindowRect(help, &tip);
+    EXPECT_TRUE(IsWindowVisible(help));
+    EXPECT_EQ(Rect(ScreenItem(pane, 0).left, ScreenItem(pane, 0).bottom + 1, 0, 0), Rect(tip.left, tip.top, 0, 0));
     const Pixels focused = ReadWindowPixels(pane);
     RECT item = {};
     GetItemRect(RecordOfWindow(pane), 0, &item);
