@@ -14,7 +14,6 @@
 #include "access/access.h"
 #include "core/core.h"
 #include "harness.h"
-#include "input/input.h"
 #include "modal.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
