@@ -44,10 +44,10 @@ class ToolbarTest : public FrameTest {
     HWND top = nullptr;
 };
 
-// Buttons advance 23 (they share a column), separators 9; a separator that
-// ends a row is dropped on a floating frame and kept (row-high) when docked.
-// Right and bottom edges belong to the item; a separator is dead for the hit
-// test; a drop right of a row goes before the next row's first item.
+// Buttons advance 23 (sharing a column), separators 9; a separator ending a row
+// is dropped on a floating frame, kept row-high when docked. Right and bottom
+// edges belong to the item; a separator is dead for the hit test; a drop right
+// of a row goes before the next row's first item.
 TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
     const int ft = captionHeight + 3; // a frame's area starts below its caption band
     const RECT None = {-1, -1, -1, -1};
@@ -57,24 +57,17 @@ TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
         int right; // of the item area
         std::vector<RECT> expected;
     } cases[] = {
-        {{1, 2, 3, S, 4},
-         V | D,
-         80,
-         {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(6, 25, 16, 47), Rect(15, 25, 39, 47)}},
-        {{1, 2, 3, S, 4},
-         V | F,
-         80,
-         {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), Rect(52, ft, 76, ft + 22), None,
-          Rect(6, ft + 22, 30, ft + 44)}},
+        // clang-format off
+        {{1, 2, 3, S, 4}, V | D, 80, {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(6, 25, 16, 47),
+            Rect(15, 25, 39, 47)}},
+        {{1, 2, 3, S, 4}, V | F, 80, {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), Rect(52, ft, 76, ft + 22),
+            None, Rect(6, ft + 22, 30, ft + 44)}},
         {{1, 2}, V | D, 20, {Rect(6, 25, 30, 47), Rect(6, 47, 30, 69)}}, // narrower than a button
-        {{1, 2, S, 3},
-         V | F | TBF_NO_FLOAT_SEPARATORS,
-         200,
-         {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), None, Rect(52, ft, 76, ft + 22)}},
-        {{1, 2, 3, S, 4},
-         V | D,
-         90,
-         {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(75, 3, 85, 25), Rect(6, 25, 30, 47)}},
+        {{1, 2, S, 3}, V | F | TBF_NO_FLOAT_SEPARATORS, 200, {Rect(6, ft, 30, ft + 22), Rect(29, ft, 53, ft + 22), None,
+            Rect(52, ft, 76, ft + 22)}},
+        {{1, 2, 3, S, 4}, V | D, 90, {Rect(6, 3, 30, 25), Rect(29, 3, 53, 25), Rect(52, 3, 76, 25), Rect(75, 3, 85, 25),
+            Rect(6, 25, 30, 47)}},
+        // clang-format on
     };
     HWND pane = nullptr;
     for (const auto &k : cases) {
@@ -173,25 +166,23 @@ TEST_F(ToolbarTest, FlagGroupsShowTheRightWindowAndTellTheFrameOnce) {
     EXPECT_EQ(V | D | TBF_LOCKED_PLACE, QBR_GetToolbarFlags(pane));
 }
 
-// Counts, per watched window, the messages of one kind it receives.
 std::map<HWND, int> heardBy;
 std::map<HWND, WNDPROC> watched;
 UINT watchedMessage = 0;
 LRESULT CALLBACK CountingProc(HWND w, UINT m, WPARAM wp, LPARAM lp) {
-    if (m == watchedMessage) ++heardBy[w];
+    heardBy[w] += m == watchedMessage;
     return CallWindowProcA(watched[w], w, m, wp, lp);
 }
-void Watch(UINT message, std::vector<HWND> windows) {
+// Counts in heardBy the messages of one kind these windows receive; no windows: stops counting.
+void Watch(UINT message, std::vector<HWND> windows = {}) {
+    for (auto &w : watched)
+        SetWindowLongPtrA(w.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(w.second));
+    watched.clear();
     watchedMessage = message;
     for (HWND w : windows)
         watched[w] = reinterpret_cast<WNDPROC>(SetWindowLongPtrA(w, GWLP_WNDPROC, LONG_PTR(CountingProc)));
     Pump();
     heardBy.clear();
-}
-void Unwatch() {
-    for (auto &w : watched)
-        SetWindowLongPtrA(w.first, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(w.second));
-    watched.clear();
 }
 
 // A state setter paints a real change once on every toolbar showing the
@@ -207,17 +198,14 @@ TEST_F(ToolbarTest, ButtonSettersPaintOnlyARealChangeOnEveryToolbar) {
         UINT (*get)(ToolbarManager *, UINT);
         int paints;
     } steps[] = {
-        {QBR_SetButtonState, 1, 1, QBR_GetButtonState, 1},
-        {QBR_SetButtonState, 1, 1, QBR_GetButtonState, 0},
-        {QBR_SetButtonState, 3, 0, QBR_GetButtonState, 1},
-        {QBR_SetButtonState, 3, 0, QBR_GetButtonState, 0},
-        {QBR_SetButtonEnabled, 0, 0, QBR_IsButtonEnabled, 1},
-        {QBR_SetButtonEnabled, 2, 1, QBR_IsButtonEnabled, 1},
-        {QBR_SetButtonEnabled, 1, 1, QBR_IsButtonEnabled, 0},
-        {QBR_SetButtonPressed, 1, 8, QBR_IsButtonPressed, 1},
-        {QBR_SetButtonImage, 5, 0, nullptr, 1},
-        {QBR_SetButtonImage, 5, 0, nullptr, 1},
+        // clang-format off
+        {QBR_SetButtonState, 1, 1, QBR_GetButtonState, 1},    {QBR_SetButtonState, 1, 1, QBR_GetButtonState, 0},
+        {QBR_SetButtonState, 3, 0, QBR_GetButtonState, 1},    {QBR_SetButtonState, 3, 0, QBR_GetButtonState, 0},
+        {QBR_SetButtonEnabled, 0, 0, QBR_IsButtonEnabled, 1}, {QBR_SetButtonEnabled, 2, 1, QBR_IsButtonEnabled, 1},
+        {QBR_SetButtonEnabled, 1, 1, QBR_IsButtonEnabled, 0}, {QBR_SetButtonPressed, 1, 8, QBR_IsButtonPressed, 1},
+        {QBR_SetButtonImage, 5, 0, nullptr, 1},               {QBR_SetButtonImage, 5, 0, nullptr, 1},
         {QBR_SetButtonBehaviour, 2, 2, QBR_GetButtonBehaviour, 0},
+        // clang-format on
     };
     for (const auto &s : steps) {
         EXPECT_EQ(1u, s.set(manager, 1, s.value));
@@ -231,7 +219,7 @@ TEST_F(ToolbarTest, ButtonSettersPaintOnlyARealChangeOnEveryToolbar) {
     QBR_SetButtonText(0);
     Pump();
     EXPECT_GE(heardBy[one], 1);
-    Unwatch();
+    Watch(0);
 }
 
 // A refit or a packing that changes nothing places no window; an edit places
@@ -244,7 +232,6 @@ TEST_F(ToolbarTest, RefitsPlaceOnlyWhatChanged) {
     Pump();
     for (HWND w : windows)
         EXPECT_EQ(0, heardBy[w]) << "window " << (std::find(windows.begin(), windows.end(), w) - windows.begin());
-    Unwatch();
     std::vector<RECT> places;
     for (HWND w : {docked, Frame(docked), next})
         places.push_back(WindowRectInParent(w));
@@ -257,7 +244,7 @@ TEST_F(ToolbarTest, RefitsPlaceOnlyWhatChanged) {
     EXPECT_EQ(places[2].left + 23, WindowRectInParent(next).left);
     EXPECT_EQ(1, heardBy[next]) << "the moved pane is painted once";
     EXPECT_EQ(0, CountHeard(WM_SIZE));
-    Unwatch();
+    Watch(0);
 }
 
 // A host may pump messages between QBR_DestroyManager and the end of its
