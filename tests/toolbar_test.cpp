@@ -1,6 +1,5 @@
-// Toolbars in real windows: the flow of items into rows, hit tests and drop
-// points, the pane and frame pair and its flags, refits and what they cost,
-// a manager destroyed under its windows, and the order of floating frames.
+// Toolbars in real windows: the flow of items into rows, hit tests and drops, the
+// pane and frame pair and its flags, and what setters, refits and edits cost.
 #include <algorithm>
 #include <map>
 #include <vector>
@@ -8,8 +7,7 @@
 #include "core/core.h"
 #include "dock/dock.h"
 #include "harness.h"
-#include "input/input.h"
-#include "modal.h"
+#include "paint/paint.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
 
@@ -44,10 +42,8 @@ class ToolbarTest : public FrameTest {
     HWND top = nullptr;
 };
 
-// Buttons advance 23 (sharing a column), separators 9; a separator ending a row
-// is dropped on a floating frame, kept row-high when docked. Right and bottom
-// edges belong to the item; a separator is dead for the hit test; a drop right
-// of a row goes before the next row's first item.
+// Buttons advance 23 (sharing a column), separators 9; a separator ending a row is
+// dropped when floating, row-high when docked; right and bottom edges belong to the item.
 TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
     const int ft = captionHeight + 3; // a frame's area starts below its caption band
     const RECT None = {-1, -1, -1, -1};
@@ -93,50 +89,8 @@ TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
     }
 }
 
-// The pane has a thin border, the frame a sizing one and a caption band; a
-// width given at creation wraps the rows; the refit gives a frame sized below
-// its borders its height back.
-TEST_F(ToolbarTest, CreationSizesThePaneAndTheFrame) {
-    HWND docked = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8});
-    EXPECT_TRUE(IsWindowVisible(docked) && !IsWindowVisible(Frame(docked)));
-    const int bx = GetSystemMetrics(SM_CXBORDER), by = GetSystemMetrics(SM_CYBORDER);
-    const int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME), ch = captionHeight;
-    EXPECT_EQ(Rect(-1, -1, 203 + 12 + 2 * bx - 1, 22 + 7 + 2 * by - 1), WindowRectInParent(docked));
-    EXPECT_EQ(Rect(0, 0, 203 + 12 + 2 * fx, 22 + 6 + 2 * fy + ch), WindowRectInParent(Frame(docked)));
-    HWND palette = Make({1, 2, 3, S, 4, 5, 6, S, 7, 8, 9, S, 10, 11, 12}, V | F, 300, 200, 100);
-    const RECT natural = WindowRectInParent(Frame(palette));
-    EXPECT_EQ(Rect(300, 200, 300 + 70 + 12 + 2 * fx, 200 + 4 * 22 + 6 + 2 * fy + ch), natural);
-    SetWindowPos(Frame(palette), nullptr, 0, 0, natural.right - natural.left, 2, SWP_NOMOVE | SWP_NOZORDER);
-    RefitToolbar(palette, ROLE_FLOATING);
-    EXPECT_EQ(natural, WindowRectInParent(Frame(palette)));
-}
-
-// Edits refuse a second copy of a button, and a move keeps each item's width;
-// cleaning leaves no separator at an end and no three side by side.
-TEST_F(ToolbarTest, EditsRefuseDoublesAndCleanSeparators) {
-    HWND pane = Make({1, S, 2, 3});
-    ToolbarRecord *record = RecordOfWindow(pane);
-    const std::vector<RECT> before = Rects(pane);
-    EXPECT_EQ(0u, InsertItemAt(record, 0, Item(2))) << "a button stands once";
-    EXPECT_EQ(1u, RemoveItem(record, Item(2)));
-    EXPECT_EQ(1u, InsertItemAt(record, 1, Item(2)));
-    EXPECT_EQ(1u, InsertItemAt(record, 99, Item(7))) << "an index past the end appends";
-    ASSERT_EQ((std::vector<UINT>{1, 2, S, 3, 7}), ToolbarIds(pane));
-    const std::vector<RECT> after = Rects(pane);
-    EXPECT_EQ(before[2].right - before[2].left, after[1].right - after[1].left);
-    EXPECT_EQ(before[1].right - before[1].left, after[2].right - after[2].left);
-    const std::vector<UINT> cases[][2] = {{{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S, S}, {}}};
-    for (const auto &k : cases) {
-        HWND t = Make(k[0]);
-        CleanSeparators(RecordOfWindow(t));
-        EXPECT_EQ(k[1], ToolbarIds(t));
-    }
-}
-
-// In each group of the flag word the first bit wins (visible over hidden,
-// docked over floating); the show group acts on the window of the place the
-// record holds then; a hidden toolbar stays hidden wherever it goes; the dock
-// shows with a docked toolbar. The frame hears WM_SIZE once for a dock change.
+// In each group of the flag word the first bit wins; the show group acts on the
+// window of the place the record holds then. WM_SIZE once for a dock change.
 TEST_F(ToolbarTest, FlagGroupsShowTheRightWindowAndTellTheFrameOnce) {
     const UINT cases[][5] = {// start, set, flags, pane shown, frame shown
                              {H | D, V | H, V | D, 1, 0}, {V | F, D | F, V | D, 1, 0}, {H | F, D, H | D, 0, 0},
@@ -185,11 +139,11 @@ void Watch(UINT message, std::vector<HWND> windows = {}) {
     heardBy.clear();
 }
 
-// A state setter paints a real change once on every toolbar showing the
-// button, and a value that reads as the present one not at all; the image
-// setter always repaints, the behaviour setter never; button text set to
-// what it is still refits.
-TEST_F(ToolbarTest, ButtonSettersPaintOnlyARealChangeOnEveryToolbar) {
+// A setter paints a real change once on every toolbar showing the button, a value
+// that reads as the present one not at all; images always, behaviours never. A refit
+// or packing that changes nothing places no window; an edit places and repaints what
+// it moves, the hidden frame too. Edits refuse doubles and clean separators.
+TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     HWND one = Make({1, 2, 3}), two = Make({3, 1});
     Watch(WM_PAINT, {one, two});
     const struct {
@@ -215,16 +169,9 @@ TEST_F(ToolbarTest, ButtonSettersPaintOnlyARealChangeOnEveryToolbar) {
             << "step " << (&s - steps);
         heardBy.clear();
     }
-    EXPECT_EQ(0u, QBR_SetButtonState(manager, 0, 1)) << "the separator is no button";
     QBR_SetButtonText(0);
     Pump();
     EXPECT_GE(heardBy[one], 1);
-    Watch(0);
-}
-
-// A refit or a packing that changes nothing places no window; an edit places
-// and repaints what it moves, the hidden frame too, and the dock keeps its size.
-TEST_F(ToolbarTest, RefitsPlaceOnlyWhatChanged) {
     HWND docked = Make({1, 2, 3, S, 4}), next = Make({9}), floating = Make({5, 6, 7}, V | F, 200, 200);
     const std::vector<HWND> windows = {next, docked, Frame(docked), floating, Frame(floating)};
     Watch(WM_WINDOWPOSCHANGING, windows);
@@ -232,9 +179,7 @@ TEST_F(ToolbarTest, RefitsPlaceOnlyWhatChanged) {
     Pump();
     for (HWND w : windows)
         EXPECT_EQ(0, heardBy[w]) << "window " << (std::find(windows.begin(), windows.end(), w) - windows.begin());
-    std::vector<RECT> places;
-    for (HWND w : {docked, Frame(docked), next})
-        places.push_back(WindowRectInParent(w));
+    const RECT places[] = {WindowRectInParent(docked), WindowRectInParent(Frame(docked)), WindowRectInParent(next)};
     ClearFrameLog();
     Watch(WM_PAINT, {next});
     ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
@@ -245,89 +190,13 @@ TEST_F(ToolbarTest, RefitsPlaceOnlyWhatChanged) {
     EXPECT_EQ(1, heardBy[next]) << "the moved pane is painted once";
     EXPECT_EQ(0, CountHeard(WM_SIZE));
     Watch(0);
-}
-
-// A host may pump messages between QBR_DestroyManager and the end of its
-// frame: the docks empty, hide and tell the frame at once; afterwards no
-// window names the freed manager, and paints, clicks, timers and the end of
-// a press under way find nothing and tell the frame nothing.
-TEST_F(ToolbarTest, ADestroyedManagerLeavesNoWindowOnFreedRecords) {
-    HWND left = MakeDock(DOCK_LEFT);
-    HWND docked = Make({1, 2, S, 3}), floating = Make({8}, V | F, 300, 200);
-    const UINT six = 6;
-    HWND column = QBR_CreateToolbar("C", V | D, 0, 0, 0, 0, left, &six, 1);
-    POINT on = Centre(Rects(docked)[0]);
-    ClientToScreen(docked, &on);
-    SendMouse(WM_LBUTTONDOWN, on, MK_LBUTTON); // a press under way
-    ASSERT_EQ(docked, GetCapture());
-    ClearFrameLog();
-    QBR_DestroyManager(manager);
-    manager = nullptr;
-    EXPECT_EQ((std::vector<Heard>{{WM_SIZE, 0, 0}, {WM_SIZE, 0, 0}}), FrameLog()) << Describe(FrameLog());
-    EXPECT_FALSE(IsWindowVisible(top) || IsWindowVisible(left));
-    EXPECT_EQ(nullptr, mouseTrack.hitItem) << "the pressed item is freed";
-    EXPECT_EQ(0, GetWindowLongPtrA(top, 0) | GetWindowLongPtrA(left, 0)) << "a dock names the freed manager";
-    ClearFrameLog();
-    SendMouse(WM_MOUSEMOVE, POINT{on.x + 1, on.y}, MK_LBUTTON);
-    SendMouse(WM_LBUTTONUP, on, 0);
-    EXPECT_EQ(nullptr, GetCapture()) << "the release still ends the press";
-    for (HWND window : {docked, column, floating, Frame(floating)}) {
-        EXPECT_EQ(nullptr, ManagerOfToolbar(window));
-        RedrawWindow(window, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE | RDW_UPDATENOW);
-        for (UINT m : {UINT(WM_LBUTTONDBLCLK), UINT(WM_RBUTTONDOWN), UINT(WM_RBUTTONUP), UINT(WM_SIZE)})
-            SendMessageA(window, m, 0, MAKELPARAM(3, 3));
-        SendMessageA(window, WM_TIMER, kSettleTimer, 0);
+    EXPECT_EQ(0u, InsertItemAt(RecordOfWindow(docked), 0, Item(2))) << "a button stands once in a toolbar";
+    const std::vector<UINT> cleaned[][2] = {{{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S, S}, {}}};
+    for (const auto &k : cleaned) { // no separator at an end, no three side by side
+        HWND t = Make(k[0]);
+        CleanSeparators(RecordOfWindow(t));
+        EXPECT_EQ(k[1], ToolbarIds(t));
     }
-    SendMessageA(top, WM_RBUTTONDOWN, 0, MAKELPARAM(3, 3));
-    Pump();
-    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
-}
-
-// The windows given, topmost first, as the window system stacks them.
-std::vector<HWND> Stacking(const std::vector<HWND> &windows) {
-    std::vector<HWND> out;
-    for (HWND w = GetTopWindow(nullptr); w; w = GetWindow(w, GW_HWNDNEXT))
-        if (std::find(windows.begin(), windows.end(), w) != windows.end()) out.push_back(w);
-    return out;
-}
-
-// A real click on a floating toolbar leaves the floating frames in their order
-// among themselves and above the host, at once and once the activation
-// settled, also after another window was active: "A", on top where three
-// frames overlap, is the first of the list, so a restack in list order would bury it.
-TEST_F(ToolbarTest, AClickOnAFloatingToolbarKeepsTheirOrder) {
-    HWND a = Make({1, 2, 3}, V | F, 400, 300), b = Make({4, 5, 6}, V | F, 420, 310);
-    HWND c = Make({7, 8, 9}, V | F, 440, 320);
-    QBR_SetToolbarFlags(a, H); // shown again: on top, out of list order
-    QBR_SetToolbarFlags(a, V | F);
-    PumpFor(3 * kRestackPeriod);
-    const std::vector<HWND> order = {Frame(a), Frame(c), Frame(b), frame};
-    ASSERT_EQ(order, Stacking(order));
-    POINT p = Centre(Rects(a)[2]);
-    ClientToScreen(Frame(a), &p);
-    HWND other = nullptr;
-    for (bool otherActive : {false, true}) {
-        if (otherActive)
-            other = CreateWindowExA(0, "QbrTestFrame", "Other", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 600, 500, 300, 200,
-                                    nullptr, nullptr, nullptr, nullptr);
-        PumpFor(3 * kRestackPeriod);
-        ClearFrameLog();
-        PlaceCursor(p);
-        SendButton(MOUSEEVENTF_LEFTDOWN);
-        SendButton(MOUSEEVENTF_LEFTUP);
-        for (int round = 0; round < 200 && CountHeard(WM_COMMAND) == 0; ++round) {
-            MsgWaitForMultipleObjects(0, nullptr, FALSE, 5, QS_ALLINPUT);
-            Pump();
-        }
-        // Wine raises a host activated from another window a moment later,
-        // on its own time: only the settled order can be asked for then.
-        if (!otherActive) EXPECT_EQ(order, Stacking(order)) << "right after the click";
-        PumpFor(3 * kRestackPeriod);
-        EXPECT_EQ(order, Stacking(order)) << "settled; another window active before: " << otherActive;
-        EXPECT_EQ(frame, GetActiveWindow());
-        EXPECT_EQ(1, CountHeard(WM_COMMAND)) << Describe(FrameLog());
-    }
-    DestroyWindow(other);
 }
 
 } // namespace
