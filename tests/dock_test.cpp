@@ -42,10 +42,9 @@ class DockTest : public FrameTest {
     const int L = GetSystemMetrics(SM_CXFULLSCREEN), cyFull = GetSystemMetrics(SM_CYFULLSCREEN);
 };
 
-// Empty docks are hidden placeholders one button thick; side docks run from the top
-// dock to the bottom one or the full-screen height; panes share border lines, a row
-// holds what ends within the full-screen width. New docks tell the frame once, the
-// usable area (given from the host's WM_SIZE answer) never.
+// Empty docks are hidden placeholders one button thick; side docks run from the top dock
+// to the bottom one or the full-screen height; panes share border lines; a row holds what
+// ends within the full-screen width. New docks tell the frame once, the usable area never.
 TEST_F(DockTest, WhereDocksStand) {
     const RECT c = ClientRectOf(frame);
     const int b = c.bottom - 20, r = c.right; // above a status bar

@@ -13,7 +13,8 @@
 
 namespace {
 
-constexpr UINT S = 0; // the shared separator's id
+constexpr UINT S = 0;               // the shared separator's id
+const RECT None = {-1, -1, -1, -1}; // an item not placed
 constexpr UINT V = TBF_VISIBLE, H = TBF_HIDDEN, D = TBF_DOCKED, F = TBF_FLOATING;
 
 class ToolbarTest : public FrameTest {
@@ -23,20 +24,17 @@ class ToolbarTest : public FrameTest {
         AddButtons(1, 30);
         top = MakeDock(DOCK_TOP);
     }
-    HWND Make(std::vector<UINT> ids, UINT flags = V | D, int x = 0, int y = 0, int width = 0) {
-        HWND pane = QBR_CreateToolbar("T", flags, x, y, width, 0, top, ids.data(), static_cast<UINT>(ids.size()));
+    HWND Make(std::vector<UINT> ids, UINT flags = V | D, int x = 0, int y = 0) {
+        HWND pane = QBR_CreateToolbar("T", flags, x, y, 0, 0, top, ids.data(), static_cast<UINT>(ids.size()));
         Pump();
         return pane;
     }
     ToolbarItem *Item(UINT id) { return ItemFindById(manager->items, id); }
     HWND Frame(HWND pane) { return ResolveRoleWindow(pane, ROLE_FLOATING); }
     std::vector<RECT> Rects(HWND pane) {
-        std::vector<RECT> out;
-        for (UINT i = 0; i < PointerListCount(RecordOfWindow(pane)->items); ++i) {
-            RECT r = {-1, -1, -1, -1};
-            GetItemRect(RecordOfWindow(pane), i, &r);
-            out.push_back(r);
-        }
+        std::vector<RECT> out(PointerListCount(RecordOfWindow(pane)->items), None);
+        for (UINT i = 0; i < out.size(); ++i)
+            GetItemRect(RecordOfWindow(pane), i, &out[i]);
         return out;
     }
     HWND top = nullptr;
@@ -46,7 +44,6 @@ class ToolbarTest : public FrameTest {
 // dropped when floating, row-high when docked; right and bottom edges belong to the item.
 TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
     const int ft = captionHeight + 3; // a frame's area starts below its caption band
-    const RECT None = {-1, -1, -1, -1};
     const struct {
         std::vector<UINT> ids;
         UINT flags;
@@ -77,7 +74,6 @@ TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
                      200 + (outer.bottom - outer.top) - client.bottom, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
         EXPECT_EQ(k.expected, Rects(pane)) << "flags " << k.flags << " right " << k.right;
     }
-    // On the last case's rows:
     const int points[][4] = {{30, 10, 1, 0}, {31, 10, 2, 1}, {53, 24, 2, 1}, {80, 5, 0, 4},
                              {88, 10, 0, 4}, {6, 26, 4, 4},  {50, 1, 0, 0},  {60, 30, 0, 5}}; // x, y, hit, drop
     for (const auto &p : points) {
@@ -105,7 +101,6 @@ TEST_F(ToolbarTest, FlagGroupsShowTheRightWindowAndTellTheFrameOnce) {
                                      UINT(IsWindowVisible(Frame(pane)) != 0), UINT(IsWindowVisible(top) != 0)}))
             << "from " << c[0] << " set " << c[1] << ": flags, pane, frame, dock";
         QBR_DestroyToolbar(pane);
-        Pump();
     }
     HWND pane = Make({1});
     for (int sizes : {1, 0}) {
@@ -189,6 +184,13 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     EXPECT_EQ(places[2].left + 23, WindowRectInParent(next).left);
     EXPECT_EQ(1, heardBy[next]) << "the moved pane is painted once";
     EXPECT_EQ(0, CountHeard(WM_SIZE));
+    RemoveItem(RecordOfWindow(docked), Item(S)); // a move inside: the same size, other rectangles
+    InsertItemAt(RecordOfWindow(docked), 1, Item(S));
+    EXPECT_EQ(10, Rects(docked)[1].right - Rects(docked)[1].left) << "the separator's width where it went";
+    const RECT natural = WindowRectInParent(Frame(floating));
+    SetWindowPos(Frame(floating), nullptr, 0, 0, natural.right - natural.left, 2, SWP_NOMOVE | SWP_NOZORDER);
+    RefitToolbar(floating, ROLE_FLOATING);
+    EXPECT_EQ(natural, WindowRectInParent(Frame(floating))) << "a frame sized below its borders gets its height back";
     Watch(0);
     EXPECT_EQ(0u, InsertItemAt(RecordOfWindow(docked), 0, Item(2))) << "a button stands once in a toolbar";
     const std::vector<UINT> cleaned[][2] = {{{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S, S}, {}}};
