@@ -35,9 +35,7 @@ class DockTest : public FrameTest {
             out.push_back(WindowRectInParent(w));
         return out;
     }
-    void SetFlags(HWND dock, UINT index, UINT flags) {
-        ListAt<ToolbarRecord>(FindDockRecord(dock)->toolbars, index)->flags = flags;
-    }
+    void SetFlags(HWND dock, UINT i, UINT f) { ListAt<ToolbarRecord>(FindDockRecord(dock)->toolbars, i)->flags = f; }
     int bw = 0, bh = 0;
     const int L = GetSystemMetrics(SM_CXFULLSCREEN), cyFull = GetSystemMetrics(SM_CYFULLSCREEN);
 };
