@@ -139,9 +139,8 @@ TEST_F(PaintTest, EverySurfaceTakesTheScheme) {
     QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
     const std::vector<int> keys = {COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT};
     const std::vector<COLORREF> c = {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)};
-    std::vector<COLORREF> old;
-    for (int k : keys)
-        old.push_back(GetSysColor(k));
+    const std::vector<COLORREF> old = {GetSysColor(keys[0]), GetSysColor(keys[1]), GetSysColor(keys[2]),
+                                       GetSysColor(keys[3])};
     SetSysColors(4, keys.data(), c.data());
     RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE);
     const Pixels before = ReadWindowPixels(pane);

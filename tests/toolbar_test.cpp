@@ -174,7 +174,9 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     Pump();
     for (HWND w : windows)
         EXPECT_EQ(0, heardBy[w]) << "window " << (std::find(windows.begin(), windows.end(), w) - windows.begin());
+    const int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME); // a frame's sizing borders
     const RECT places[] = {WindowRectInParent(docked), WindowRectInParent(Frame(docked)), WindowRectInParent(next)};
+    EXPECT_EQ(Rect(0, 0, 102 + 12 + 2 * fx, 22 + 6 + 2 * fy + captionHeight), places[1]) << "the docked one's frame";
     ClearFrameLog();
     Watch(WM_PAINT, {next});
     ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
@@ -184,10 +186,10 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     EXPECT_EQ(places[2].left + 23, WindowRectInParent(next).left);
     EXPECT_EQ(1, heardBy[next]) << "the moved pane is painted once";
     EXPECT_EQ(0, CountHeard(WM_SIZE));
-    RemoveItem(RecordOfWindow(docked), Item(S)); // a move inside: the same size, other rectangles
+    EXPECT_EQ(24, Rects(docked)[1].right - Rects(docked)[1].left); // a move inside: the same size, other rectangles
+    RemoveItem(RecordOfWindow(docked), Item(S));
     InsertItemAt(RecordOfWindow(docked), 1, Item(S));
     EXPECT_EQ(10, Rects(docked)[1].right - Rects(docked)[1].left) << "the separator's width where it went";
-    const int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME); // three buttons, borders, caption:
     const RECT natural = Rect(200, 200, 200 + 70 + 12 + 2 * fx, 200 + 22 + 6 + 2 * fy + captionHeight);
     SetWindowPos(Frame(floating), nullptr, 0, 0, natural.right - natural.left, 2, SWP_NOMOVE | SWP_NOZORDER);
     RefitToolbar(floating, ROLE_FLOATING);
