@@ -1,20 +1,9 @@
-// Painting: the image strip recoloured at load, each button state read back
-// pixel by pixel, the surfaces and the caption band. The strip is TESTSTRIP
-// (tests/support/test_strip.txt): 4 by 2 cells of 16 by 15, each with a face
-// background, red at (1..2, 1..2), ink at (4..11, 3..8), a white row at y 10
-// and a grey row at y 11 (x 4..11), and in cell n a blue pixel at (n, 13).
-// Colours are the system's, read at run time.
-#include <algorithm>
-#include <cmath>
-#include <cstdio>
-#include <cstdlib>
-#include <cstring>
-#include <string>
-#include <utility>
+// Painting read back pixel by pixel, against the system's colours read at run time.
+// TESTSTRIP (support/test_strip.txt): cells of 16 by 15 of face, red at (1..2, 1..2),
+// ink at (4..11, 3..8), white and grey rows at y 10 and 11, in cell n blue at (n, 13).
 #include <vector>
 
 #include "core/core.h"
-#include "core/gdi.h"
 #include "harness.h"
 #include "paint/paint.h"
 #include "quaybar.h"
@@ -22,567 +11,152 @@
 
 namespace {
 
-constexpr COLORREF kRed = RGB(255, 0, 0), kBlue = RGB(0, 0, 255);
-constexpr COLORREF kWhite = RGB(255, 255, 255), kBlack = RGB(0, 0, 0), kGrey = RGB(128, 128, 128);
-constexpr COLORREF kUntouched = RGB(1, 2, 3); // what a canvas starts as
-constexpr int kCellW = 16, kCellH = 15;
+constexpr COLORREF kRed = RGB(255, 0, 0), kBlue = RGB(0, 0, 255), kWhite = RGB(255, 255, 255), kBlack = 0;
+const COLORREF kFace = GetSysColor(COLOR_BTNFACE), kHighlight = GetSysColor(COLOR_BTNHIGHLIGHT);
+const COLORREF kShadow = GetSysColor(COLOR_BTNSHADOW), kFrame = GetSysColor(COLOR_WINDOWFRAME);
 
-COLORREF FromDib(DWORD v) { return RGB((v >> 16) & 0xFF, (v >> 8) & 0xFF, v & 0xFF); }
-
-BITMAPINFO TopDown32(int width, int height) {
-    BITMAPINFO info = {};
-    info.bmiHeader = {sizeof(BITMAPINFOHEADER), width, -height, 1, 32, BI_RGB, 0, 0, 0, 0, 0};
-    return info;
-}
-
-// A 32-bit top-down DIB section in a memory DC: the target of a pass, read
-// back without any window in between.
-class Canvas {
-  public:
-    Canvas(int width, int height) : width_(width), height_(height) {
-        BITMAPINFO info = TopDown32(width, height);
-        dc_ = CreateCompatibleDC(nullptr);
-        void *bits = nullptr;
-        bitmap_ = CreateDIBSection(dc_, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
-        bits_ = static_cast<DWORD *>(bits);
-        old_ = SelectObject(dc_, bitmap_);
-        Clear();
-    }
-    ~Canvas() {
-        SelectObject(dc_, old_);
-        DeleteObject(bitmap_);
-        DeleteDC(dc_);
-    }
-    Canvas(const Canvas &) = delete;
-    Canvas &operator=(const Canvas &) = delete;
-    void Clear() {
-        GdiFlush();
-        std::fill(bits_, bits_ + width_ * height_, DWORD(0x00010203)); // kUntouched
-    }
-    HDC Dc() const { return dc_; }
-    COLORREF At(int x, int y) const { return GdiFlush(), FromDib(bits_[y * width_ + x]); }
-    std::vector<COLORREF> All() const {
-        GdiFlush();
-        std::vector<COLORREF> out;
-        for (int i = 0; i < width_ * height_; ++i)
-            out.push_back(FromDib(bits_[i]));
-        return out;
-    }
-
-  private:
-    int width_, height_;
-    HDC dc_;
-    HBITMAP bitmap_;
-    HGDIOBJ old_;
-    DWORD *bits_ = nullptr;
-};
-
-// The pixels of a bitmap, top-down.
-struct BitmapPixels {
-    explicit BitmapPixels(HBITMAP bitmap) {
-        BITMAP info = {};
-        GetObjectA(bitmap, sizeof(info), &info);
-        width = info.bmWidth;
-        height = info.bmHeight;
-        BITMAPINFO header = TopDown32(width, height);
-        std::vector<DWORD> raw(static_cast<size_t>(width) * height);
-        ScreenDC screen;
-        GetDIBits(screen, bitmap, 0, height, raw.data(), &header, DIB_RGB_COLORS);
-        for (DWORD v : raw)
-            colors.push_back(FromDib(v));
-    }
-    COLORREF At(int x, int y) const { return colors[static_cast<size_t>(y) * width + x]; }
-    int width = 0, height = 0;
-    std::vector<COLORREF> colors;
-};
-
-std::string Hex(COLORREF c) {
-    char text[16];
-    std::snprintf(text, sizeof(text), "%06lx", static_cast<unsigned long>(c));
-    return text;
-}
-
-struct SchemeColors {
-    COLORREF face = GetSysColor(COLOR_BTNFACE);
-    COLORREF highlight = GetSysColor(COLOR_BTNHIGHLIGHT);
-    COLORREF shadow = GetSysColor(COLOR_BTNSHADOW);
-    COLORREF text = GetSysColor(COLOR_BTNTEXT);
-    COLORREF frame = GetSysColor(COLOR_WINDOWFRAME);
-};
-
-HRSRC TestStrip() { return FindResourceA(GetModuleHandleA(nullptr), "TESTSTRIP", MAKEINTRESOURCEA(2)); }
-
-// Every cell of a loaded strip shows the keys as the given colours, red and
-// its marker unchanged.
-void ExpectStripColours(const BitmapPixels &px, const SchemeColors &c) {
-    ASSERT_EQ(4 * kCellW, px.width);
-    ASSERT_EQ(2 * kCellH, px.height);
-    struct Probe {
-        const char *what;
-        int x, y;
-        COLORREF expected;
-    } const probes[] = {
-        {"light grey -> face", 0, 0, c.face},       {"light grey -> face", 14, 14, c.face},
-        {"black -> button text", 5, 5, c.text},     {"grey -> shadow", 5, 11, c.shadow},
-        {"white -> highlight", 5, 10, c.highlight}, {"red stays red", 1, 1, kRed},
-    };
-    for (int cell = 0; cell < 8; ++cell) {
-        const int cx = (cell % 4) * kCellW, cy = (cell / 4) * kCellH;
-        for (const Probe &p : probes)
-            EXPECT_EQ(Hex(p.expected), Hex(px.At(cx + p.x, cy + p.y))) << p.what << " in cell " << cell;
-        EXPECT_EQ(Hex(kBlue), Hex(px.At(cx + cell, cy + 13))) << "marker of cell " << cell;
-    }
-}
-
-// A client and a manager without a frame, with buttons 1..8 on images 0..7
-// and the test strip.
-class PaintTest : public ClientTest {
-  protected:
-    void SetUp() override {
-        ClientTest::SetUp();
-        manager = QBR_CreateManager(nullptr);
-        ASSERT_NE(nullptr, manager);
-        UINT ids[8] = {1, 2, 3, 4, 5, 6, 7, 8};
-        ASSERT_EQ(1u, QBR_AddButtons(manager, ids, 8));
-        ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
-    }
-    void TearDown() override {
-        QBR_DestroyManager(manager);
-        ClientTest::TearDown();
-    }
-    // BS_ON / BS_MIXED go through the state, the rest through their setters.
-    void SetBits(UINT id, UINT bits) {
-        QBR_SetButtonState(manager, id, (bits & BS_ON) ? 1 : (bits & BS_MIXED) ? 2 : 0);
-        QBR_SetButtonEnabled(manager, id, (bits & BS_DISABLED) ? 0 : 1);
-        QBR_SetButtonPressed(manager, id, (bits & BS_PRESSED) ? 1 : 0);
-    }
-    // One pass with one button whose outer rectangle starts at (left, top).
-    void PaintOne(Canvas &canvas, UINT id, int left, int top, UINT noState = 0) {
-        int bw = 0, bh = 0;
-        GetButtonSizes(&bw, &bh, nullptr, nullptr);
-        RECT rect = {left, top, left + bw, top + bh};
-        ASSERT_EQ(1u, BeginButtonPaint(manager, canvas.Dc()));
-        PaintButton(ItemFindById(manager->items, id), &rect, noState);
-        EndButtonPaint();
-    }
-    ToolbarManager *manager = nullptr;
-    SchemeColors colors;
-};
-
-// ---- Image strip ----------------------------------------------------------------
-
-// The manager's strip, a direct load and a second load are the same image, the
-// stored resource is never written to, and loaded strips are counted objects.
-TEST_F(PaintTest, StripKeysBecomeButtonColoursAndTheResourceStaysAsItWas) {
-    const BitmapPixels managed(manager->imageStrip);
-    ExpectStripColours(managed, colors);
-
-    HINSTANCE instance = GetModuleHandleA(nullptr);
-    HRSRC resource = TestStrip();
-    ASSERT_NE(nullptr, resource);
-    const DWORD size = SizeofResource(instance, resource);
-    const BYTE *stored = static_cast<const BYTE *>(LockResource(LoadResource(instance, resource)));
-    const std::vector<BYTE> before(stored, stored + size);
-    HBITMAP loads[2] = {LoadImageStrip(instance, resource), LoadImageStrip(instance, resource)};
-    const LONG live = LiveGdiObjects();
-    for (HBITMAP strip : loads) {
-        ASSERT_NE(nullptr, strip);
-        EXPECT_TRUE(managed.colors == BitmapPixels(strip).colors) << "a later load of the same resource differs";
-        GdiDelete(strip);
-    }
-    EXPECT_EQ(0, std::memcmp(before.data(), stored, size)) << "the stored image was written to";
-    EXPECT_EQ(live - 2, LiveGdiObjects());
-}
-
-// ---- Button states ----------------------------------------------------------------
-
-// What a probe should show. Dither is the checker of face and highlight by the
-// target's own pixel position: face where x + y is even.
-enum Look { F, H, S, K, R, B, D };
-
-struct StateRow {
-    const char *name;
-    UINT bits;
-    // Button edges and face, relative to the outer rectangle:
-    // left (1,5), top (5,1), right (22,5), bottom (5,20), face (2,10), (2,11).
-    Look left, top, right, bottom, face1, face2;
-    // Image pixels, relative to where the image lands (one pixel lower right
-    // when sunken): ink (5,5), red (1,1), white (5,10), (6,10),
-    // right of the ink (12,5), (12,6), marker (n,13).
-    Look ink, red, white1, white2, beside1, beside2, marker;
-};
-
-// clang-format off
-const StateRow kStates[] = {
-    // name                 bits                      l  t  r  b  f  f  ink red wht wht bes bes mrk
-    {"normal",              0,                        H, H, S, S, F, F, K,  R,  H,  H,  F,  F,  B},
-    {"pressed",             BS_PRESSED,               S, S, F, F, F, F, K,  R,  H,  H,  F,  F,  B},
-    {"on",                  BS_ON,                    S, S, D, D, D, D, K,  R,  D,  D,  D,  D,  B},
-    {"on pressed",          BS_ON | BS_PRESSED,       S, S, D, D, D, D, K,  R,  D,  D,  D,  D,  B},
-    {"mixed",               BS_MIXED,                 H, H, S, S, D, D, S,  S,  H,  H,  D,  D,  S},
-    {"mixed pressed",       BS_MIXED | BS_PRESSED,    S, S, F, F, D, D, S,  S,  H,  H,  D,  D,  S},
-    {"disabled",            BS_DISABLED,              H, H, S, S, F, F, S,  S,  F,  F,  H,  H,  S},
-    {"disabled pressed",    BS_DISABLED | BS_PRESSED, S, S, F, F, F, F, S,  S,  H,  H,  H,  H,  S},
-    {"disabled on",         BS_DISABLED | BS_ON,      S, S, D, D, D, D, S,  S,  D,  D,  H,  H,  S},
-    {"disabled mixed",      BS_DISABLED | BS_MIXED,   H, H, S, S, D, D, S,  S,  F,  F,  D,  D,  S},
-};
-// clang-format on
-
-TEST_F(PaintTest, EachStateHasItsLook) {
-    const int left = 11, top = 10; // odd and even both, so the checker's phase is seen
-    const UINT id = 6;             // image 5: the second strip row
-    Canvas canvas(50, 40);
-    auto expected = [&](Look look, int x, int y) -> COLORREF {
-        const COLORREF looks[] = {colors.face, colors.highlight, colors.shadow, colors.text, kRed, kBlue};
-        return look == D ? ((x + y) % 2 == 0 ? colors.face : colors.highlight) : looks[look];
-    };
-    for (const StateRow &s : kStates) {
-        SetBits(id, s.bits);
-        canvas.Clear();
-        PaintOne(canvas, id, left, top);
-        const int shift = (s.bits & (BS_ON | BS_PRESSED)) ? 4 : 3;
-        const int ix = left + shift, iy = top + shift;
-        struct Probe {
-            Look look;
-            int x, y;
-        } const probes[] = {
-            {s.left, left + 1, top + 5},    {s.top, left + 5, top + 1},    {s.right, left + 22, top + 5},
-            {s.bottom, left + 5, top + 20}, {s.face1, left + 2, top + 10}, {s.face2, left + 2, top + 11},
-            {s.ink, ix + 5, iy + 5},        {s.red, ix + 1, iy + 1},       {s.white1, ix + 5, iy + 10},
-            {s.white2, ix + 6, iy + 10},    {s.beside1, ix + 12, iy + 5},  {s.beside2, ix + 12, iy + 6},
-            {s.marker, ix + 5, iy + 13},
-        };
-        for (const Probe &p : probes)
-            EXPECT_EQ(Hex(expected(p.look, p.x, p.y)), Hex(canvas.At(p.x, p.y)))
-                << s.name << " at (" << p.x - left << ", " << p.y - top << ")";
-        // The frame ring never moves; its corners and the outside stay unpainted.
-        const POINT frame[] = {{5, 0}, {5, 21}, {0, 5}, {23, 5}};
-        const POINT untouched[] = {{0, 0}, {23, 0}, {0, 21}, {23, 21}, {24, 5}, {5, 22}};
-        for (POINT f : frame)
-            EXPECT_EQ(Hex(colors.frame), Hex(canvas.At(left + f.x, top + f.y))) << s.name << ": frame";
-        for (POINT u : untouched)
-            EXPECT_EQ(Hex(kUntouched), Hex(canvas.At(left + u.x, top + u.y))) << s.name << ": " << u.x << "," << u.y;
-    }
-}
-
-// A disabled button's ink is embossed: a dark copy in place over a light copy
-// one pixel lower right, and on a disabled on button the dither keeps off the
-// whole light copy, whatever the checker's phase.
-TEST_F(PaintTest, DisabledInkIsEmbossed) {
-    Canvas canvas(40, 30);
-    for (UINT bits : {UINT(BS_DISABLED), UINT(BS_DISABLED | BS_ON)}) {
-        SetBits(1, bits);
-        canvas.Clear();
-        PaintOne(canvas, 1, 0, 0);
-        const int o = (bits & BS_ON) ? 4 : 3;
-        for (int y = 3; y <= 8; ++y) {
-            for (int x = 4; x <= 11; ++x)
-                EXPECT_EQ(Hex(colors.shadow), Hex(canvas.At(o + x, o + y))) << bits << " dark at " << x;
-            EXPECT_EQ(Hex(colors.highlight), Hex(canvas.At(o + 12, o + y + 1))) << bits << " light right";
-        }
-        for (int x = 5; x <= 12; ++x)
-            EXPECT_EQ(Hex(colors.highlight), Hex(canvas.At(o + x, o + 9))) << bits << " light below";
-    }
-}
-
-// ---- Toolbar surface and floating caption -----------------------------------------
-
-// A frame with a top dock, buttons 1..3 on the test strip, and a toolbar.
-class SurfaceTest : public FrameTest {
+// Buttons 1..6 on images 0..5 of the strip, a docked pane of 6, 1, 2, a floating one of 1, 2, 3.
+class PaintTest : public FrameTest {
   protected:
     void SetUp() override {
         FrameTest::SetUp();
-        AddButtons(1, 3);
+        AddButtons(1, 6);
         ASSERT_EQ(1u, QBR_SetImageStrip(manager, "TESTSTRIP"));
         top = MakeDock(DOCK_TOP);
-        ASSERT_NE(nullptr, top);
-    }
-    HWND Make(UINT flags, LPCSTR title = "Tools") {
-        UINT ids[3] = {1, 2, 3};
-        HWND pane = QBR_CreateToolbar(title, flags, 300, 200, 0, 0, top, ids, 3);
+        const UINT docked[] = {6, 1, 2}, floats[] = {1, 2, 3};
+        pane = QBR_CreateToolbar("Tools", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 3);
+        floating = ResolveRoleWindow(
+            QBR_CreateToolbar("Tools", TBF_VISIBLE | TBF_FLOATING, 300, 200, 0, 0, top, floats, 3), ROLE_FLOATING);
         Pump();
-        return pane;
     }
-    HWND top = nullptr;
-    SchemeColors colors;
-    const COLORREF band = GetSysColor(COLOR_ACTIVECAPTION), line = GetSysColor(COLOR_WINDOWFRAME);
+    HWND top = nullptr, pane = nullptr, floating = nullptr;
 };
 
-// The docked pane and the floating frame: the face-coloured surface, buttons
-// from the item area's corner on, and on the frame a caption band over them.
-TEST_F(SurfaceTest, PaneAndFrameShowSurfaceButtonsAndCaption) {
-    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
-    InvalidateRect(pane, nullptr, TRUE);
-    Pixels px = ReadWindowPixels(pane);
-    ASSERT_GT(px.width, 60);
-    EXPECT_EQ(Hex(colors.face), Hex(px.At(2, 1)));
-    EXPECT_EQ(Hex(colors.face), Hex(px.At(px.width - 2, px.height - 2)));
-    for (int b = 0; b < 2; ++b) { // the second button 23 pixels further right
-        const int left = kAreaLeft + 23 * b, topY = kPaneAreaTop;
-        EXPECT_EQ(Hex(colors.frame), Hex(px.At(left + 5, topY))) << "button " << b;
-        EXPECT_EQ(Hex(colors.highlight), Hex(px.At(left + 1, topY + 5))) << "button " << b;
-        EXPECT_EQ(Hex(kBlue), Hex(px.At(left + 3 + b, topY + 3 + 13))) << "button " << b;
-    }
+// Face, highlight, shadow, button text, red, blue, or the dither (face where x + y is even).
+enum Look { F, H, S, K, R, B, D };
 
-    HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
-    ASSERT_TRUE(IsWindowVisible(frame));
-    InvalidateRect(frame, nullptr, TRUE);
-    px = ReadWindowPixels(frame);
-    const int ch = captionHeight, t = (ch - 1) >> 1;
-    ASSERT_GE(ch, 5);
-    struct Probe {
-        const char *what;
-        int x, y;
-        COLORREF expected;
-    } const probes[] = {
-        {"band", px.width - 2, 1, band},
-        {"line under the band", px.width - 2, ch - 1, line},
-        {"surface below the band", px.width - 2, ch, colors.face},
-        {"box edge right", ch, 1, line},
-        {"box edge bottom", 1, ch - 1, line},
-        {"box inside", 1, 1, colors.face},
-        {"dash white", 3, t, kWhite},
-        {"dash outline", 2, t, kBlack},
-        {"dash outline above", 3, t - 1, kBlack},
-        {"dash shadow", ch - 2, t + 2, kGrey},
-        {"items below the band", kAreaLeft + 4, ch + kFrameAreaTop + 4, kRed},
+// The first button in each state, at points relative to its outer rectangle and to
+// where its image lands (one pixel lower right when sunken); the frame ring never moves.
+TEST_F(PaintTest, EachStateHasItsLook) {
+    const struct {
+        const char *name;
+        UINT state, enabled, pressed;
+        Look left, top, right, bottom, face, ink, red, white, beside, below, marker;
+    } states[] = {
+        // clang-format off
+        {"normal",           0, 1, 0, H, H, S, S, F, K, R, H, F, F, B},
+        {"pressed",          0, 1, 1, S, S, F, F, F, K, R, H, F, F, B},
+        {"on",               1, 1, 0, S, S, D, D, D, K, R, D, D, D, B},
+        {"on pressed",       1, 1, 1, S, S, D, D, D, K, R, D, D, D, B},
+        {"mixed",            2, 1, 0, H, H, S, S, D, S, S, H, D, D, S},
+        {"mixed pressed",    2, 1, 1, S, S, F, F, D, S, S, H, D, D, S},
+        {"disabled",         0, 0, 0, H, H, S, S, F, S, S, F, H, H, S},
+        {"disabled pressed", 0, 0, 1, S, S, F, F, F, S, S, H, H, H, S},
+        {"disabled on",      1, 0, 0, S, S, D, D, D, S, S, D, H, H, S},
+        {"disabled mixed",   2, 0, 0, H, H, S, S, D, S, S, F, D, D, S},
+        // clang-format on
     };
-    for (const Probe &p : probes)
-        EXPECT_EQ(Hex(p.expected), Hex(px.At(p.x, p.y))) << p.what;
-    // The title: something other than the band colour, centred.
-    int left = px.width, right = -1;
-    for (int y = 0; y < ch - 1; ++y)
-        for (int x = ch + 2; x < px.width; ++x)
-            if (px.At(x, y) != band) left = std::min(left, x), right = std::max(right, x + 1);
-    ASSERT_LT(left, right) << "no title drawn";
-    EXPECT_LE(std::abs((left + right) - px.width), 6) << left << ".." << right;
-}
-
-// Changes system colours for the length of a scope, and puts them back.
-class SchemeChange {
-  public:
-    SchemeChange(std::vector<int> elements, std::vector<COLORREF> colours) : elements_(std::move(elements)) {
-        for (int e : elements_)
-            saved_.push_back(GetSysColor(e));
-        ok_ = SetSysColors(static_cast<int>(elements_.size()), elements_.data(), colours.data()) != 0;
-        Pump();
-    }
-    ~SchemeChange() {
-        SetSysColors(static_cast<int>(elements_.size()), elements_.data(), saved_.data());
-        Pump();
-    }
-    bool Ok() const { return ok_; }
-
-  private:
-    std::vector<int> elements_;
-    std::vector<COLORREF> saved_;
-    bool ok_ = false;
-};
-
-// A strip loaded under another scheme takes that scheme's colours.
-TEST_F(PaintTest, StripFollowsAnUnusualScheme) {
-    SchemeChange scheme({COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT},
-                        {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)});
-    ASSERT_TRUE(scheme.Ok());
-    HBITMAP strip = LoadImageStrip(GetModuleHandleA(nullptr), TestStrip());
-    ASSERT_NE(nullptr, strip);
-    ExpectStripColours(BitmapPixels(strip), SchemeColors());
-    GdiDelete(strip);
-}
-
-// The surface reads the face colour at every paint; the buttons keep the
-// colours of the library's start.
-TEST_F(SurfaceTest, TheSurfaceTakesTheFaceColourOfEachPaint) {
-    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
-    const COLORREF now = RGB(70, 80, 90);
-    SchemeChange scheme({COLOR_BTNFACE}, {now});
-    ASSERT_TRUE(scheme.Ok());
-    InvalidateRect(pane, nullptr, TRUE);
-    const Pixels px = ReadWindowPixels(pane);
-    EXPECT_EQ(Hex(now), Hex(px.At(2, 1)));
-    EXPECT_EQ(Hex(now), Hex(px.At(px.width - 2, px.height - 2)));
-    EXPECT_EQ(Hex(colors.face), Hex(px.At(kAreaLeft + 2, kPaneAreaTop + 10))) << "a button's face";
-}
-
-// The relief of a raised and of a sunken button, pixel by pixel: f frame ring,
-// H light edge, S dark edge, F face, '.' corner left alone, '?' the image.
-// Raised: one light pixel left and top, two dark ones right and bottom.
-// Sunken: one dark pixel left and top, and the image one pixel further in.
-TEST_F(PaintTest, RaisedAndSunkenEdgesToThePixel) {
-    std::vector<std::string> raised = {".ffffffffffffffffffffff.", "fHHHHHHHHHHHHHHHHHHHHHSf",
-                                       "fHFFFFFFFFFFFFFFFFFFFSSf"};
-    for (int y = 3; y <= 17; ++y)
-        raised.push_back("fHF????????????????FFSSf");
-    raised.push_back("fHFFFFFFFFFFFFFFFFFFFSSf");
-    raised.push_back("fHSSSSSSSSSSSSSSSSSSSSSf");
-    raised.push_back("fSSSSSSSSSSSSSSSSSSSSSSf");
-    raised.push_back(".ffffffffffffffffffffff.");
-    std::vector<std::string> sunken = {".ffffffffffffffffffffff.", "fSSSSSSSSSSSSSSSSSSSSSSf",
-                                       "fSFFFFFFFFFFFFFFFFFFFFFf", "fSFFFFFFFFFFFFFFFFFFFFFf"};
-    for (int y = 4; y <= 18; ++y)
-        sunken.push_back("fSFF????????????????FFFf");
-    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
-    sunken.push_back("fSFFFFFFFFFFFFFFFFFFFFFf");
-    sunken.push_back(".ffffffffffffffffffffff.");
-    Canvas canvas(24, 22);
-    for (int pressed = 0; pressed < 2; ++pressed) {
-        const std::vector<std::string> &picture = pressed ? sunken : raised;
-        ASSERT_EQ(22u, picture.size());
-        SetBits(4, pressed ? BS_PRESSED : 0);
-        canvas.Clear();
-        PaintOne(canvas, 4, 0, 0);
-        for (int y = 0; y < 22; ++y) {
-            ASSERT_EQ(24u, picture[y].size()) << y;
-            for (int x = 0; x < 24; ++x) {
-                const char c = picture[y][x];
-                if (c == '?') continue;
-                const COLORREF want = c == 'f'   ? colors.frame
-                                      : c == 'H' ? colors.highlight
-                                      : c == 'S' ? colors.shadow
-                                      : c == 'F' ? colors.face
-                                                 : kUntouched;
-                EXPECT_EQ(Hex(want), Hex(canvas.At(x, y))) << (pressed ? "sunken" : "raised") << " at " << x << "," << y;
-            }
+    const COLORREF looks[] = {kFace, kHighlight, kShadow, GetSysColor(COLOR_BTNTEXT), kRed, kBlue};
+    for (const auto &s : states) {
+        QBR_SetButtonState(manager, 6, s.state);
+        QBR_SetButtonEnabled(manager, 6, s.enabled);
+        QBR_SetButtonPressed(manager, 6, s.pressed);
+        const Pixels px = ReadWindowPixels(pane);
+        const int i = (s.state == 1 || s.pressed) ? 4 : 3; // where the image lands
+        const struct {
+            Look look;
+            int x, y;
+        } probes[] = {
+            // clang-format off
+            {s.left, 1, 5}, {s.top, 5, 1}, {s.right, 21, 5}, {s.right, 22, 5}, {s.bottom, 5, 19}, {s.bottom, 5, 20},
+            {s.face, 2, 10}, {s.face, 2, 11}, {s.ink, i + 5, i + 5}, {s.red, i + 1, i + 1}, {s.white, i + 5, i + 10},
+            {s.white, i + 6, i + 10}, {s.beside, i + 12, i + 5}, {s.beside, i + 12, i + 6}, {s.below, i + 8, i + 9},
+            {s.marker, i + 5, i + 13}, {F, 0, 0}, {F, 0, 21}, {F, 5, 22}, {K, 5, 0}, {K, 5, 21}, {K, 0, 5}, {K, 23, 5},
+            // clang-format on
+        };
+        for (const auto &p : probes) {
+            const int x = kAreaLeft + p.x, y = kPaneAreaTop + p.y;
+            const bool ring = &p - probes >= 19;
+            const COLORREF want = ring ? kFrame : p.look == D ? ((x + y) % 2 ? kHighlight : kFace) : looks[p.look];
+            EXPECT_EQ(want, px.At(x, y)) << s.name << " at (" << p.x << ", " << p.y << ")";
         }
     }
 }
 
-} // namespace
-
-// ---- Colour schemes ----------------------------------------------------------------
-
-namespace {
-
-// The user's app mode in this test's own prefix, put back as it was.
-class AppMode {
-  public:
-    AppMode() {
-        RegCreateKeyExA(HKEY_CURRENT_USER, kKey, 0, nullptr, 0, KEY_ALL_ACCESS, nullptr, &key_, nullptr);
-        DWORD size = sizeof(saved_);
-        had_ = RegQueryValueExA(key_, "AppsUseLightTheme", nullptr, nullptr, reinterpret_cast<BYTE *>(&saved_),
-                                &size) == ERROR_SUCCESS;
-    }
-    ~AppMode() {
-        if (had_)
-            Set(saved_ == 0);
-        else
-            RegDeleteValueA(key_, "AppsUseLightTheme");
-        RegCloseKey(key_);
-    }
-    void Set(bool dark) {
-        DWORD light = dark ? 0 : 1;
-        RegSetValueExA(key_, "AppsUseLightTheme", 0, REG_DWORD, reinterpret_cast<const BYTE *>(&light), sizeof(light));
-    }
-    void Remove() { RegDeleteValueA(key_, "AppsUseLightTheme"); }
-
-  private:
-    static constexpr const char *kKey = "Software\\Microsoft\\Windows\\CurrentVersion\\Themes\\Personalize";
-    HKEY key_ = nullptr;
-    DWORD saved_ = 1;
-    bool had_ = false;
-};
-
-// What a frame shows: its pane, the dock, a floating frame, and where
-// everything stands.
-struct Shown {
-    Pixels pane, dock, floating;
-    std::vector<RECT> places;
-    std::vector<UINT> states;
-};
-
-} // namespace
-
-// Each scheme, read back from a docked pane, its dock and a floating frame:
-// the dark one dark with light ink, high contrast white ink and lines on black,
-// and in both every surface the library paints takes the scheme's face.
-TEST_F(SurfaceTest, EverySurfaceTakesTheScheme) {
-    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
-    HWND floating = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
-    const int glyphX = kAreaLeft + 3 + 6, glyphY = kPaneAreaTop + 3 + 5; // black ink of the first image
-    for (UINT scheme : {QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST}) {
-        SCOPED_TRACE(scheme == QBR_SCHEME_DARK ? "dark" : "high contrast");
-        ASSERT_EQ(1u, QBR_SetColorScheme(scheme));
-        EXPECT_EQ(scheme, QBR_GetActiveColorScheme());
-        Pump();
-        const Pixels px = ReadWindowPixels(pane), dock = ReadWindowPixels(top), fl = ReadWindowPixels(floating);
-        const COLORREF face = px.At(2, 1), ink = px.At(glyphX, glyphY);
-        if (scheme == QBR_SCHEME_HIGHCONTRAST) {
-            EXPECT_EQ(Hex(kBlack), Hex(face));
-            EXPECT_EQ(Hex(kWhite), Hex(ink)) << "glyph ink";
-            EXPECT_EQ(Hex(kWhite), Hex(px.At(kAreaLeft + 5, kPaneAreaTop))) << "the ring around a button";
-            EXPECT_EQ(Hex(kWhite), Hex(px.At(kAreaLeft + 3 + 1, kPaneAreaTop + 3 + 1))) << "red too is drawn in the text colour";
-        } else {
-            EXPECT_LT(Luminance(face), 0.05) << Hex(face);
-            EXPECT_GT(Luminance(ink), 0.7) << Hex(ink);
-        }
-        RECT client;
-        GetClientRect(frame, &client);
-        const int dockX = std::min(dock.width, static_cast<int>(client.right)) - 2; // right of the pane
-        EXPECT_EQ(Hex(face), Hex(dock.At(dockX, 1))) << "the dock's surface";
-        EXPECT_NE(Hex(face), Hex(dock.At(dockX, dock.height - 1))) << "the dock's line";
-        EXPECT_EQ(Hex(face), Hex(fl.At(fl.width - 2, fl.height - 2))) << "the floating frame's surface";
-        EXPECT_EQ(Hex(face), Hex(fl.At(1, 1))) << "inside the close box";
-        EXPECT_LT(Luminance(fl.At(fl.width - 2, 1)), 0.05) << "the caption band";
-    }
-    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_SYSTEM));
-    EXPECT_EQ(0u, QBR_SetColorScheme(QBR_SCHEME_FOLLOW + 1));
-}
-
-// Following the system through the user's app mode, switched live: one
-// WM_SETTINGCHANGE ("ImmersiveColorSet") passed on repaints the pane, the dock
-// and the floating frame dark and back to exactly what they were, while rows,
-// places and states stay; another setting's change does nothing.
-TEST_F(SurfaceTest, FollowingTheAppModeSwitchesLive) {
-    AppMode mode;
-    HWND pane = Make(TBF_VISIBLE | TBF_DOCKED);
-    HWND floating = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_FLOATING), ROLE_FLOATING);
-    QBR_SetButtonState(manager, 2, 1);
-    QBR_SetButtonEnabled(manager, 3, 0);
+// Each scheme read back from the pane, its dock and the floating frame: the system's,
+// dark and high contrast (ink of high contrast on a dark face everywhere) as the app
+// mode and the host's colour messages switch them live, and back to the pixel.
+TEST_F(PaintTest, EverySurfaceTakesTheScheme) {
+    HKEY key = nullptr;
+    RegCreateKeyExA(HKEY_CURRENT_USER, "Software\\Microsoft\\Windows\\CurrentVersion\\Themes\\Personalize", 0, nullptr,
+                    0, KEY_ALL_ACCESS, nullptr, &key, nullptr);
+    RegDeleteValueA(key, "AppsUseLightTheme"); // no value is the light mode
+    const DWORD dark = 0;
     auto show = [&] {
-        Pump();
-        Shown s{ReadWindowPixels(pane), ReadWindowPixels(top), ReadWindowPixels(floating), {}, {}};
-        for (HWND w : {pane, top, floating}) {
-            RECT r;
-            GetWindowRect(w, &r);
-            s.places.push_back(r);
-        }
-        for (UINT id = 1; id <= 3; ++id) {
-            RECT r;
-            GetItemRect(RecordOfWindow(pane), id - 1, &r);
-            s.places.push_back(r);
-            s.states.push_back(QBR_GetButtonState(manager, id) | (QBR_IsButtonEnabled(manager, id) << 4));
-        }
-        return s;
+        return std::vector<Pixels>{ReadWindowPixels(pane), ReadWindowPixels(top), ReadWindowPixels(floating)};
     };
-    auto samePlaces = [](const Shown &a, const Shown &b) {
-        for (size_t i = 0; i < a.places.size(); ++i)
-            if (!EqualRect(&a.places[i], &b.places[i])) return false;
-        return a.places.size() == b.places.size() && a.states == b.states;
-    };
-    const LPARAM immersive = reinterpret_cast<LPARAM>("ImmersiveColorSet");
-    mode.Remove();
+    const int glyphX = kAreaLeft + 23 + 3 + 6, glyphY = kPaneAreaTop + 3 + 5;
+    const int dockX = ClientRectOf(frame).right - 2; // right of the pane
+    std::vector<Pixels> light;
     ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_FOLLOW));
-    EXPECT_EQ(QBR_SCHEME_SYSTEM, QBR_GetActiveColorScheme()) << "no value is the light mode";
-    const Shown light = show();
-    EXPECT_EQ(Hex(colors.face), Hex(light.pane.At(2, 1)));
-
-    mode.Set(true);
-    EXPECT_EQ(0u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, reinterpret_cast<LPARAM>("intl")));
-    EXPECT_EQ(QBR_SCHEME_SYSTEM, QBR_GetActiveColorScheme()) << "another setting";
-    EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, immersive));
-    EXPECT_EQ(QBR_SCHEME_DARK, QBR_GetActiveColorScheme());
-    const Shown dark = show();
-    EXPECT_TRUE(samePlaces(light, dark));
-    EXPECT_GT(Luminance(dark.pane.At(kAreaLeft + 3 + 6, kPaneAreaTop + 3 + 5)), 0.7) << "the strip, loaded again";
-    for (const Pixels *p : {&dark.pane, &dark.dock, &dark.floating})
-        EXPECT_LT(Luminance(p->At(p->width - 2, p->height - 3)), 0.05) << Hex(p->At(p->width - 2, p->height - 3));
-
-    mode.Set(false);
+    for (UINT scheme : {QBR_SCHEME_SYSTEM, QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST}) {
+        if (scheme == QBR_SCHEME_DARK) {
+            RegSetValueExA(key, "AppsUseLightTheme", 0, REG_DWORD, reinterpret_cast<const BYTE *>(&dark), sizeof(dark));
+            EXPECT_EQ(0u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, reinterpret_cast<LPARAM>("intl")));
+            EXPECT_EQ(QBR_SCHEME_SYSTEM, QBR_GetActiveColorScheme()) << "another setting";
+            EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SETTINGCHANGE, 0, reinterpret_cast<LPARAM>("ImmersiveColorSet")));
+        }
+        if (scheme == QBR_SCHEME_HIGHCONTRAST) EXPECT_EQ(1u, QBR_SetColorScheme(scheme));
+        EXPECT_EQ(scheme, QBR_GetActiveColorScheme());
+        const std::vector<Pixels> s = show();
+        const Pixels &px = s[0], &dock = s[1], &fl = s[2];
+        const COLORREF face = px.At(2, 1), ink = px.At(glyphX, glyphY);
+        EXPECT_EQ((std::vector<COLORREF>{face, face, face}),
+                  (std::vector<COLORREF>{dock.At(dockX, 1), fl.At(fl.width - 2, fl.height - 2), fl.At(1, 1)}))
+            << "scheme " << scheme << ": the dock, the floating frame and inside its close box";
+        EXPECT_NE(face, dock.At(dockX, dock.height - 1)) << "scheme " << scheme << ": the dock's line";
+        if (scheme == QBR_SCHEME_SYSTEM) {
+            light = s;
+            EXPECT_EQ(kFace, face);
+            continue;
+        }
+        EXPECT_LT(Luminance(face), 0.05) << "scheme " << scheme;
+        EXPECT_GE(Contrast(face, ink), 7.0) << "scheme " << scheme << ": the glyph's ink, of a strip loaded again";
+        EXPECT_LT(Luminance(fl.At(fl.width - 2, 1)), 0.05) << "scheme " << scheme << ": the caption band";
+        if (scheme == QBR_SCHEME_HIGHCONTRAST)
+            EXPECT_EQ((std::vector<COLORREF>{kBlack, kWhite, kWhite, kWhite}),
+                      (std::vector<COLORREF>{face, ink, px.At(kAreaLeft + 5, kPaneAreaTop),
+                                             px.At(kAreaLeft + 4, kPaneAreaTop + 4)}))
+                << "face, ink, the ring around a button and red, in the text colour";
+    }
+    QBR_SetColorScheme(QBR_SCHEME_FOLLOW);
+    RegDeleteValueA(key, "AppsUseLightTheme");
+    RegCloseKey(key);
     EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SYSCOLORCHANGE, 0, 0));
-    const Shown back = show();
-    EXPECT_TRUE(samePlaces(light, back));
-    EXPECT_TRUE(light.pane.colors == back.pane.colors && light.dock.colors == back.dock.colors &&
-                light.floating.colors == back.floating.colors)
-        << "the system's look again, to the pixel";
+    const std::vector<Pixels> back = show();
+    for (size_t i = 0; i < 3; ++i)
+        EXPECT_TRUE(light[i].colors == back[i].colors) << "window " << i << ": the system's look again, to the pixel";
     QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
+    const std::vector<int> keys = {COLOR_BTNTEXT, COLOR_BTNSHADOW, COLOR_BTNFACE, COLOR_BTNHIGHLIGHT};
+    const std::vector<COLORREF> c = {RGB(10, 20, 30), RGB(40, 50, 60), RGB(70, 80, 90), RGB(200, 210, 220)};
+    const std::vector<COLORREF> old = {GetSysColor(keys[0]), GetSysColor(keys[1]), GetSysColor(keys[2]),
+                                       GetSysColor(keys[3])};
+    SetSysColors(4, keys.data(), c.data());
+    RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE);
+    const Pixels before = ReadWindowPixels(pane);
+    EXPECT_EQ(1u, QBR_ColorsChanged(frame, WM_SYSCOLORCHANGE, 0, 0));
+    const Pixels after = ReadWindowPixels(pane);
+    SetSysColors(4, keys.data(), old.data());
+    EXPECT_EQ((std::vector<COLORREF>{c[2], c[2], kFace}),
+              (std::vector<COLORREF>{before.At(2, 1), before.At(before.width - 2, before.height - 2),
+                                     before.At(kAreaLeft + 2, 13)}));
+    for (int b = 0, image = 5; b < 2; ++b, image = 0) { // the strip's keys in both its rows
+        const int x = kAreaLeft + 23 * b + 3, y = kPaneAreaTop + 3;
+        EXPECT_EQ((std::vector<COLORREF>{c[2], c[0], c[1], c[3], kRed, kBlue}),
+                  (std::vector<COLORREF>{after.At(x + 14, y + 14), after.At(x + 5, y + 5), after.At(x + 5, y + 11),
+                                         after.At(x + 5, y + 10), after.At(x + 1, y + 1), after.At(x + image, y + 13)}))
+            << "button " << b;
+    }
 }
+
+} // namespace
