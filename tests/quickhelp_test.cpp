@@ -17,12 +17,11 @@
 
 namespace {
 
-std::map<UINT, std::string> texts; // an id missing here has no text
+std::map<UINT, std::string> texts = {{1, "Q1"}, {2, "Q2"}, {3, "Q3"}, {4, "Save everything you have"}};
 std::vector<UINT> asked;
 int CALLBACK QuickTexts(UINT id, UINT kind, LPSTR buffer, int size) {
-    if (kind != HELP_QUICK) return 0;
-    asked.push_back(id);
-    return texts.count(id) ? lstrlenA(lstrcpynA(buffer, texts[id].c_str(), size)) : 0;
+    if (kind == HELP_QUICK) asked.push_back(id);
+    return kind == HELP_QUICK && texts.count(id) ? lstrlenA(lstrcpynA(buffer, texts[id].c_str(), size)) : 0;
 }
 
 std::function<void()> observe; // sees each state between the slices of a pump
@@ -38,7 +37,7 @@ class QuickHelpTest : public FrameTest {
     void SetUp() override {
         FrameTest::SetUp();
         CurrentClient()->helpTextProc = QuickTexts;
-        texts = {{1, "Q1"}, {2, "Open a file"}, {3, "Q3"}, {4, "Save everything you have"}, {5, "Q5"}};
+        help = CurrentClient()->helpWindow;
         AddButtons(1, 6);
         QBR_SetButtonEnabled(manager, 1, 0);
         const UINT docked[] = {1, 2, 0, 3}, floating[] = {4, 5};
@@ -48,32 +47,26 @@ class QuickHelpTest : public FrameTest {
         Pump();
     }
     void TearDown() override {
-        Leave();
+        PlaceCursor({1, 1});
+        EXPECT_TRUE(PumpUntil([&] { return !IsWindowVisible(help) && helpTimer == 0; })) << "the poll goes on";
         FrameTest::TearDown();
     }
-    bool Shown() { return IsWindowVisible(CurrentClient()->helpWindow) != 0; }
     POINT At(HWND toolbar, int index) { // the middle of an item, or (1, 1) for -1
         RECT r = {1, 1, 1, 1};
         if (index >= 0) GetItemRect(RecordOfWindow(toolbar), UINT(index), &r);
         POINT p = Centre(r);
-        ClientToScreen(ResolveRoleWindow(toolbar, ROLE_ACTIVE), &p);
-        return p;
+        return ClientToScreen(ResolveRoleWindow(toolbar, ROLE_ACTIVE), &p), p;
     }
     // The cursor there, kept from the toolbars on the way (as for an inactive
     // application), then one mouse move, where any wait begins.
-    void Hover(HWND toolbar, POINT p, bool waitForTip = true) {
+    void Hover(HWND toolbar, POINT p) {
         appActive = 0;
         PlaceCursor(p);
         appActive = 1;
         SendMessageA(ResolveRoleWindow(toolbar, ROLE_ACTIVE), WM_MOUSEMOVE, 0, 0);
-        if (waitForTip) ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
-    }
-    void Leave() {
-        PlaceCursor({1, 1});
-        EXPECT_TRUE(PumpUntil([&] { return !Shown() && helpTimer == 0; })) << "the poll goes on";
     }
     RECT Tip(POINT p, const char *text) { // below the cursor: the text's extent and margins
-        WindowDC dc(CurrentClient()->helpWindow);
+        WindowDC dc(help);
         SelectScope font(dc, helpFont);
         TEXTMETRICA tm;
         SIZE extent;
@@ -81,7 +74,7 @@ class QuickHelpTest : public FrameTest {
         GetTextExtentPoint32A(dc, text, lstrlenA(text), &extent);
         return {p.x, p.y + 18, p.x + extent.cx + 8, p.y + 18 + tm.tmHeight - tm.tmInternalLeading + 6};
     }
-    HWND pane = nullptr, other = nullptr;
+    HWND pane = nullptr, other = nullptr, help = nullptr;
 };
 
 // The tip waits for the cursor to rest, then shows below it without taking the
@@ -91,8 +84,7 @@ class QuickHelpTest : public FrameTest {
 TEST_F(QuickHelpTest, TheTipWaitsStandsBelowTheCursorOrFlipsAndThePollStops) {
     QBR_SetCustomize(0); // a right press starts no item drag
     const int cx = GetSystemMetrics(SM_CXSCREEN), cy = GetSystemMetrics(SM_CYSCREEN);
-    const RECT tip = Tip({0, -18}, "Q1");
-    const int w = tip.right, h = tip.bottom;
+    const int w = Tip({0, -18}, "Q1").right, h = Tip({0, -18}, "Q1").bottom;
     const struct {
         POINT cursor;
         RECT tip;
@@ -107,25 +99,23 @@ TEST_F(QuickHelpTest, TheTipWaitsStandsBelowTheCursorOrFlipsAndThePollStops) {
         {{cx - 3, cy - 3}, Rect(cx - 3 - w, cy - 3 - h, cx - 3, cy - 3), 'd'},
         // clang-format on
     };
-    const HWND active = GetActiveWindow();
     for (const auto &c : cases) {
         SCOPED_TRACE(&c - cases);
+        const HWND active = GetActiveWindow();
         const POINT now = At(pane, 0); // the frame moves to put button 1 under the cursor
         const RECT f = WindowRectInParent(frame);
         SetWindowPos(frame, nullptr, f.left + c.cursor.x - now.x, f.top + c.cursor.y - now.y, 0, 0,
                      SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
-        Hover(pane, c.cursor, false);
-        EXPECT_FALSE(Shown());
-        ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
-        EXPECT_EQ(c.tip, WindowRectInParent(CurrentClient()->helpWindow));
+        Hover(pane, c.cursor);
+        EXPECT_FALSE(IsWindowVisible(help));
+        ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
+        EXPECT_EQ(c.tip, WindowRectInParent(help));
         EXPECT_EQ(active, GetActiveWindow());
-        EXPECT_EQ(CurrentClient()->helpWindow, WindowFromPoint(Centre(c.tip))) << "above the frame";
+        EXPECT_EQ(help, WindowFromPoint(Centre(c.tip))) << "above the frame";
         const DWORD press = c.stop == 'l' ? MOUSEEVENTF_LEFTDOWN : c.stop == 'r' ? MOUSEEVENTF_RIGHTDOWN : 0;
-        press ? SendButton(press)
-              : PlaceCursor(c.stop == 'e'   ? At(pane, -1)
-                            : c.stop == 's' ? At(pane, 2)
-                                            : POINT{1, 1});
-        EXPECT_TRUE(PumpUntil([&] { return !Shown() && helpTimer == 0; })) << "the poll stops";
+        const POINT off = c.stop == 'e' ? At(pane, -1) : c.stop == 's' ? At(pane, 2) : POINT{1, 1};
+        press ? SendButton(press) : PlaceCursor(off);
+        EXPECT_TRUE(PumpUntil([&] { return !IsWindowVisible(help) && helpTimer == 0; })) << "the poll stops";
         if (press) SendButton(press * 2); // the release
     }
 }
@@ -134,23 +124,25 @@ TEST_F(QuickHelpTest, TheTipWaitsStandsBelowTheCursorOrFlipsAndThePollStops) {
 // it, and every move while it waits starts the wait again (no pump between
 // the moves, so no tick of an earlier wait runs). An inactive application's
 // toolbars ignore mouse moves, but the poll finds another toolbar's button
-// under the cursor and shows its text at once, never hidden in between. The
-// end of the tip's own manager hides it, and a paint then asks for no text.
+// under the cursor and shows its text at once, never hidden in between. A tip
+// on show takes a colour scheme at once. The end of its manager hides it, and
+// a paint then asks for no text.
 TEST_F(QuickHelpTest, ThePollFollowsTheCursorAndForgetsADestroyedManager) {
     Hover(pane, At(pane, 1));
+    ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
     asked.clear();
     bool hidden = false;
-    observe = [&] { hidden |= !Shown(); };
+    observe = [&] { hidden |= !IsWindowVisible(help); };
     PumpUntil([] { return false; }, 700);
     EXPECT_FALSE(hidden || !asked.empty()) << asked.size() << " requests";
     RECT r;
     GetItemRect(RecordOfWindow(pane), 0, &r);
     QuickHelpMouseMove(pane, r.right, r.bottom);
-    EXPECT_FALSE(Shown());
+    EXPECT_FALSE(IsWindowVisible(help));
     DWORD last = GetTickCount();
     for (int move = 0; move < 3; ++move, last = GetTickCount())
         Sleep(120), QuickHelpMouseMove(pane, r.right, r.bottom);
-    ASSERT_TRUE(PumpUntil([&] { return Shown(); }));
+    ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
     EXPECT_GE(long(GetTickCount() - last), 200L - 16) << "less the step of GetTickCount on Windows";
     appActive = 0;
     const POINT p = At(other, 0);
@@ -160,33 +152,24 @@ TEST_F(QuickHelpTest, ThePollFollowsTheCursorAndForgetsADestroyedManager) {
     appActive = 1;
     observe = nullptr;
     EXPECT_FALSE(hidden);
-    EXPECT_EQ(Tip(p, "Save everything you have"), WindowRectInParent(CurrentClient()->helpWindow));
+    EXPECT_EQ(Tip(p, "Save everything you have"), WindowRectInParent(help));
+    EXPECT_EQ(RGB(255, 255, 128), ReadWindowPixels(help).At(0, 0));
+    ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_DARK));
+    Pump();
+    const Pixels dark = ReadWindowPixels(help);
+    double lightest = 0;
+    for (COLORREF c : dark.colors)
+        lightest = std::max(lightest, Luminance(c));
+    EXPECT_TRUE(Luminance(dark.At(0, 0)) < 0.05 && lightest > 0.55) << "light text on a dark ground";
+    QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
     QBR_DestroyManager(manager);
     manager = nullptr;
-    EXPECT_FALSE(Shown());
+    EXPECT_FALSE(IsWindowVisible(help));
     asked.clear();
-    ShowWindow(CurrentClient()->helpWindow, SW_SHOWNA);
-    UpdateWindow(CurrentClient()->helpWindow);
-    ShowWindow(CurrentClient()->helpWindow, SW_HIDE);
+    ShowWindow(help, SW_SHOWNA);
+    UpdateWindow(help);
+    ShowWindow(help, SW_HIDE);
     EXPECT_TRUE(asked.empty()) << "paint asked for the text of a freed item";
-}
-
-// Yellow under the system's scheme; a tip on show takes the dark one at once.
-TEST_F(QuickHelpTest, AShownTipTakesTheColourSchemeLive) {
-    Hover(pane, At(pane, 1));
-    for (UINT scheme : {QBR_SCHEME_SYSTEM, QBR_SCHEME_DARK, QBR_SCHEME_SYSTEM}) {
-        ASSERT_EQ(1u, QBR_SetColorScheme(scheme));
-        Pump();
-        const Pixels px = ReadWindowPixels(CurrentClient()->helpWindow);
-        double lightest = 0;
-        for (COLORREF c : px.colors)
-            lightest = std::max(lightest, Luminance(c));
-        if (scheme == QBR_SCHEME_DARK)
-            EXPECT_GT(lightest, 0.55) << "light text";
-        else
-            EXPECT_EQ(RGB(255, 255, 128), px.At(0, 0));
-        EXPECT_EQ(scheme == QBR_SCHEME_DARK, Luminance(px.At(0, 0)) < 0.05) << "a dark ground";
-    }
 }
 
 } // namespace
