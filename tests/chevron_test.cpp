@@ -1,6 +1,5 @@
-// The chevron of a docked toolbar cut off at the edge of its host's usable
-// area: where it stands and what it cuts off, its menu by a real click and the
-// click of the chosen button. (The keyboard and a reader: demo_narrow_e2e.)
+// The chevron of a toolbar cut off at the host's usable area: where it stands, what it cuts off, its menu by a real
+// click and the click of the chosen button (the keyboard and a screen reader: demo_narrow_e2e).
 #include <string>
 #include <vector>
 
@@ -14,8 +13,7 @@ namespace {
 
 constexpr int kChevronSize = 13; // across a row, at 96 DPI
 
-// Steps that, once the menu is open, describe it and its last entry's
-// submenu, then click `choice` (Q8 in the submenu) or close it.
+// Steps describing the menu and its last entry's submenu, then clicking `choice` (Q8 in the submenu) or closing it.
 void MenuStep(std::string *seen, const std::string &choice) {
     ModalSteps::Until([=] {
         HMENU menu = OpenMenu(), sub = menu ? GetSubMenu(menu, GetMenuItemCount(menu) - 1) : nullptr;
@@ -72,9 +70,8 @@ class ChevronTest : public FrameTest {
     ToolbarRecord *record = nullptr;
 };
 
-// Across a row the chevron stands at the edge, in a side dock across the
-// column above the bottom dock; items under or past it are cut off. It goes
-// when the frame grows and leaves no trace; a floating toolbar is never cut.
+// At the edge across a row, or across a side column above the bottom dock, over the items it cuts off; it goes when
+// the frame grows and leaves no trace; a floating toolbar is never cut off.
 TEST_F(ChevronTest, StandsAtTheEdgeOverTheCutOffItemsAndGoesWhenTheFrameGrows) {
     const Pixels whole = ReadWindowPixels(pane);
     const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8};
@@ -92,7 +89,6 @@ TEST_F(ChevronTest, StandsAtTheEdgeOverTheCutOffItemsAndGoesWhenTheFrameGrows) {
     } cases[] = {
         // clang-format off
         {pane, x2, 0, "00111111", Rect(x2 - k, 0, x2, h)},
-        {pane, x2 + 1, 0, "00111111", Rect(x2 + 1 - k, 0, x2 + 1, h)}, // the separator reaches under it
         {pane, x8 - 1, 0, "00000001", Rect(x8 - 1 - k, 0, x8 - 1, h)},
         {pane, x8, 0, "00000000", {}}, // only the margin is cut: no chevron
         {column, 0, y3, "00011111", Rect(0, third.bottom, w, third.bottom + k)},
@@ -117,21 +113,15 @@ TEST_F(ChevronTest, StandsAtTheEdgeOverTheCutOffItemsAndGoesWhenTheFrameGrows) {
     EXPECT_EQ(0u, ChevronRect(record, &r)) << "a floating toolbar is never cut off";
 }
 
-// A real click on the chevron opens the menu of the cut-off buttons in item
-// order (separators as separators, none first) with their quick help texts
-// (images: dpi_test), checked when on or mixed, greyed when disabled; a toolbar
-// wholly past the edge behind it ("Far", with no chevron of its own) as a
-// submenu under its title; a chevron carries it even when nothing else is cut
-// off. The chosen button gets a completed click; a menu closed with no choice
-// makes none.
+// A real click on the chevron opens the cut-off buttons in order (separators as such, none first) by their quick help
+// texts, checked when on or mixed, greyed when disabled, then a toolbar wholly past the edge ("Far", no chevron of its
+// own, carried even when nothing else is cut off) as a submenu. A choice is a completed click; no choice, none.
 TEST_F(ChevronTest, ItsMenuOffersTheCutOffButtonsAndClicksTheChosenOne) {
-    const UINT farIds[] = {7, 8};
-    HWND farPane = QBR_CreateToolbar("Far", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, farIds, 2);
+    HWND farPane =
+        QBR_CreateToolbar("Far", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, std::vector<UINT>{7, 8}.data(), 2);
     Pump();
     ASSERT_EQ(WindowRectInParent(pane).top, WindowRectInParent(farPane).top) << "one row";
-    POINT farStart = {0, 0};
-    MapWindowPoints(farPane, pane, &farStart, 1);
-    CutAt(farStart.x);
+    CutAt(WindowRectInParent(farPane).left - WindowRectInParent(pane).left); // where Far's client area starts
     RECT r;
     EXPECT_EQ(0u, ChevronRect(RecordOfWindow(farPane), &r));
     EXPECT_EQ(1u, ChevronRect(record, &r)) << "a chevron that carries Far alone";

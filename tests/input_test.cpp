@@ -1,6 +1,4 @@
-// The left mouse button on real toolbars, with the real cursor: each message
-// goes where the window system would send it (border sizing goes through the
-// platform's own input queue). What the host heard, looks and places.
+// The left button on real toolbars with the real cursor: what the host hears, looks and places.
 #include <algorithm>
 #include <functional>
 #include <memory>
@@ -26,8 +24,7 @@ std::vector<Heard> Clicked(UINT id, bool acts = true) {
     return id ? out : std::vector<Heard>{};
 }
 
-// The host notes whether a press still runs at every message the library
-// sends it, and can look at the screen when it hears a press.
+// The host notes at each message whether a press still runs, and can look at the screen at a press.
 std::vector<bool> busyHeard;
 std::function<void()> atPress;
 WNDPROC recordingProc = nullptr;
@@ -57,19 +54,13 @@ class InputTest : public FrameTest {
             QBR_CreateToolbar("T", flags, 300, 250, 0, 0, QBR_GetDock(manager, DOCK_TOP), ids.data(), UINT(ids.size()));
         return Fresh(), pane;
     }
-    static void Fresh() { // the queue drained, nothing heard yet
-        Pump();
-        ClearFrameLog();
-        busyHeard.clear();
-    }
+    static void Fresh() { Pump(), ClearFrameLog(), busyHeard.clear(); } // the queue drained, nothing heard yet
     static HWND Active(HWND pane) { return ResolveRoleWindow(pane, ROLE_ACTIVE); }
     static RECT ItemRect(HWND pane, UINT index) {
         RECT r = {};
         return GetItemRect(RecordOfWindow(pane), index, &r), r;
     }
-    // Steps d, m, u, 2 (left down, move, up, a double click as the window
-    // system sends it) at 1, 2 (a button), e (the empty space), c (a floating
-    // frame's caption) or b (its close box).
+    // d, m, u, 2 (down, move, up, double click) at a button 1.., e (empty space), c (caption) or b (close box).
     static void Mouse(char step, HWND pane, char where) {
         HWND floating = ResolveRoleWindow(pane, ROLE_FLOATING);
         const RECT c = ClientRectOf(Active(pane));
@@ -89,9 +80,8 @@ class InputTest : public FrameTest {
     }
 };
 
-// A completed press acts by the button's behaviour; the host hears the press
-// while the mouse is held, the release and the command once all is clear; a
-// notification carries the id's low 16 bits, the command the whole id.
+// A completed press acts by the button's behaviour; the host hears the press while the mouse is held, then the
+// release and the command; a notification carries the id's low 16 bits, the command the whole id.
 TEST_F(InputTest, ACompletedPressActsByBehaviour) {
     const UINT cases[][5] = {// behaviour, state and pressed before, after
                              {BTN_PUSH, 0, 0, 0, 0},  {BTN_CHECK, 1, 0, 0, 0}, {BTN_CHECK, 2, 0, 1, 0},
@@ -115,14 +105,10 @@ TEST_F(InputTest, ACompletedPressActsByBehaviour) {
     }
 }
 
-// Scripts of the steps above and i, a (the application inactive, active
-// again). `looks`, when given, says after each step whether button 1 looks
-// pressed; button 2 is a disabled check button, tracked and reported, never
-// pressed-looking, never acting. The host hears the press and release of `id`
-// and, when it acts, its command; when it hears the press the pressed look is
-// on the screen already. A double click on the empty space or the caption
-// docks or floats a toolbar whose place is not locked; the close box tracks
-// like a button and hides the toolbar.
+// Scripts of mouse steps and i, a (application inactive, active). `looks`: whether button 1 looks pressed after
+// each step (the look is on the screen when the host hears the press); button 2, a disabled check button, is
+// reported but never looks pressed or acts. A double click on the empty space or the caption docks or floats a
+// toolbar whose place is not locked; the close box tracks like a button and hides it.
 TEST_F(InputTest, ScriptsOfPressesMovesAndDoubleClicks) {
     QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
     QBR_SetButtonEnabled(manager, 2, 0);
@@ -157,10 +143,8 @@ TEST_F(InputTest, ScriptsOfPressesMovesAndDoubleClicks) {
         for (size_t i = 0; 3 * i < std::string(s.script).size(); ++i) {
             SCOPED_TRACE(std::string(s.script) + ", step " + std::to_string(i));
             const char *step = s.script + 3 * i;
-            if (step[0] == 'i' || step[0] == 'a')
-                EXPECT_EQ(0, SendMessageA(pane, WM_ACTIVATEAPP, step[0] == 'a', 0));
-            else
-                Mouse(step[0], pane, step[1]);
+            const bool app = step[0] == 'i' || step[0] == 'a'; // the application inactive, active again
+            app ? void(SendMessageA(pane, WM_ACTIVATEAPP, step[0] == 'a', 0)) : Mouse(step[0], pane, step[1]);
             if (!*s.looks) continue;
             if (i == 0 && step[1] == '1') EXPECT_TRUE(heard == down1) << "the host heard the press before the look";
             EXPECT_EQ(s.looks[i] == '1', QBR_IsButtonPressed(manager, 1) != 0);
@@ -175,8 +159,7 @@ TEST_F(InputTest, ScriptsOfPressesMovesAndDoubleClicks) {
     }
 }
 
-// Steps that move the real cursor through the platform's input queue, again
-// until it has stayed for a few ticks (a late pointer event can put it back).
+// Steps moving the real cursor by input, again until it stays (a late pointer event can put it back).
 void MoveStep(POINT p) {
     auto there = std::make_shared<int>(0);
     ModalSteps::Until([p, there] {
@@ -190,11 +173,8 @@ void MoveStep(POINT p) {
     });
 }
 
-// With the contents shown while sizing, the window system resizes a frame at
-// every mouse move of a border drag, in its own sizing loop. However many
-// steps, the frame never gets smaller than one button, and when the user lets
-// go it is exactly one refit of the chosen width (the border moved by the
-// cursor's whole travel, stopped at the other one).
+// The platform's sizing loop resizes a frame at every move of a border drag: however many steps, the frame is never
+// smaller than one button, and at the release it is one refit of the width chosen (stopped at the other border).
 TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
     const int cases[][3] = {{0, 8, -12}, {1, 6, -15}, {0, 12, -20}, {0, 9, 30}}; // left border?, steps, travel
     HWND pane = Make({1, 2, 3, 4, 5, 6, 7, 8}, V | F), floating = ResolveRoleWindow(pane, ROLE_FLOATING);

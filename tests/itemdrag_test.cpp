@@ -4,7 +4,6 @@
 #include "core/core.h"
 #include "harness.h"
 #include "input/input.h"
-#include "modal.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
 
@@ -25,8 +24,7 @@ class ItemDragTest : public FrameTest {
         HWND pane = QBR_CreateToolbar("T", flags, 700, y, 0, 0, top, ids.data(), UINT(ids.size()));
         return Pump(), pane;
     }
-    // The middle of item `id` moved by dx, E past the last item (the middle
-    // of an empty toolbar), or, on no toolbar, the frame's client area.
+    // Item `id` moved by dx, E past the last item, or with no toolbar the frame.
     POINT At(HWND pane, UINT id, int dx = 0) {
         POINT p = {300, 300};
         if (!pane) return ClientToScreen(frame, &p), p;
@@ -34,18 +32,15 @@ class ItemDragTest : public FrameTest {
         UINT index = PointerListCount(record->items) - 1;
         if (id != E) IndexOfItem(record, ItemFindById(manager->items, id), &index);
         RECT r = {};
-        const bool item = GetItemRect(record, index, &r);
+        GetItemRect(record, index, &r);
         p = {id == E ? r.right + 3 : (r.left + r.right) / 2 + dx, (r.top + r.bottom) / 2};
-        if (!item) p = Centre(ClientRectOf(ResolveRoleWindow(pane, ROLE_ACTIVE)));
         return ClientToScreen(ResolveRoleWindow(pane, ROLE_ACTIVE), &p), p;
     }
     HWND top = nullptr;
 };
 
-// A press on item `from` of toolbar A (a move), with Ctrl (a copy) at the
-// press or the release; the release on item `to` of A or B (moved by dx: a
-// nudge of more than 2 pixels on the item's own place is a separator) or off
-// every toolbar ('-').
+// A press on item `from` of toolbar A, Ctrl at the press or the release, the release on item `to` of A or B or off
+// every toolbar ('-'), moved by dx (a nudge of more than 2 pixels on its own place makes a separator).
 const Ids A0 = {1, 2, 3, 4, 5}, B0 = {7, 8, 9};
 const struct Gesture {
     const char *name;
@@ -53,35 +48,25 @@ const struct Gesture {
     UINT aFlags;
     Ids b;
     UINT bFlags, from, keysDown, keysUp;
-    char toolbar;
-    UINT to;
-    int dx;
+    int toolbar, to, dx;
     Ids wantA, wantB;
 } kGestures[] = {
     // clang-format off
     {"move right",             A0, D, B0, D, 1, 0, 0, 'A', 4, 0, {2, 3, 1, 4, 5}, B0},
     {"onto right neighbour",   A0, D, B0, D, 2, 0, 0, 'A', 3, 0, A0, B0},
     {"clean-up, then the end", {1, S, 2, 3}, D, B0, D, 1, 0, 0, 'A', E, 0, {2, 3, 1}, B0},
-    {"copy in own toolbar",    A0, D, B0, D, 1, kCtrl, 0, 'A', 4, 0, A0, B0},
     {"move to B",              A0, D, B0, D, 2, 0, 0, 'B', 8, 0, {1, 3, 4, 5}, {7, 2, 8, 9}},
     {"control at the press",   A0, D, B0, D, 2, kCtrl, 0, 'B', 8, 0, A0, {7, 2, 8, 9}},
     {"control at the release", A0, D, B0, D, 2, 0, kCtrl, 'B', 8, 0, {1, 3, 4, 5}, {7, 2, 8, 9}},
-    {"B has it: leaves A",     A0, D, {7, 2, 9}, D, 2, 0, 0, 'B', 9, 0, {1, 3, 4, 5}, {7, 2, 9}},
     {"locked source copies",   A0, D | L, B0, D, 2, 0, 0, 'B', 8, 0, A0, {7, 2, 8, 9}},
     {"locked target",          A0, D, B0, D | L, 2, 0, 0, 'B', 8, 0, A0, B0},
     {"separators cleaned",     {1, S, 2, S, 3}, D, B0, D, 2, 0, 0, 'B', 8, 0, {1, S, 3}, {7, 2, 8, 9}},
-    {"last one into empty",    {1}, D, {}, D, 1, 0, 0, 'B', E, 0, {}, {1}},
     {"off removes",            A0, D, B0, D, 2, 0, 0, '-', 0, 0, {1, 3, 4, 5}, B0},
-    {"off with control",       A0, D, B0, D, 2, kCtrl, 0, '-', 0, 0, A0, B0},
     {"off from locked",        A0, D | L, B0, D, 2, 0, 0, '-', 0, 0, A0, B0},
     {"nudge right",            A0, D, B0, D, 2, 0, 0, 'A', 2, 3, {1, S, 2, 3, 4, 5}, B0},
-    {"nudge right by 2",       A0, D, B0, D, 2, 0, 0, 'A', 2, 2, A0, B0},
     {"nudge left",             A0, D, B0, D, 2, 0, 0, 'A', 2, -3, {1, 2, S, 3, 4, 5}, B0},
     {"left takes sep before",  {1, S, 2, 3}, D, B0, D, 2, 0, 0, 'A', 2, -3, {1, 2, 3}, B0},
-    {"onto the sep before",    {1, S, 2, 3}, D, B0, D, 2, 0, 0, 'A', S, 0, {1, 2, 3}, B0},
-    {"first, right",           A0, D, B0, D, 1, 0, 0, 'A', 1, 3, A0, B0},
     {"nudge floating",         A0, F, B0, D, 2, 0, 0, 'A', 2, 3, {1, S, 2, 3, 4, 5}, B0},
-    {"floating, no seps",      A0, F | kNoSeps, B0, D, 2, 0, 0, 'A', 2, 3, A0, B0},
     {"docked, no float seps",  A0, D | kNoSeps, B0, D, 2, 0, 0, 'A', 2, 3, {1, S, 2, 3, 4, 5}, B0},
     // clang-format on
 };
