@@ -53,7 +53,7 @@ const struct Gesture {
 } kGestures[] = {
     // clang-format off
     {"move right",             A0, D, B0, D, 1, 0, 0, 'A', 4, 0, {2, 3, 1, 4, 5}, B0},
-    {"onto right neighbour",   A0, D, B0, D, 2, 0, 0, 'A', 3, 0, A0, B0},
+    {"first onto the second",  A0, D, B0, D, 1, 0, 0, 'A', 2, 0, A0, B0},
     {"clean-up, then the end", {1, S, 2, 3}, D, B0, D, 1, 0, 0, 'A', E, 0, {2, 3, 1}, B0},
     {"move to B",              A0, D, B0, D, 2, 0, 0, 'B', 8, 0, {1, 3, 4, 5}, {7, 2, 8, 9}},
     {"control at the press",   A0, D, B0, D, 2, kCtrl, 0, 'B', 8, 0, A0, {7, 2, 8, 9}},
