@@ -95,7 +95,6 @@ TEST_F(QuickHelpTest, TheTipWaitsStandsBelowTheCursorOrFlipsAndThePollStops) {
         ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
         EXPECT_EQ(c.tip, WindowRectInParent(help));
         EXPECT_EQ(active, GetActiveWindow());
-        EXPECT_EQ(help, WindowFromPoint(Centre(c.tip))) << "above the frame";
         const DWORD press = c.stop == 'l' ? MOUSEEVENTF_LEFTDOWN : c.stop == 'r' ? MOUSEEVENTF_RIGHTDOWN : 0;
         const POINT off = c.stop == 'e' ? At(pane, -1) : c.stop == 's' ? At(pane, 2) : POINT{1, 1};
         press ? SendButton(press) : PlaceCursor(off);
@@ -113,13 +112,14 @@ TEST_F(QuickHelpTest, ThePollFollowsTheCursorAndTheTipTakesTheScheme) {
     asked.clear();
     PumpFor(700);
     EXPECT_TRUE(IsWindowVisible(help) && asked.empty()) << asked.size() << " requests";
-    RECT r;
-    GetItemRect(RecordOfWindow(pane), 0, &r);
-    QuickHelpMouseMove(pane, r.right, r.bottom);
+    RECT r0, r1; // the moves name a point of button 1, then of button 2 under the cursor
+    GetItemRect(RecordOfWindow(pane), 0, &r0);
+    GetItemRect(RecordOfWindow(pane), 1, &r1);
+    QuickHelpMouseMove(pane, r0.right, r0.bottom);
     EXPECT_FALSE(IsWindowVisible(help));
     DWORD last = GetTickCount();
     for (int move = 0; move < 3; ++move, last = GetTickCount())
-        Sleep(120), QuickHelpMouseMove(pane, r.right, r.bottom);
+        Sleep(120), QuickHelpMouseMove(pane, r1.left + 1, r1.top + 1);
     ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
     EXPECT_GE(long(GetTickCount() - last), 200L - 16) << "less the step of GetTickCount on Windows";
     ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_DARK));
