@@ -119,7 +119,7 @@ TEST_F(QuickHelpTest, ThePollFollowsTheCursorAndTheTipTakesTheScheme) {
     EXPECT_FALSE(IsWindowVisible(help));
     DWORD last = GetTickCount();
     for (int move = 0; move < 3; ++move, last = GetTickCount())
-        Sleep(120), QuickHelpMouseMove(pane, r1.left + 1, r1.top + 1);
+        Sleep(120), QuickHelpMouseMove(pane, Centre(r1).x, Centre(r1).y);
     ASSERT_TRUE(PumpUntil([&] { return IsWindowVisible(help); }));
     EXPECT_GE(long(GetTickCount() - last), 200L - 16) << "less the step of GetTickCount on Windows";
     ASSERT_EQ(1u, QBR_SetColorScheme(QBR_SCHEME_DARK));
