@@ -106,8 +106,8 @@ TEST_F(ChevronTest, StandsAtTheEdgeOverTheCutOffItemsAndGoesWhenTheFrameGrows) {
         EXPECT_EQ(UINT(c.cut[7] - '0'), ChevronRect(RecordOfWindow(c.toolbar), &r));
         EXPECT_EQ(c.chevron, r);
     }
-    QBR_DestroyToolbar(column);
     EXPECT_EQ(whole.colors, ReadWindowPixels(pane).colors) << "the chevron left a trace";
+    QBR_DestroyToolbar(column);
     CutAt(x2);
     QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_FLOATING);
     EXPECT_EQ(0u, ChevronRect(record, &r)) << "a floating toolbar is never cut off";
