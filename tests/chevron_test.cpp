@@ -1,5 +1,9 @@
 // The chevron of a toolbar cut off at the host's usable area: where it stands, what it cuts off, its menu by a real
-// click and the click of the chosen button (the keyboard and a screen reader: demo_narrow_e2e).
+// click and the click of the chosen button, and what a screen reader finds (the keyboard: dpi192_demo_keyboard_e2e).
+#include <ole2.h>
+
+#include <oleacc.h>
+
 #include <string>
 #include <vector>
 
@@ -10,7 +14,6 @@
 #include "toolbar/toolbar.h"
 
 namespace {
-
 constexpr int kChevronSize = 13; // across a row, at 96 DPI
 
 // Steps describing the menu and its last entry's submenu, then clicking `choice` (Q8 in the submenu) or closing it.
@@ -120,7 +123,6 @@ TEST_F(ChevronTest, ItsMenuOffersTheCutOffButtonsAndClicksTheChosenOne) {
     HWND farPane =
         QBR_CreateToolbar("Far", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, std::vector<UINT>{7, 8}.data(), 2);
     Pump();
-    ASSERT_EQ(WindowRectInParent(pane).top, WindowRectInParent(farPane).top) << "one row";
     CutAt(WindowRectInParent(farPane).left - WindowRectInParent(pane).left); // where Far's client area starts
     RECT r;
     EXPECT_EQ(0u, ChevronRect(RecordOfWindow(farPane), &r));
@@ -144,6 +146,17 @@ TEST_F(ChevronTest, ItsMenuOffersTheCutOffButtonsAndClicksTheChosenOne) {
         QBR_SetButtonState(manager, 3, 0);
         ClearFrameLog();
     }
+    IAccessible *object = nullptr; // a screen reader finds it as the child after the items, a menu button that opens
+    VARIANT child = {}, role = {};
+    BSTR action = nullptr;
+    LONG count = 0;
+    ASSERT_EQ(S_OK, AccessibleObjectFromPoint(Centre(ChevronOnScreen()), &object, &child));
+    object->get_accChildCount(&count);
+    object->get_accRole(child, &role);
+    object->get_accDefaultAction(child, &action);
+    EXPECT_EQ(std::vector<LONG>({9, 9, ROLE_SYSTEM_BUTTONMENU}), std::vector<LONG>({child.lVal, count, role.lVal}));
+    EXPECT_EQ(std::wstring(L"Open"), action ? action : L"");
+    SysFreeString(action);
+    object->Release();
 }
-
 } // namespace

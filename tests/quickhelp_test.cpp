@@ -12,7 +12,6 @@
 #include "toolbar/toolbar.h"
 
 namespace {
-
 std::vector<UINT> asked; // the quick help texts asked for
 int CALLBACK QuickTexts(UINT id, UINT kind, LPSTR buffer, int size) {
     if (kind == HELP_QUICK) asked.push_back(id);
@@ -25,7 +24,6 @@ bool PumpUntil(const std::function<bool()> &done) {
     return done();
 }
 
-// A docked toolbar: 1 (disabled), 2, |, 3.
 class QuickHelpTest : public FrameTest {
   protected:
     void SetUp() override {
@@ -131,5 +129,4 @@ TEST_F(QuickHelpTest, ThePollFollowsTheCursorAndTheTipTakesTheScheme) {
     EXPECT_TRUE(Luminance(dark.At(0, 0)) < 0.05 && lightest > 0.55) << "light text on a dark ground";
     QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
 }
-
 } // namespace
