@@ -43,6 +43,13 @@ keys Down Down Down Down Return # Left, Centered, Right, Justified
 settle
 checked Justified || fail "Justify was not pressed from the chevron's menu: $(item Style Justified)"
 checked Left && fail "Left stayed checked beside Justify"
+keys F6 Tab End # the keyboard: Style's last stop is its chevron
+[ "$(reader focus "$main")" = "Style: More buttons" ] || fail "End did not reach the chevron: $(reader focus "$main")"
+keys Return
+keys Down Return
+settle
+checked Left || fail "Left was not pressed from the keyboard's chevron menu: $(item Style Left)"
+keys Escape
 ldrag $((nr - 2)) $((nb - 60)) $((mr - 2)) $((nb - 60))
 [ -z "$(item Style "More buttons")" ] || fail "the chevron stayed after the window grew"
 shot narrow-2-grown
