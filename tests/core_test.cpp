@@ -1,62 +1,32 @@
-// The bare client: token readers, a client's start and defaults, the module
-// instance, radio ranges, the C header, and the library's own leak count.
+// The bare client: token readers, radio ranges, the C header, and a client's
+// life: its defaults, the module instance, and every block and object back.
 #include <cstring>
 #include <string>
+#include <tuple>
 
 #include "core/core.h"
 #include "harness.h"
-#include "quaybar.h"
 
 extern "C" int CApiRoundTrip(void);
+TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CApiRoundTrip()); }
 
 // White space is exactly space, tab, line feed, vertical tab, form feed and
 // carriage return; one sign at most; digits '0' to '9'; 32-bit wrapping.
 TEST(TokenTest, ReadersConsumeOneTokenEach) {
-    const struct {
-        const char *input;
-        int value;
-        const char *rest;
-    } cases[] = {
+    const std::tuple<const char *, int, const char *> cases[] = {
         {"12,34", 12, "34"}, {"", 0, ""},         {"-7x,9", -7, "9"},       {" \t+5,1", 5, "1"},
         {"abc,2", 0, "2"},   {",,3", 0, ",3"},    {"4294967297,0", 1, "0"}, {"\v7,1", 7, "1"},
         {"\f8,1", 8, "1"},   {"\r\n9,1", 9, "1"}, {"\0015,2", 0, "2"},      {"3:4,5", 3, "5"},
         {"--5,6", 0, "6"},   {"+-5,6", 0, "6"},   {"09,1", 9, "1"},
     };
-    for (const auto &k : cases) {
+    for (const auto &[input, value, rest] : cases) {
         char buffer[64];
-        std::strcpy(buffer, k.input);
-        EXPECT_EQ(k.value, ReadTokenInt(buffer)) << static_cast<int>(k.input[0]) << " " << k.input;
-        EXPECT_STREQ(k.rest, buffer) << k.input;
+        EXPECT_EQ(value, ReadTokenInt(std::strcpy(buffer, input))) << static_cast<int>(input[0]) << " " << input;
+        EXPECT_STREQ(rest, buffer) << input;
     }
     char two[] = "Standard,Style", out[32];
     ReadTokenText(two, out);
     EXPECT_EQ(std::string("Standard Style"), std::string(out) + " " + two);
-}
-
-// A start gives quick help and customising on, button text off, and empty
-// texts without a callback; a manager adopts its frame's instance as the
-// module instance only when the host set none.
-TEST(ClientStartTest, DefaultsAndTheModuleInstance) {
-    moduleInstance = GetModuleHandleA(nullptr);
-    ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), nullptr));
-    EXPECT_EQ(1u, QBR_GetQuickHelp());
-    EXPECT_EQ(1u, QBR_GetCustomize());
-    EXPECT_EQ(0u, QBR_GetButtonText());
-    char buffer[16] = "untouched";
-    EXPECT_EQ(0, RequestHelpText(101, HELP_QUICK, buffer, kHelpTextSize));
-    EXPECT_STREQ("", buffer);
-    HWND frame = CreateRecordingFrame();
-    const HINSTANCE mine = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(frame, GWLP_HINSTANCE));
-    const HINSTANCE other = GetModuleHandleA("kernel32.dll");
-    for (HINSTANCE before : {HINSTANCE(nullptr), other}) {
-        moduleInstance = before;
-        QBR_DestroyManager(QBR_CreateManager(frame));
-        EXPECT_EQ(before ? other : mine, moduleInstance);
-    }
-    DestroyWindow(frame);
-    QBR_Terminate();
-    EXPECT_EQ(nullptr, CurrentClient());
-    moduleInstance = GetModuleHandleA(nullptr);
 }
 
 // A radio range sets onId and clears the rest up to `last`, stopping at the
@@ -66,47 +36,56 @@ TEST_F(ClientTest, RadioRangesReachTheirLastIdAndStopAtAGap) {
     const UINT ids[] = {201, 202, 203, 204, 205, 207, 208};
     QBR_AddButtons(manager, ids, 7);
     QBR_SetButtonState(manager, 208, 1);
-    const struct {
-        UINT first, last, on, result;
-        const char *states; // of 201..205, 207, 208 after the call
-    } cases[] = {{201, 205, 205, 1, "0000101"}, {201, 205, 202, 1, "0100001"}, {212, 201, 204, 1, "0100001"},
-                 {203, 203, 203, 1, "0110001"}, {201, 208, 204, 0, "0001001"}, {201, 205, 999, 1, "0000001"}};
-    for (const auto &k : cases) {
-        EXPECT_EQ(k.result, QBR_SetRadioRange(manager, k.first, k.last, k.on)) << k.first << ".." << k.last;
-        std::string states;
+    const std::tuple<UINT, UINT, UINT, UINT, const char *> cases[] = {
+        // states of 201..205, 207, 208
+        {201, 205, 205, 1, "0000101"}, {201, 205, 202, 1, "0100001"}, {212, 201, 204, 1, "0100001"},
+        {203, 203, 203, 1, "0110001"}, {201, 208, 204, 0, "0001001"}, {201, 205, 999, 1, "0000001"}};
+    for (const auto &[first, last, on, result, states] : cases) {
+        EXPECT_EQ(result, QBR_SetRadioRange(manager, first, last, on)) << first << ".." << last;
+        std::string seen;
         for (UINT id : ids)
-            states += static_cast<char>('0' + QBR_GetButtonState(manager, id));
-        EXPECT_EQ(k.states, states) << k.first << ".." << k.last << " on " << k.on;
+            seen += static_cast<char>('0' + QBR_GetButtonState(manager, id));
+        EXPECT_EQ(states, seen) << first << ".." << last << " on " << on;
     }
     QBR_DestroyManager(manager);
 }
 
-TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CApiRoundTrip()); }
-
-// The whole library, round after round: clients, managers, docks, docked and
-// floating toolbars, button text, edits, give back every block and GDI object.
-TEST(LeakTest, TheLibraryGivesBackEveryBlockAndObject) {
+// Twice: a start gives quick help and customising on, button text off, and
+// without a text callback empty texts; a manager takes its frame's instance
+// as the module instance only when the host set none; and managers, docks,
+// docked and floating toolbars, button text and edits give every block and
+// GDI object back.
+TEST(ClientLifeTest, DefaultsTheModuleInstanceAndEverythingBack) {
     LONG blocks = 0, objects = 0, blocksAfter = 0, objectsAfter = 0;
     QBR_GetLiveCounts(&blocks, &objects);
+    const HINSTANCE program = GetModuleHandleA(nullptr), other = GetModuleHandleA("kernel32.dll");
     for (int round = 0; round < 2; ++round) {
-        moduleInstance = GetModuleHandleA(nullptr);
-        ASSERT_EQ(1u, QBR_Initialize(GetModuleHandleA(nullptr), TestHelpText));
+        moduleInstance = program;
+        ASSERT_EQ(1u, QBR_Initialize(program, round ? nullptr : TestHelpText));
+        EXPECT_EQ(1u, QBR_GetQuickHelp());
+        EXPECT_EQ(1u, QBR_GetCustomize());
+        EXPECT_EQ(0u, QBR_GetButtonText());
+        char text[16] = "untouched";
+        RequestHelpText(3, HELP_QUICK, text, kHelpTextSize);
+        EXPECT_STREQ(round ? "" : "Q3", text);
         HWND frame = CreateRecordingFrame();
+        moduleInstance = round ? other : nullptr;
         ToolbarManager *manager = QBR_CreateManager(frame);
+        EXPECT_EQ(round ? other : program, moduleInstance);
+        moduleInstance = program;
         const UINT ids[] = {1, 2, 3, 0, 4};
         QBR_AddButtons(manager, ids, 3);
         QBR_SetCategories(manager, ids, 3);
         QBR_SetCategories(manager, ids, 2); // a later call replaces the first
         QBR_SetImageStrip(manager, "TESTSTRIP");
         QBR_SetImageStrip(manager, "TESTSTRIP");
-        HWND top = QBR_CreateDock(manager, frame, DOCK_TOP);
-        HWND left = QBR_CreateDock(manager, frame, DOCK_LEFT);
-        HWND a = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 5);
+        HWND top = QBR_CreateDock(manager, frame, DOCK_TOP), left = QBR_CreateDock(manager, frame, DOCK_LEFT);
+        HWND docked = QBR_CreateToolbar("A", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 5);
         QBR_CreateToolbar("B", TBF_VISIBLE | TBF_FLOATING, 50, 50, 0, 0, left, ids, 4);
         QBR_SetButtonText(1);
         Pump();
         QBR_SetButtonText(0);
-        QBR_DestroyToolbar(a);
+        QBR_DestroyToolbar(docked);
         QBR_DestroyManager(manager);
         DestroyWindow(frame);
         Pump();
