@@ -1,5 +1,5 @@
-// The bare client: token readers, radio ranges, the C header, and a client's
-// life: its defaults, the module instance, and every block and object back.
+// The bare client: token readers, the C header, and a client's life: its
+// defaults, the module instance, and every block and object given back.
 #include <cstring>
 #include <string>
 #include <tuple>
@@ -27,27 +27,6 @@ TEST(TokenTest, ReadersConsumeOneTokenEach) {
     char two[] = "Standard,Style", out[32];
     ReadTokenText(two, out);
     EXPECT_EQ(std::string("Standard Style"), std::string(out) + " " + two);
-}
-
-// A radio range sets onId and clears the rest up to `last`, stopping at the
-// first id the catalog lacks (and answering 0); an onId outside clears all.
-TEST_F(ClientTest, RadioRangesReachTheirLastIdAndStopAtAGap) {
-    ToolbarManager *manager = QBR_CreateManager(nullptr);
-    const UINT ids[] = {201, 202, 203, 204, 205, 207, 208};
-    QBR_AddButtons(manager, ids, 7);
-    QBR_SetButtonState(manager, 208, 1);
-    const std::tuple<UINT, UINT, UINT, UINT, const char *> cases[] = {
-        // states of 201..205, 207, 208
-        {201, 205, 205, 1, "0000101"}, {201, 205, 202, 1, "0100001"}, {212, 201, 204, 1, "0100001"},
-        {203, 203, 203, 1, "0110001"}, {201, 208, 204, 0, "0001001"}, {201, 205, 999, 1, "0000001"}};
-    for (const auto &[first, last, on, result, states] : cases) {
-        EXPECT_EQ(result, QBR_SetRadioRange(manager, first, last, on)) << first << ".." << last;
-        std::string seen;
-        for (UINT id : ids)
-            seen += static_cast<char>('0' + QBR_GetButtonState(manager, id));
-        EXPECT_EQ(states, seen) << first << ".." << last << " on " << on;
-    }
-    QBR_DestroyManager(manager);
 }
 
 // Twice: a start gives quick help and customising on, button text off, and
