@@ -1,12 +1,11 @@
-// The demonstration program's windows, run in this process on its own
-// resources (demo_test.rc): the main window made as WinMain makes it, views
-// opened with its "Open Another Window" command.
+// The demonstration program's windows, run in this process on its own resources (demo_test.rc):
+// the main window made as WinMain makes it, views opened with its "Open Another Window" command.
+#include <algorithm>
 #include <cstring>
 #include <string>
 #include <tuple>
 
 #include "harness.h"
-#include "toolbar/toolbar.h"
 
 #include "demo/main.cpp"
 #include "demo/settings.cpp"
@@ -27,9 +26,8 @@ std::string On(HWND frame, UINT first, UINT last) {
 }
 std::string Profile(const char *section, const char *key) { // a list of keys: "|" between two
     char value[2048] = "";
-    for (DWORD n = GetPrivateProfileStringA(section, key, "", value, sizeof value, SettingsPath()), i = 0; i + 1 < n;
-         ++i)
-        value[i] = value[i] ? value[i] : '|';
+    const DWORD n = GetPrivateProfileStringA(section, key, "", value, sizeof value, SettingsPath());
+    std::replace(value, value + (n ? n - 1 : 0), '\0', '|');
     return value;
 }
 RECT Outer(HWND window) { return WindowRectInParent(window); }
@@ -61,19 +59,16 @@ class DemoTest : public ::testing::Test {
 };
 
 // Each frame has its own toolbars and radio groups, on its buttons and in its
-// menu alike; the Palette group runs from its first entry to its last, and
-// Palette floats in four rows of three.
+// menu alike; the Palette group runs from its first entry to its last.
 TEST_F(DemoTest, EachFrameKeepsItsOwnGroupsOnButtonsAndMenus) {
     HWND a = OpenView(), b = OpenView();
     ASSERT_TRUE(a && b && a != b && ManagerOf(a) != ManagerOf(b) && ManagerOf(a) != mainManager);
-    RECT palette;
-    GetItemArea(QBR_GetToolbar(mainManager, 3), ROLE_ACTIVE, &palette);
-    EXPECT_EQ(4 * 22, palette.bottom - palette.top);
+    // The command, then the button on in Palette, and in Style's group of the main window, view A and view B.
     const std::tuple<HWND, UINT, const char *> steps[] = {
-        // Palette, then Style's group in the main window, A, B
         {a, 0, "204 304 304 304"},       {a, 306, "204 304 306 304"},     {b, 307, "204 304 306 307"},
         {frame, 305, "204 305 306 307"}, {frame, 201, "201 305 306 307"}, {frame, 212, "212 305 306 307"},
-        {b, 304, "212 305 306 304"}};
+        {b, 304, "212 305 306 304"},
+    };
     for (const auto &[window, command, expected] : steps) {
         Command(window, command);
         std::string on = On(frame, 201, 212);
@@ -84,45 +79,30 @@ TEST_F(DemoTest, EachFrameKeepsItsOwnGroupsOnButtonsAndMenus) {
 }
 
 // Titles a settings file cannot carry as plain keys go under escaped keys, in
-// their lines and in the dock's value alike, and come back as they were; one
-// with a comma does not come back. The empty title stands in the middle: a
+// their lines and in the dock's value alike, and come back as they were but
+// one with a comma. The empty title stands in the middle: a
 // dock's value that ends in a comma has nothing left to read after it.
 TEST_F(DemoTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
-    const std::tuple<const char *, const char *> titles[] = {{"   ", "%%20%20%20"},
-                                                             {"a=b", "%a%3Db"},
-                                                             {";semi", "%%3Bsemi"},
-                                                             {"[brack", "%%5Bbrack"},
-                                                             {" both ", "%%20both%20"},
-                                                             {"end ", "%end%20"},
-                                                             {"standard", "%standard"},
-                                                             {"STYLE", "%%53%54%59%4C%45"},
-                                                             {"x,y", "x,y"},
-                                                             {"Twice", "Twice"},
-                                                             {"Twice", "%%54wice"},
-                                                             {"Twice", "%%54wice%#2"},
-                                                             {"%41", "%%2541"},
-                                                             {"", "%"},
-                                                             {"\"q\"", "%%22q%22"},
-                                                             {"tab\there", "%tab%09here"}};
+    // clang-format off
+    const std::tuple<const char *, const char *> titles[] = {
+        {"   ", "%%20%20%20"}, {"a=b", "%a%3Db"}, {";semi", "%%3Bsemi"}, {"[brack", "%%5Bbrack"},
+        {" both ", "%%20both%20"}, {"end ", "%end%20"}, {"standard", "%standard"}, {"STYLE", "%%53%54%59%4C%45"},
+        {"x,y", "x,y"}, {"Twice", "Twice"}, {"Twice", "%%54wice"}, {"Twice", "%%54wice%#2"}, {"%41", "%%2541"},
+        {"", "%"}, {"\"q\"", "%%22q%22"}, {"tab\there", "%tab%09here"}};
+    // clang-format on
     HWND view = OpenView();
-    std::string dock = "Standard,Style", keys = "Top Dock|Standard|Style", back = "|Standard|Style", seen;
+    std::string dock = "Standard,Style", keys = "Top Dock|Standard|Style";
     for (const auto &[title, key] : titles) {
         const UINT ids[] = {101};
         QBR_CreateToolbar(title, TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, QBR_GetDock(ManagerOf(view), DOCK_TOP), ids, 1);
         dock += std::string(",") + key;
         keys += std::string("|") + key;
-        back += std::strcmp(title, "x,y") ? std::string("|") + title : "";
     }
     Command(view, kExitCommand);
     EXPECT_EQ(dock, Profile(kViewLayout, "Top Dock"));
     EXPECT_EQ(keys, Profile(kViewLayout, nullptr));
-    view = OpenView();
-    for (UINT i = 0; i < QBR_GetToolbarCount(ManagerOf(view)); ++i) {
-        char title[64] = "#";
-        QBR_GetToolbarTitle(QBR_GetToolbar(ManagerOf(view), i), title, sizeof title);
-        seen += std::string("|") + title;
-    }
-    EXPECT_EQ(back, seen);
+    Command(OpenView(), kExitCommand); // what came back is written as it was
+    EXPECT_EQ(dock.erase(dock.find(",x,y"), 4), Profile(kViewLayout, "Top Dock"));
 }
 
 // The edit control stands from one pixel left of the client area to its
@@ -131,12 +111,8 @@ TEST_F(DemoTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
 // status bar is painted whole again at each new width.
 TEST_F(DemoTest, TheFramesContentsFollowItsTopDockAndItsWidth) {
     HWND top = QBR_GetDock(mainManager, DOCK_TOP);
-    const std::tuple<const char *, int> steps[] = {// entries of View > Toolbars (0 Standard, 1 Style), width
-                                                   {"", 0},
-                                                   {"01", 0},
-                                                   {"1", 0},
-                                                   {"", 400},
-                                                   {"", 600}};
+    // Entries of View > Toolbars (0 Standard, 1 Style), then a width of the frame.
+    const std::tuple<const char *, int> steps[] = {{"", 0}, {"01", 0}, {"1", 0}, {"", 400}, {"", 600}};
     for (const auto &[entries, width] : steps) {
         const int before = Outer(mainStatusBar).right;
         for (const char *entry = entries; *entry; ++entry)
