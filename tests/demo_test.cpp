@@ -1,5 +1,4 @@
-// The demonstration program's windows, run in this process on its own resources (demo_test.rc):
-// the main window made as WinMain makes it, views opened with its "Open Another Window" command.
+// The demonstration program's main and view windows, run in this process on its own resources (demo_test.rc).
 #include <algorithm>
 #include <cstring>
 #include <string>
@@ -58,8 +57,8 @@ class DemoTest : public ::testing::Test {
     HWND frame = nullptr;
 };
 
-// Each frame has its own toolbars and radio groups, on its buttons and in its
-// menu alike; the Palette group runs from its first entry to its last.
+// Each frame has its own toolbars and radio groups, on its buttons and in its menu alike; the Palette
+// group runs from its first entry to its last.
 TEST_F(DemoTest, EachFrameKeepsItsOwnGroupsOnButtonsAndMenus) {
     HWND a = OpenView(), b = OpenView();
     ASSERT_TRUE(a && b && a != b && ManagerOf(a) != ManagerOf(b) && ManagerOf(a) != mainManager);
@@ -78,10 +77,9 @@ TEST_F(DemoTest, EachFrameKeepsItsOwnGroupsOnButtonsAndMenus) {
     }
 }
 
-// Titles a settings file cannot carry as plain keys go under escaped keys, in
-// their lines and in the dock's value alike, and come back as they were but
-// one with a comma. The empty title stands in the middle: a
-// dock's value that ends in a comma has nothing left to read after it.
+// Titles a settings file cannot carry as keys go under escaped keys, in their lines and in the dock's value
+// alike, and come back but one with a comma. The empty title stands in the middle: a dock's value that ends
+// in a comma has nothing left to read after it.
 TEST_F(DemoTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
     // clang-format off
     const std::tuple<const char *, const char *> titles[] = {
@@ -105,10 +103,9 @@ TEST_F(DemoTest, EveryTitleSurvivesTheSettingsFileButOneWithAComma) {
     EXPECT_EQ(dock.erase(dock.find(",x,y"), 4), Profile(kViewLayout, "Top Dock"));
 }
 
-// The edit control stands from one pixel left of the client area to its
-// right edge, its top on the top dock's last line, its bottom on the status
-// bar, as the dock hides and comes back and the frame narrows and widens; the
-// status bar is painted whole again at each new width.
+// The edit control stands from one pixel left of the client area to its right edge, its top on the top
+// dock's last line, its bottom on the status bar, as the dock hides and comes back and the frame narrows
+// and widens; the status bar is painted whole again at each new width.
 TEST_F(DemoTest, TheFramesContentsFollowItsTopDockAndItsWidth) {
     HWND top = QBR_GetDock(mainManager, DOCK_TOP);
     // Entries of View > Toolbars (0 Standard, 1 Style), then a width of the frame.
