@@ -6,8 +6,8 @@
 #include "core/core.h"
 #include "harness.h"
 
-extern "C" int CApiRoundTrip(void);
-TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CApiRoundTrip()); }
+extern "C" int CallsFromC(void);
+TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CallsFromC()); }
 
 // White space is exactly space, tab, line feed, vertical tab, form feed and
 // carriage return; one sign at most; digits '0' to '9'; 32-bit wrapping.

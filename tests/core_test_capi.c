@@ -1,4 +1,4 @@
 /* Compiled as C: the public header must stay usable from a C host. */
 #include "quaybar.h"
 
-int CApiRoundTrip(void) { return QBR_GetToolbarFlags(NULL) == 0 && QBR_GetDock(NULL, DOCK_TOP) == NULL; }
+int CallsFromC(void) { return QBR_GetToolbarFlags(NULL) == 0 && QBR_GetDock(NULL, DOCK_TOP) == NULL; }
