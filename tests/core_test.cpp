@@ -65,6 +65,5 @@ TEST(ClientLifeTest, DefaultsTheModuleInstanceAndEverythingBack) {
         QBR_Terminate();
     }
     QBR_GetLiveCounts(&blocksAfter, &objectsAfter);
-    EXPECT_EQ(blocks, blocksAfter);
-    EXPECT_EQ(objects, objectsAfter);
+    EXPECT_EQ(std::make_pair(blocks, objects), std::make_pair(blocksAfter, objectsAfter)) << "blocks, GDI objects";
 }
