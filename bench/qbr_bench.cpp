@@ -9,7 +9,7 @@
 // Operations that build a whole scene (layout apply, destroy) are timed once
 // per repetition, with the building outside the clock.
 //
-// Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|profile]
+// Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|keys|close|scale|create|profile]
 //   --quick: fewer repetitions; a section name runs that section alone.
 #include <windows.h>
 // after windows.h, which it needs
@@ -911,11 +911,73 @@ void BenchKeys() {
     DestroyScene(s);
 }
 
+// A change of display scale: every toolbar of the frame measured again at
+// the new scale and its dock packed, the frame's WM_DPICHANGED as a host
+// passes it on (no suggested rectangle: the frame keeps its size). The
+// native row is the nearest act, a new button and image size on every bar.
+void BenchScale() {
+    Header("Display scale change, frame with 4 toolbars of 10 buttons");
+    Scene s = MakeScene(4, 10, false);
+    NativeScene n = MakeNativeScene(4, 10, false);
+    UINT dpi = 96;
+    Stats q = Measure([&] {
+        dpi = dpi == 96 ? 144 : 96;
+        QBR_DpiChanged(s.frame, MAKEWPARAM(dpi, dpi), 0);
+        Pump();
+        UpdateAll(s.panes);
+    });
+    if (dpi != 96) QBR_DpiChanged(s.frame, MAKEWPARAM(96, 96), 0);
+    bool large = false;
+    Stats c = Measure([&] {
+        large = !large;
+        for (HWND bar : n.bars) {
+            SendMessageA(bar, TB_SETBITMAPSIZE, 0, large ? MAKELPARAM(24, 23) : MAKELPARAM(16, 15));
+            SendMessageA(bar, TB_SETBUTTONSIZE, 0, large ? MAKELPARAM(36, 33) : MAKELPARAM(24, 22));
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+        }
+        Pump();
+        UpdateAll(n.bars);
+    });
+    Row("one scale change (96 <-> 144 DPI), 4 toolbars", q, c);
+    DestroyNativeScene(n);
+    DestroyScene(s);
+}
+
+// A toolbar of 100 buttons made in the top dock of a frame and destroyed
+// again, the queue drained after each; beside a comctl32 bar of 100 buttons
+// made and destroyed. The spread matters here: every run should fit a frame.
+void BenchCreate() {
+    Header("Create + destroy a toolbar of 100 buttons");
+    Scene s = MakeScene(0, 0, false);
+    std::vector<UINT> ids(100);
+    for (UINT i = 0; i < 100; ++i)
+        ids[i] = kFirstId + i;
+    Stats q = Measure([&] {
+        HWND pane =
+            QBR_CreateToolbar("Made", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, s.dock, ids.data(), static_cast<UINT>(ids.size()));
+        Pump();
+        UpdateWindow(pane);
+        QBR_DestroyToolbar(pane);
+        Pump();
+    });
+    NativeScene n = MakeNativeScene(0, 0, false);
+    Stats c = Measure([&] {
+        HWND bar = MakeNativeBar(n.frame, n.strip, 0, 100, kFirstId, false);
+        Pump();
+        UpdateWindow(bar);
+        DestroyWindow(bar);
+        Pump();
+    });
+    Row("create + destroy, 100 buttons, top dock", q, c);
+    DestroyNativeScene(n);
+    DestroyScene(s);
+}
+
 } // namespace
 
 int main(int argc, char **argv) {
     bool quick = false;
-    std::string only; // a section name: state, text, drop, layout, growth, keys, close, profile
+    std::string only; // a section name: state, text, drop, layout, growth, keys, close, scale, create, profile
     for (int i = 1; i < argc; ++i) {
         if (lstrcmpA(argv[i], "--quick") == 0)
             quick = true;
@@ -955,6 +1017,8 @@ int main(int argc, char **argv) {
     if (wanted("growth")) BenchGrowth();
     if (wanted("keys")) BenchKeys();
     if (wanted("close")) BenchDestroyAndLongLines();
+    if (wanted("scale")) BenchScale();
+    if (wanted("create")) BenchCreate();
     if (wanted("profile")) {
         ProfileApply(200);
         if (!quick) ProfileApply(1000);
