@@ -22,8 +22,10 @@
 #include <string>
 #include <vector>
 
+#include "core/core.h"
 #include "dock/dock.h"
 #include "input/input.h"
+#include "paint/paint.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
 
@@ -745,6 +747,108 @@ void ProfileApply(UINT toolbars) {
     fflush(stdout);
 }
 
+// Prints a table of phases with their times and shares.
+void PhaseTable(const char *title, const std::vector<const char *> &names, const std::vector<double> &spent) {
+    double total = 0;
+    for (double x : spent)
+        total += x;
+    printf("\n### %s\n\n", title);
+    printf("| %-34s | %10s | %6s |\n|%s|%s|%s|\n", "phase", "time", "share", std::string(36, '-').c_str(),
+           std::string(12, '-').c_str(), std::string(8, '-').c_str());
+    for (size_t i = 0; i < names.size(); ++i)
+        printf("| %-34s | %10s | %5.1f%% |\n", names[i], Fmt(spent[i]).c_str(), 100 * spent[i] / total);
+    printf("| %-34s | %10s | %5.1f%% |\n", "total", Fmt(total).c_str(), 100.0);
+    fflush(stdout);
+}
+
+// The create + destroy of a toolbar of 100 buttons taken apart as
+// QBR_CreateToolbar and QBR_DestroyToolbar do it (means of 20 runs).
+void ProfileCreate() {
+    enum { kWindows, kItems, kInsert, kFloat, kFlags, kPump, kPaint, kRecord, kFrame, kPane, kPumpAfter, kPhases };
+    std::vector<const char *> names = {"create pane + floating frame", "set items (with refit)", "insert into dock",
+                                       "place + refit floating frame",  "apply flags (show)",    "drain the queue",
+                                       "paint",                         "destroy record",         "DestroyWindow frame",
+                                       "DestroyWindow pane",            "drain the queue after"};
+    std::vector<double> spent(kPhases);
+    Scene s = MakeScene(0, 0, false);
+    std::vector<UINT> ids(100);
+    for (UINT i = 0; i < 100; ++i)
+        ids[i] = kFirstId + i;
+    const int kRuns = 20;
+    for (int run = 0; run <= kRuns; ++run) {
+        std::vector<double> t(kPhases + 1);
+        t[0] = NowUs();
+        HWND pane = CreateToolbarWindows(s.dock, "Made");
+        ToolbarRecord *record = RecordOfWindow(pane);
+        record->flags = TBF_VISIBLE | TBF_DOCKED;
+        t[1] = NowUs();
+        SetToolbarItems(record, ids.data(), 100);
+        t[2] = NowUs();
+        InsertToolbarBefore(FindDockRecord(s.dock), nullptr, record);
+        t[3] = NowUs();
+        RECT r;
+        GetToolbarWindowRect(pane, ROLE_FLOATING, &r);
+        OffsetRect(&r, -r.left, -r.top);
+        MoveToolbarWindow(pane, ROLE_FLOATING, &r);
+        RefitToolbar(pane, ROLE_FLOATING);
+        t[4] = NowUs();
+        QBR_SetToolbarFlags(pane, record->flags);
+        t[5] = NowUs();
+        Pump();
+        t[6] = NowUs();
+        UpdateWindow(pane);
+        t[7] = NowUs();
+        HWND frame = GetTwinWindow(pane);
+        DestroyToolbarRecord(record);
+        t[8] = NowUs();
+        DestroyWindow(frame);
+        t[9] = NowUs();
+        DestroyWindow(pane);
+        t[10] = NowUs();
+        Pump();
+        t[11] = NowUs();
+        if (run > 0) // the first is the warm-up
+            for (int i = 0; i < kPhases; ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    PhaseTable("Where a create + destroy of a toolbar of 100 buttons spends its time (means of 20)", names, spent);
+    DestroyScene(s);
+}
+
+// A display-scale change of a frame with 4 toolbars of 10 taken apart as
+// RescaleManagerToolbars does it (means of 20 changes).
+void ProfileScale() {
+    std::vector<const char *> names = {"rewrap every window", "image strip for the scale", "refit + pack every dock",
+                                       "drain the queue", "paint"};
+    std::vector<double> spent(names.size());
+    Scene s = MakeScene(4, 10, false);
+    const int kRuns = 20;
+    for (int run = 0; run <= kRuns; ++run) {
+        const UINT dpi = run % 2 ? 96 : 144;
+        int width = 0, height = 0;
+        GetButtonSizes(&width, &height, nullptr, nullptr);
+        std::vector<double> t(names.size() + 1);
+        t[0] = NowUs();
+        s.manager->dpi = dpi;
+        RewrapManagerToolbars(s.manager, width, height);
+        t[1] = NowUs();
+        if (s.manager->imageResource) ChooseImageStrip(s.manager);
+        t[2] = NowUs();
+        RelayoutManagerToolbars(s.manager);
+        t[3] = NowUs();
+        Pump();
+        t[4] = NowUs();
+        UpdateAll(s.panes);
+        t[5] = NowUs();
+        if (run > 0)
+            for (size_t i = 0; i < names.size(); ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    PhaseTable("Where a scale change of a frame with 4 toolbars spends its time (means of 20)", names, spent);
+    QBR_DpiChanged(s.frame, MAKEWPARAM(96, 96), 0);
+    DestroyScene(s);
+}
+
 // One toolbar of 10, 100 and 1,000 buttons. The catalog holds 1,000
 // buttons, so the largest toolbar shows each once.
 void BenchGrowth() {
@@ -1020,6 +1124,8 @@ int main(int argc, char **argv) {
     if (wanted("scale")) BenchScale();
     if (wanted("create")) BenchCreate();
     if (wanted("profile")) {
+        ProfileCreate();
+        ProfileScale();
         ProfileApply(200);
         if (!quick) ProfileApply(1000);
     }

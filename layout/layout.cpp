@@ -252,8 +252,7 @@ static void KeepRoomInsideBorders(HWND frame, UINT writtenDpi, RECT *rect) {
     // The borders this frame has, measured: under Wine every window has the
     // screen's, whatever scale its monitor is said to have. Of a frame sized
     // below its borders only the platform's numbers tell them.
-    GetWindowRect(frame, &outer);
-    GetClientRect(frame, &client);
+    GetPlacedRects(frame, &outer, &client);
     int nowWidth = (outer.right - outer.left) - client.right, nowHeight = (outer.bottom - outer.top) - client.bottom;
     if (client.right <= 0 || client.bottom <= 0) {
         RECT platform = {0, 0, 0, 0};
@@ -364,9 +363,10 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
         HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
         if (!frame) continue;
         RECT r;
-        GetWindowRect(frame, &r);
-        SetWindowPos(frame, nullptr, MulDiv(r.left, width, written.screenWidth),
-                     MulDiv(r.top, height, written.screenHeight), 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+        GetToolbarWindowRect(frame, ROLE_FLOATING, &r);
+        OffsetRect(&r, MulDiv(r.left, width, written.screenWidth) - r.left,
+                   MulDiv(r.top, height, written.screenHeight) - r.top);
+        MoveToolbarWindow(frame, ROLE_FLOATING, &r);
     }
 }
 

@@ -39,8 +39,7 @@ class ToolbarTest : public FrameTest {
     void SetAreaRight(HWND pane, int role, int right, int clientHeight = 200) {
         HWND target = ResolveRoleWindow(pane, role);
         RECT outer, client;
-        GetWindowRect(target, &outer);
-        GetClientRect(target, &client);
+        GetPlacedRects(target, &outer, &client);
         int extraW = (outer.right - outer.left) - client.right, extraH = (outer.bottom - outer.top) - client.bottom;
         SetWindowPos(target, nullptr, 0, 0, right + kAreaRight + extraW, clientHeight + extraH,
                      SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
@@ -410,8 +409,13 @@ TEST_F(ToolbarTest, EditsRefitBothWindows) {
     ASSERT_EQ(1u, RemoveItem(RecordOfWindow(pane), Item(4)));
     Pump();
     EXPECT_EQ(paneBefore, WindowRectInParent(pane));
-    EXPECT_EQ(frameBefore.right - frameBefore.left,
-              WindowRectInParent(frameWindow).right - WindowRectInParent(frameWindow).left);
+    const RECT placed = WindowRectInParent(frameWindow);
+    EXPECT_EQ(frameBefore.right - frameBefore.left, placed.right - placed.left);
+    // The hidden frame is put where it was placed when it shows.
+    QBR_SetToolbarFlags(pane, TBF_VISIBLE | TBF_FLOATING);
+    RECT shown;
+    GetWindowRect(frameWindow, &shown);
+    EXPECT_EQ(placed, shown);
 }
 
 // Counts the paints a toolbar window receives.
@@ -627,11 +631,14 @@ TEST_F(ToolbarTest, RefitsAndPackingsThatChangeNothingPlaceNoWindow) {
         EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)])
             << (pane == docked ? "docked" : "floating") << " frame";
     }
-    // A real change places the windows it changes.
+    // A real change places the windows it changes; a hidden frame is placed
+    // once, as it shows.
     ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
     Pump();
     EXPECT_GT(placings[docked], 0);
-    EXPECT_GT(placings[ResolveRoleWindow(docked, ROLE_FLOATING)], 0);
+    EXPECT_EQ(0, placings[ResolveRoleWindow(docked, ROLE_FLOATING)]);
+    QBR_SetToolbarFlags(docked, TBF_VISIBLE | TBF_FLOATING);
+    EXPECT_EQ(1, placings[ResolveRoleWindow(docked, ROLE_FLOATING)]);
     UnwatchPlacings();
 }
 

@@ -14,9 +14,11 @@ main_section() { tr -d '\r' <"$ini" | awk '/^\[/ { inside = ($0 == "[Main Layout
 # Every toolbar window of the main frame and the top dock, in a stable order.
 # The panes in the side docks and the side docks themselves are left out: a
 # toolbar dropped into a side dock keeps the shape it had, while a restart
-# measures it anew for its dock; in_side_dock checks those.
+# measures it anew for its dock; in_side_dock checks those. Hidden floating
+# frames are left out too: one is put at its place as it shows (the stored
+# lines keep that place, and they are compared below).
 arrangement() {
-    { ctl toolbars "$main" | grep -v -e '^pane .* Standard$' -e '^pane .* Palette$'; dock_rect "$main" top | sed 's/^/top dock /'; } | sort
+    { ctl toolbars "$main" | grep -v -e '^pane .* Standard$' -e '^pane .* Palette$' -e '^frame 0 '; dock_rect "$main" top | sed 's/^/top dock /'; } | sort
 }
 # Pane $1 is shown inside the dock on side $2.
 in_side_dock() {
