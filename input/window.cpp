@@ -30,6 +30,7 @@ static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
 
 static void OnSize(HWND window) {
     InvalidateRect(window, nullptr, TRUE);
+    if (ToolbarWindowsInCreation()) return;
     RefitToolbar(window, ROLE_SELF);
 }
 

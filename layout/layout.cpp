@@ -310,11 +310,12 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
     for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
         UINT dockIndex;
         if (!FindLayoutIndex(keys, count, DockKey(side), &dockIndex)) continue;
-        HWND dock = QBR_CreateDock(manager, frame, side);
-        if (!dock) continue;
+        HWND dock = nullptr;
         {
+            // The dock too is packed once, with its toolbars, not empty first.
             DeferDockPacking once;
-            while (*cursors[dockIndex]) {
+            dock = QBR_CreateDock(manager, frame, side);
+            while (dock && *cursors[dockIndex]) {
                 // Cut in place: the title stays readable until the values are
                 // tidied up below.
                 LPCSTR title = NextToken(&cursors[dockIndex]);

@@ -1,6 +1,8 @@
 // The layout table: capture of a frame's arrangement, its text format, and
 // building docks and toolbars back from it, also from damaged values.
+#include <algorithm>
 #include <cstdio>
+#include <map>
 #include <random>
 #include <string>
 #include <utility>
@@ -42,6 +44,35 @@ void Apply(ToolbarManager *manager, HWND frame, const Entries &entries) {
     EXPECT_EQ(1u, QBR_ApplyLayout(manager, frame));
     QBR_FreeLayout();
     Pump();
+}
+
+std::string WindowTitle(HWND window) {
+    char text[64] = "", name[64] = "";
+    GetWindowTextA(window, text, sizeof text);
+    GetClassNameA(window, name, sizeof name);
+    return std::string(name) + " \"" + text + "\"";
+}
+
+// Every move, size, show and paint any window of the thread gets.
+struct Acts {
+    int moves = 0, sizes = 0, shows = 0, paints = 0;
+};
+std::map<HWND, Acts> acts;
+LRESULT CALLBACK CountSent(int code, WPARAM wParam, LPARAM lParam) {
+    const CWPSTRUCT *m = reinterpret_cast<const CWPSTRUCT *>(lParam);
+    if (code == HC_ACTION && m->message == WM_WINDOWPOSCHANGING) {
+        const UINT flags = reinterpret_cast<const WINDOWPOS *>(m->lParam)->flags;
+        acts[m->hwnd].moves += !(flags & SWP_NOMOVE);
+        acts[m->hwnd].sizes += !(flags & SWP_NOSIZE);
+        acts[m->hwnd].shows += (flags & SWP_SHOWWINDOW) != 0;
+    }
+    if (code == HC_ACTION && m->message == WM_PAINT) ++acts[m->hwnd].paints;
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+LRESULT CALLBACK CountPosted(int code, WPARAM wParam, LPARAM lParam) {
+    const MSG *m = reinterpret_cast<const MSG *>(lParam);
+    if (code == HC_ACTION && wParam == PM_REMOVE && m->message == WM_PAINT) ++acts[m->hwnd].paints;
+    return CallNextHookEx(nullptr, code, wParam, lParam);
 }
 
 class LayoutTest : public FrameTest {
@@ -97,7 +128,17 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     EXPECT_EQ("Column", entries[4].first);
 
     otherManager = SecondManager();
+    Pump();
+    acts.clear();
+    HHOOK sent = SetWindowsHookExA(WH_CALLWNDPROC, CountSent, nullptr, GetCurrentThreadId());
+    HHOOK posted = SetWindowsHookExA(WH_GETMESSAGE, CountPosted, nullptr, GetCurrentThreadId());
     Apply(otherManager, other, entries);
+    UnhookWindowsHookEx(sent);
+    UnhookWindowsHookEx(posted);
+    for (const auto &a : acts) // no window shown, moved, sized or painted twice
+        EXPECT_LE(std::max({a.second.moves, a.second.sizes, a.second.shows, a.second.paints}), 1)
+            << WindowTitle(a.first) << ": " << a.second.moves << " moves, " << a.second.sizes << " sizes, " << a.second.shows
+            << " shows, " << a.second.paints << " paints";
     EXPECT_EQ(3u, QBR_GetToolbarCount(otherManager));
     EXPECT_EQ(entries, Capture(otherManager)) << "a restore followed by a capture gives the same table";
     HWND restoredFloat = QBR_GetToolbar(otherManager, 1);

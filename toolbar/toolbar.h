@@ -67,6 +67,8 @@ UINT InsertionIndexAtPoint(const ToolbarRecord *record, int x, int y, UINT *outI
 
 // ---- The window pair ----------------------------------------------------------
 HWND CreateToolbarWindows(HWND dock, LPCSTR title);
+// True inside CreateToolbarWindows, while the pair is being made.
+bool ToolbarWindowsInCreation();
 HWND ResolveRoleWindow(HWND window, int role);
 UINT IsFloatingFrame(HWND window);
 UINT IsToolbarPane(HWND window);

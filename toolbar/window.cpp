@@ -15,6 +15,7 @@ const char kToolbarClassName[] = "QBR_ToolbarWindow";
 constexpr DWORD kPaneStyle = WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN | WS_BORDER;
 
 static HWND cachedToolbarPane = nullptr;
+static int windowsInCreation = 0;
 static ToolbarManager *cachedToolbarManager = nullptr;
 
 // ---- Identity -------------------------------------------------------------------
@@ -115,9 +116,17 @@ HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
         wc.lpszClassName = kToolbarClassName;
         if (!RegisterClassA(&wc)) return nullptr;
     }
-    // The pane's WM_CREATE makes the floating frame and the record.
-    return CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
+    // The pane's WM_CREATE makes the floating frame and the record. The
+    // WM_SIZE that creation sends is no refit: the items set next size both
+    // windows (SizeToolbarWindows), and an empty pane sized here would be
+    // sized, and its dock packed, once more for nothing.
+    ++windowsInCreation;
+    HWND pane = CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
+    --windowsInCreation;
+    return pane;
 }
+
+bool ToolbarWindowsInCreation() { return windowsInCreation != 0; }
 
 // ---- Coordinates ----------------------------------------------------------------
 
@@ -478,7 +487,10 @@ static void SizePaneToNatural(HWND pane, int width, int height) {
     const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
     RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
                      height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
-    PlaceWindow(pane, paneSize, false, true);
+    RECT present;
+    GetToolbarWindowRect(pane, ROLE_DOCKED, &present);
+    if (Width(present) != Width(paneSize) || Height(present) != Height(paneSize))
+        PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
 }
 
