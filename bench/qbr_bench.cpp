@@ -849,6 +849,52 @@ void ProfileScale() {
     DestroyScene(s);
 }
 
+// Button text on and off with 40 toolbars of 10 in the top dock, taken apart
+// as QBR_SetButtonText does it: the rewrap at the new size, the refit of
+// every toolbar (with its row breaks), the one packing of the dock; then the
+// queue and the paints (means of 10 switches).
+void ProfileText() {
+    std::vector<const char *> names = {"rewrap every window", "refit every toolbar", "pack the dock once",
+                                       "drain the queue", "paint"};
+    std::vector<double> spent(names.size());
+    Scene s = MakeScene(40, 10, false);
+    const int kRuns = 10;
+    for (int run = 0; run <= kRuns; ++run) {
+        const UINT on = run % 2 ? 0 : 1;
+        std::vector<double> t(names.size() + 1);
+        ToolbarClient *client = CurrentClient();
+        t[0] = NowUs();
+        {
+            DeferDockPacking deferred;
+            RewrapManagerToolbars(s.manager, on ? client->textButtonWidth : client->buttonWidth,
+                                  on ? client->textButtonHeight : client->buttonHeight);
+        }
+        client->buttonText = on;
+        t[1] = NowUs();
+        {
+            DeferDockPacking deferred;
+            for (HWND pane : s.panes) {
+                RefitToolbar(pane, ROLE_BOTH);
+                ComputeRowBreaks(pane, ROLE_FLOATING);
+                ComputeRowBreaks(pane, ROLE_DOCKED);
+            }
+        }
+        t[2] = NowUs();
+        RelayoutDock(s.dock);
+        t[3] = NowUs();
+        Pump();
+        t[4] = NowUs();
+        UpdateAll(s.panes);
+        t[5] = NowUs();
+        if (run > 0)
+            for (size_t i = 0; i < names.size(); ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    QBR_SetButtonText(0);
+    PhaseTable("Where the steps of a button-text switch with 40 toolbars spend their time (means of 10)", names, spent);
+    DestroyScene(s);
+}
+
 // One toolbar of 10, 100 and 1,000 buttons. The catalog holds 1,000
 // buttons, so the largest toolbar shows each once.
 void BenchGrowth() {
@@ -1117,7 +1163,7 @@ int main(int argc, char **argv) {
     if (wanted("state")) BenchStateChanges();
     if (wanted("text")) BenchButtonText();
     if (wanted("drop")) BenchDrop();
-    if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 200} : std::vector<UINT>{4, 200, 1000});
+    if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 20, 200} : std::vector<UINT>{4, 20, 200, 1000});
     if (wanted("growth")) BenchGrowth();
     if (wanted("keys")) BenchKeys();
     if (wanted("close")) BenchDestroyAndLongLines();
@@ -1126,6 +1172,7 @@ int main(int argc, char **argv) {
     if (wanted("profile")) {
         ProfileCreate();
         ProfileScale();
+        ProfileText();
         ProfileApply(200);
         if (!quick) ProfileApply(1000);
     }

@@ -261,6 +261,10 @@ UINT PackDock(DockArea *dock) {
         // a taller one pulls the row's bottom up one more pixel.
         row.bottom -= 1;
     }
+    // A pane that waited for this packing with a new size, and was not
+    // moved, is sized now, before the dock and the frame hear of it.
+    for (UINT i = 0; ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i); ++i)
+        PlaceWaitingWindow(toolbar->paneWindow);
     overall.left = 0;
     overall.top = 0;
     PlaceDock(dock->window, &overall);

@@ -46,6 +46,10 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
     for (bool top : {true, false})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             if (IsAcrossDock(dock->side) == top) PackDock(dock);
+    // Every pane stands in a dock's list, so the packings placed every pane
+    // that waited; this catches any that did not.
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        PlaceWaitingWindow(record->paneWindow);
     return 1;
 }
 
@@ -58,7 +62,11 @@ UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
     int width = 0, height = 0;
     GetButtonSizes(&width, &height, nullptr, nullptr);
     manager->dpi = dpi;
-    RewrapManagerToolbars(manager, width, height);
+    {
+        // The panes take their new sizes as the packing places them.
+        DeferDockPacking deferred;
+        RewrapManagerToolbars(manager, width, height);
+    }
     if (manager->imageResource) ChooseImageStrip(manager);
     RelayoutManagerToolbars(manager);
     return 1;

@@ -88,7 +88,7 @@ static HWND sizingFrame = nullptr; // the frame whose border the user holds
 static bool refittingStep = false;
 
 static LRESULT OnWindowPosChanged(HWND window, WPARAM wParam, LPARAM lParam) {
-    WaitingFramePlacedByOthers(window, reinterpret_cast<const WINDOWPOS *>(lParam));
+    WaitingWindowPlacedByOthers(window, reinterpret_cast<const WINDOWPOS *>(lParam));
     AccessWindowPosChanged(window, reinterpret_cast<const WINDOWPOS *>(lParam));
     if (!borderSizing || window != sizingFrame || refittingStep) return 0;
     refittingStep = true;
@@ -209,7 +209,7 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
     case WM_SHOWWINDOW: // the platform also hides and shows owned frames here
         // A hidden frame's place is taken before anyone sees it (its owner
         // restored shows it without the library).
-        if (wParam) PlaceWaitingFrame(window);
+        if (wParam) PlaceWaitingWindow(window);
         AccessShowWindow(window, wParam, lParam);
         return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETOBJECT:

@@ -675,7 +675,7 @@ TEST_F(SurfaceTest, PaneAndFrameShowSurfaceButtonsAndCaption) {
 TEST_F(SurfaceTest, CaptionCases) {
     HWND frame = ResolveRoleWindow(Make(TBF_VISIBLE | TBF_DOCKED, ""), ROLE_FLOATING);
     ASSERT_FALSE(IsWindowVisible(frame));
-    PlaceWaitingFrame(frame); // a hidden frame is sized as it shows
+    PlaceWaitingWindow(frame); // a hidden frame is sized as it shows
     RECT client;
     GetClientRect(frame, &client);
     ASSERT_GT(client.right, 40);

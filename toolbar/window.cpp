@@ -174,7 +174,7 @@ static bool SettleRole(HWND &window, int &role) {
 static int Width(const RECT &r) { return r.right - r.left; }
 static int Height(const RECT &r) { return r.bottom - r.top; }
 
-// ---- Hidden floating frames -----------------------------------------------------
+// ---- Places that wait -------------------------------------------------------------
 //
 // A floating frame is a top-level window, and moving or sizing one costs a
 // round trip to the window system even while it is hidden (under Wine its X
@@ -186,9 +186,14 @@ static int Height(const RECT &r) { return r.bottom - r.top; }
 // reads of a frame (its rectangle, its client area, its item area) comes
 // from this place while it waits, so rows, sizes and stored layouts come out
 // as if the window had been moved at once.
+//
+// A shown pane whose size changes while its dock's packing is deferred (a new
+// button size or scale for every toolbar) waits the same way, for the
+// packing: that places it once, moved and sized in one call, where it would
+// otherwise be sized now and moved again a moment later.
 namespace {
 struct WaitingPlace {
-    HWND pane;   // the twin when the place was taken: a handle used again is not this frame
+    HWND twin;   // the twin when the place was taken: a handle used again is not this window
     RECT outer;  // screen coordinates
     SIZE around; // what the window system puts around the client area
 };
@@ -199,7 +204,7 @@ static const WaitingPlace *WaitingPlaceOf(HWND window) {
     if (waitingPlaces.empty() || !window) return nullptr;
     auto found = waitingPlaces.find(window);
     if (found == waitingPlaces.end()) return nullptr;
-    if (found->second.pane != GetTwinWindow(window)) {
+    if (found->second.twin != GetTwinWindow(window)) {
         waitingPlaces.erase(found);
         return nullptr;
     }
@@ -218,10 +223,14 @@ void GetPlacedRects(HWND window, RECT *outer, RECT *client) {
     if (client) GetClientRect(window, client);
 }
 
-// Takes a place for a hidden frame; false when the window is to be placed at
-// once (a pane, or a frame on show).
+// Takes a place for a hidden frame, or a new size for a shown pane while
+// packing is deferred; false when the window is to be placed at once.
 static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized) {
-    if (!IsFloatingFrame(window) || IsWindowVisible(window)) return false;
+    if (IsFloatingFrame(window)) {
+        if (IsWindowVisible(window)) return false;
+    } else if (moved || !DeferDockPacking::Active() || !IsToolbarPane(window) || !IsWindowVisible(window)) {
+        return false;
+    }
     WaitingPlace place;
     if (const WaitingPlace *waiting = WaitingPlaceOf(window)) {
         place = *waiting;
@@ -237,7 +246,7 @@ static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized)
         const int width = place.outer.right - place.outer.left, height = place.outer.bottom - place.outer.top;
         place.around.cx = client.right > 0 ? width - client.right : borders.right - borders.left;
         place.around.cy = client.bottom > 0 ? height - client.bottom : borders.bottom - borders.top;
-        place.pane = GetTwinWindow(window);
+        place.twin = GetTwinWindow(window);
     }
     RECT &outer = place.outer;
     if (moved) OffsetRect(&outer, target.left - outer.left, target.top - outer.top);
@@ -245,8 +254,10 @@ static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized)
         // As the window system would size a window with a sizing border: no
         // larger than its largest tracking size (the toolbar window asks
         // for no smallest).
-        outer.right = outer.left + std::min<int>(target.right - target.left, GetSystemMetrics(SM_CXMAXTRACK));
-        outer.bottom = outer.top + std::min<int>(target.bottom - target.top, GetSystemMetrics(SM_CYMAXTRACK));
+        const bool border = IsFloatingFrame(window) != 0;
+        outer.right = outer.left + (border ? std::min<int>(Width(target), GetSystemMetrics(SM_CXMAXTRACK)) : Width(target));
+        outer.bottom =
+            outer.top + (border ? std::min<int>(Height(target), GetSystemMetrics(SM_CYMAXTRACK)) : Height(target));
     }
     waitingPlaces[window] = place;
     return true;
@@ -261,11 +272,11 @@ static void PlaceFrame(HWND frame, HWND insertAfter, UINT flags) {
         SetWindowPos(frame, insertAfter, 0, 0, 0, 0, flags | SWP_NOMOVE | SWP_NOSIZE);
         return;
     }
-    const WaitingPlace place = *waiting;
-    RECT client;
+    RECT outer = waiting->outer, client;
     GetPlacedRects(frame, nullptr, &client);
     waitingPlaces.erase(frame);
-    SetWindowPos(frame, insertAfter, place.outer.left, place.outer.top, Width(place.outer), Height(place.outer), flags);
+    if (GetWindowLongA(frame, GWL_STYLE) & WS_CHILD) ScreenRectToClient(GetParent(frame), &outer);
+    SetWindowPos(frame, insertAfter, outer.left, outer.top, Width(outer), Height(outer), flags);
     // The rows were made for the client area the frame was to have; if the
     // window system gave it another, they are made again.
     RECT now;
@@ -273,22 +284,28 @@ static void PlaceFrame(HWND frame, HWND insertAfter, UINT flags) {
     if (!EqualRect(&now, &client)) ComputeRowBreaks(frame, ROLE_FLOATING);
 }
 
-void PlaceWaitingFrame(HWND frame) {
-    if (WaitingPlaceOf(frame)) PlaceFrame(frame, nullptr, SWP_NOZORDER | SWP_NOACTIVATE);
+static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized);
+
+void PlaceWaitingWindow(HWND window) {
+    if (!WaitingPlaceOf(window)) return;
+    if (IsFloatingFrame(window))
+        PlaceFrame(window, nullptr, SWP_NOZORDER | SWP_NOACTIVATE);
+    else
+        PlaceWindow(window, RECT{}, false, false); // a pane: placed as the packing places it
 }
 
-void ForgetWaitingFrame(HWND frame) {
+void ForgetWaitingWindow(HWND frame) {
     if (frame) waitingPlaces.erase(frame);
 }
 
 // Someone else moved or sized a frame that waits (the window system, a host
 // that holds its handle): what they changed is the frame's now, the rest of
 // the waiting place stays. Shown so, it takes the rest of its place at once.
-void WaitingFramePlacedByOthers(HWND frame, const WINDOWPOS *pos) {
+void WaitingWindowPlacedByOthers(HWND frame, const WINDOWPOS *pos) {
     auto found = waitingPlaces.find(frame);
     if (!pos || found == waitingPlaces.end()) return;
     if (pos->flags & SWP_SHOWWINDOW) {
-        PlaceWaitingFrame(frame);
+        PlaceWaitingWindow(frame);
         return;
     }
     WaitingPlace &place = found->second;
@@ -341,8 +358,21 @@ void GetItemArea(HWND window, int role, RECT *rect) {
 // moves. The same parts are marked instead (the pane with its border, and the
 // dock surface it left) and painted together by the next update: the dock's,
 // at the end of the packing, or the pane's own after a refit.
-static void PlaceWindow(HWND window, const RECT &target, bool moved, bool sized) {
-    if (WaitToPlace(window, target, moved, sized)) return;
+static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized) {
+    if (WaitToPlace(window, placing, moved, sized)) return;
+    RECT target = placing;
+    if (const WaitingPlace *waiting = WaitingPlaceOf(window)) {
+        // What waited goes with this placing, in the same call.
+        RECT place = waiting->outer;
+        if (GetWindowLongA(window, GWL_STYLE) & WS_CHILD) ScreenRectToClient(GetParent(window), &place);
+        if (!moved) OffsetRect(&target, place.left - target.left, place.top - target.top);
+        if (!sized) {
+            target.right = target.left + Width(place);
+            target.bottom = target.top + Height(place);
+        }
+        moved = sized = true;
+        waitingPlaces.erase(window);
+    }
     UINT flags = SWP_NOZORDER | SWP_NOACTIVATE;
     if (!moved) flags |= SWP_NOMOVE;
     if (!sized) flags |= SWP_NOSIZE;
