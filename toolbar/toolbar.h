@@ -81,11 +81,13 @@ HWND DockOfToolbar(HWND window);
 UINT IsSideDocked(HWND window);
 // The outer rectangle (screen coordinates) and the client rectangle of a
 // toolbar window where the library placed it: a hidden floating frame is put
-// there only when it shows (PlaceWaitingWindow), and reads so until then.
+// there only as it shows, a shown pane sized while packing is deferred only
+// as the packing places it (PlaceWaitingWindow puts a window there now), and
+// both read so until then.
 void GetPlacedRects(HWND window, RECT *outer, RECT *client);
-void PlaceWaitingWindow(HWND frame);
-void ForgetWaitingWindow(HWND frame);
-void WaitingWindowPlacedByOthers(HWND frame, const WINDOWPOS *pos);
+void PlaceWaitingWindow(HWND window);
+void ForgetWaitingWindow(HWND window);
+void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos);
 void GetToolbarWindowRect(HWND window, int role, RECT *rect);
 void GetItemArea(HWND window, int role, RECT *rect);
 void MoveToolbarWindow(HWND window, int role, const RECT *rect);

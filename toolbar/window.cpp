@@ -272,10 +272,10 @@ static void PlaceFrame(HWND frame, HWND insertAfter, UINT flags) {
         SetWindowPos(frame, insertAfter, 0, 0, 0, 0, flags | SWP_NOMOVE | SWP_NOSIZE);
         return;
     }
-    RECT outer = waiting->outer, client;
+    const RECT outer = waiting->outer;
+    RECT client;
     GetPlacedRects(frame, nullptr, &client);
     waitingPlaces.erase(frame);
-    if (GetWindowLongA(frame, GWL_STYLE) & WS_CHILD) ScreenRectToClient(GetParent(frame), &outer);
     SetWindowPos(frame, insertAfter, outer.left, outer.top, Width(outer), Height(outer), flags);
     // The rows were made for the client area the frame was to have; if the
     // window system gave it another, they are made again.
@@ -294,28 +294,28 @@ void PlaceWaitingWindow(HWND window) {
         PlaceWindow(window, RECT{}, false, false); // a pane: placed as the packing places it
 }
 
-void ForgetWaitingWindow(HWND frame) {
-    if (frame) waitingPlaces.erase(frame);
+void ForgetWaitingWindow(HWND window) {
+    if (window) waitingPlaces.erase(window);
 }
 
-// Someone else moved or sized a frame that waits (the window system, a host
-// that holds its handle): what they changed is the frame's now, the rest of
+// Someone else moved or sized a window that waits (the window system, a host
+// that holds its handle): what they changed is the window's now, the rest of
 // the waiting place stays. Shown so, it takes the rest of its place at once.
-void WaitingWindowPlacedByOthers(HWND frame, const WINDOWPOS *pos) {
-    auto found = waitingPlaces.find(frame);
+void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos) {
+    auto found = waitingPlaces.find(window);
     if (!pos || found == waitingPlaces.end()) return;
     if (pos->flags & SWP_SHOWWINDOW) {
-        PlaceWaitingWindow(frame);
+        PlaceWaitingWindow(window);
         return;
     }
     WaitingPlace &place = found->second;
     RECT real, client;
-    GetWindowRect(frame, &real);
+    GetWindowRect(window, &real);
     if (!(pos->flags & SWP_NOMOVE)) OffsetRect(&place.outer, real.left - place.outer.left, real.top - place.outer.top);
     if (!(pos->flags & SWP_NOSIZE)) {
         place.outer.right = place.outer.left + Width(real);
         place.outer.bottom = place.outer.top + Height(real);
-        GetClientRect(frame, &client);
+        GetClientRect(window, &client);
         if (client.right > 0) place.around.cx = Width(real) - client.right;
         if (client.bottom > 0) place.around.cy = Height(real) - client.bottom;
     }
