@@ -631,6 +631,14 @@ TEST_F(ToolbarTest, RefitsAndPackingsThatChangeNothingPlaceNoWindow) {
         EXPECT_EQ(0, placings[ResolveRoleWindow(pane, ROLE_FLOATING)])
             << (pane == docked ? "docked" : "floating") << " frame";
     }
+    // Button text grows every pane: the next pane of the row is sized and
+    // moved in one call, by the packing.
+    HWND second = Make({9, 10});
+    WatchPlacings(second);
+    QBR_SetButtonText(1);
+    EXPECT_EQ(1, placings[second]);
+    QBR_SetButtonText(0);
+    placings.clear();
     // A real change places the windows it changes; a hidden frame is placed
     // once, as it shows.
     ASSERT_EQ(1u, InsertItemAt(RecordOfWindow(docked), 0, Item(8)));
