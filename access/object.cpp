@@ -233,7 +233,7 @@ class ToolbarAccessible final : public IAccessible {
         if (FAILED(hr)) return hr;
         RECT rect;
         if (id == CHILDID_SELF) {
-            GetWindowRect(window_, &rect);
+            GetPlacedRects(window_, &rect, nullptr);
         } else if (IsChevron(record, id)) {
             ChevronRect(record, &rect);
             ClientRectToScreen(record->paneWindow, &rect);

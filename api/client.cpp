@@ -60,7 +60,11 @@ extern "C" void QBR_SetButtonText(UINT on) {
     // The rows are taken from the row-break lists that the old size made, so
     // the rewrap runs before the switch and the relayout after it. There is
     // no early return for an unchanged value: the walk always runs.
-    RewrapAllManagers(width, height);
+    {
+        // The panes take their new sizes as the relayout's packing places them.
+        DeferDockPacking deferred;
+        RewrapAllManagers(width, height);
+    }
     client->buttonText = on;
     RelayoutAllManagers();
 }

@@ -9,7 +9,7 @@
 // Operations that build a whole scene (layout apply, destroy) are timed once
 // per repetition, with the building outside the clock.
 //
-// Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|profile]
+// Usage: qbr_bench.exe [--quick] [state|text|drop|layout|growth|keys|close|scale|create|profile]
 //   --quick: fewer repetitions; a section name runs that section alone.
 #include <windows.h>
 // after windows.h, which it needs
@@ -22,8 +22,10 @@
 #include <string>
 #include <vector>
 
+#include "core/core.h"
 #include "dock/dock.h"
 #include "input/input.h"
+#include "paint/paint.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
 
@@ -745,6 +747,154 @@ void ProfileApply(UINT toolbars) {
     fflush(stdout);
 }
 
+// Prints a table of phases with their times and shares.
+void PhaseTable(const char *title, const std::vector<const char *> &names, const std::vector<double> &spent) {
+    double total = 0;
+    for (double x : spent)
+        total += x;
+    printf("\n### %s\n\n", title);
+    printf("| %-34s | %10s | %6s |\n|%s|%s|%s|\n", "phase", "time", "share", std::string(36, '-').c_str(),
+           std::string(12, '-').c_str(), std::string(8, '-').c_str());
+    for (size_t i = 0; i < names.size(); ++i)
+        printf("| %-34s | %10s | %5.1f%% |\n", names[i], Fmt(spent[i]).c_str(), 100 * spent[i] / total);
+    printf("| %-34s | %10s | %5.1f%% |\n", "total", Fmt(total).c_str(), 100.0);
+    fflush(stdout);
+}
+
+// The create + destroy of a toolbar of 100 buttons taken apart as
+// QBR_CreateToolbar and QBR_DestroyToolbar do it (means of 20 runs).
+void ProfileCreate() {
+    enum { kWindows, kItems, kInsert, kFloat, kFlags, kPump, kPaint, kRecord, kFrame, kPane, kPumpAfter, kPhases };
+    std::vector<const char *> names = {"create pane + floating frame", "set items (with refit)", "insert into dock",
+                                       "place + refit floating frame",  "apply flags (show)",    "drain the queue",
+                                       "paint",                         "destroy record",         "DestroyWindow frame",
+                                       "DestroyWindow pane",            "drain the queue after"};
+    std::vector<double> spent(kPhases);
+    Scene s = MakeScene(0, 0, false);
+    std::vector<UINT> ids(100);
+    for (UINT i = 0; i < 100; ++i)
+        ids[i] = kFirstId + i;
+    const int kRuns = 20;
+    for (int run = 0; run <= kRuns; ++run) {
+        std::vector<double> t(kPhases + 1);
+        t[0] = NowUs();
+        HWND pane = CreateToolbarWindows(s.dock, "Made");
+        ToolbarRecord *record = RecordOfWindow(pane);
+        record->flags = TBF_VISIBLE | TBF_DOCKED;
+        t[1] = NowUs();
+        SetToolbarItems(record, ids.data(), 100);
+        t[2] = NowUs();
+        InsertToolbarBefore(FindDockRecord(s.dock), nullptr, record);
+        t[3] = NowUs();
+        RECT r;
+        GetToolbarWindowRect(pane, ROLE_FLOATING, &r);
+        OffsetRect(&r, -r.left, -r.top);
+        MoveToolbarWindow(pane, ROLE_FLOATING, &r);
+        RefitToolbar(pane, ROLE_FLOATING);
+        t[4] = NowUs();
+        QBR_SetToolbarFlags(pane, record->flags);
+        t[5] = NowUs();
+        Pump();
+        t[6] = NowUs();
+        UpdateWindow(pane);
+        t[7] = NowUs();
+        HWND frame = GetTwinWindow(pane);
+        DestroyToolbarRecord(record);
+        t[8] = NowUs();
+        DestroyWindow(frame);
+        t[9] = NowUs();
+        DestroyWindow(pane);
+        t[10] = NowUs();
+        Pump();
+        t[11] = NowUs();
+        if (run > 0) // the first is the warm-up
+            for (int i = 0; i < kPhases; ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    PhaseTable("Where a create + destroy of a toolbar of 100 buttons spends its time (means of 20)", names, spent);
+    DestroyScene(s);
+}
+
+// A display-scale change of a frame with 4 toolbars of 10 taken apart as
+// RescaleManagerToolbars does it (means of 20 changes).
+void ProfileScale() {
+    std::vector<const char *> names = {"rewrap every window", "image strip for the scale", "refit + pack every dock",
+                                       "drain the queue", "paint"};
+    std::vector<double> spent(names.size());
+    Scene s = MakeScene(4, 10, false);
+    const int kRuns = 20;
+    for (int run = 0; run <= kRuns; ++run) {
+        const UINT dpi = run % 2 ? 96 : 144;
+        int width = 0, height = 0;
+        GetButtonSizes(&width, &height, nullptr, nullptr);
+        std::vector<double> t(names.size() + 1);
+        t[0] = NowUs();
+        s.manager->dpi = dpi;
+        RewrapManagerToolbars(s.manager, width, height);
+        t[1] = NowUs();
+        if (s.manager->imageResource) ChooseImageStrip(s.manager);
+        t[2] = NowUs();
+        RelayoutManagerToolbars(s.manager);
+        t[3] = NowUs();
+        Pump();
+        t[4] = NowUs();
+        UpdateAll(s.panes);
+        t[5] = NowUs();
+        if (run > 0)
+            for (size_t i = 0; i < names.size(); ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    PhaseTable("Where a scale change of a frame with 4 toolbars spends its time (means of 20)", names, spent);
+    QBR_DpiChanged(s.frame, MAKEWPARAM(96, 96), 0);
+    DestroyScene(s);
+}
+
+// Button text on and off with 40 toolbars of 10 in the top dock, taken apart
+// as QBR_SetButtonText does it: the rewrap at the new size, the refit of
+// every toolbar (with its row breaks), the one packing of the dock; then the
+// queue and the paints (means of 10 switches).
+void ProfileText() {
+    std::vector<const char *> names = {"rewrap every window", "refit every toolbar", "pack the dock once",
+                                       "drain the queue", "paint"};
+    std::vector<double> spent(names.size());
+    Scene s = MakeScene(40, 10, false);
+    const int kRuns = 10;
+    for (int run = 0; run <= kRuns; ++run) {
+        const UINT on = run % 2 ? 0 : 1;
+        std::vector<double> t(names.size() + 1);
+        ToolbarClient *client = CurrentClient();
+        t[0] = NowUs();
+        {
+            DeferDockPacking deferred;
+            RewrapManagerToolbars(s.manager, on ? client->textButtonWidth : client->buttonWidth,
+                                  on ? client->textButtonHeight : client->buttonHeight);
+        }
+        client->buttonText = on;
+        t[1] = NowUs();
+        {
+            DeferDockPacking deferred;
+            for (HWND pane : s.panes) {
+                RefitToolbar(pane, ROLE_BOTH);
+                ComputeRowBreaks(pane, ROLE_FLOATING);
+                ComputeRowBreaks(pane, ROLE_DOCKED);
+            }
+        }
+        t[2] = NowUs();
+        RelayoutDock(s.dock);
+        t[3] = NowUs();
+        Pump();
+        t[4] = NowUs();
+        UpdateAll(s.panes);
+        t[5] = NowUs();
+        if (run > 0)
+            for (size_t i = 0; i < names.size(); ++i)
+                spent[i] += (t[i + 1] - t[i]) / kRuns;
+    }
+    QBR_SetButtonText(0);
+    PhaseTable("Where the steps of a button-text switch with 40 toolbars spend their time (means of 10)", names, spent);
+    DestroyScene(s);
+}
+
 // One toolbar of 10, 100 and 1,000 buttons. The catalog holds 1,000
 // buttons, so the largest toolbar shows each once.
 void BenchGrowth() {
@@ -911,11 +1061,73 @@ void BenchKeys() {
     DestroyScene(s);
 }
 
+// A change of display scale: every toolbar of the frame measured again at
+// the new scale and its dock packed, the frame's WM_DPICHANGED as a host
+// passes it on (no suggested rectangle: the frame keeps its size). The
+// native row is the nearest act, a new button and image size on every bar.
+void BenchScale() {
+    Header("Display scale change, frame with 4 toolbars of 10 buttons");
+    Scene s = MakeScene(4, 10, false);
+    NativeScene n = MakeNativeScene(4, 10, false);
+    UINT dpi = 96;
+    Stats q = Measure([&] {
+        dpi = dpi == 96 ? 144 : 96;
+        QBR_DpiChanged(s.frame, MAKEWPARAM(dpi, dpi), 0);
+        Pump();
+        UpdateAll(s.panes);
+    });
+    if (dpi != 96) QBR_DpiChanged(s.frame, MAKEWPARAM(96, 96), 0);
+    bool large = false;
+    Stats c = Measure([&] {
+        large = !large;
+        for (HWND bar : n.bars) {
+            SendMessageA(bar, TB_SETBITMAPSIZE, 0, large ? MAKELPARAM(24, 23) : MAKELPARAM(16, 15));
+            SendMessageA(bar, TB_SETBUTTONSIZE, 0, large ? MAKELPARAM(36, 33) : MAKELPARAM(24, 22));
+            SendMessageA(bar, TB_AUTOSIZE, 0, 0);
+        }
+        Pump();
+        UpdateAll(n.bars);
+    });
+    Row("one scale change (96 <-> 144 DPI), 4 toolbars", q, c);
+    DestroyNativeScene(n);
+    DestroyScene(s);
+}
+
+// A toolbar of 100 buttons made in the top dock of a frame and destroyed
+// again, the queue drained after each; beside a comctl32 bar of 100 buttons
+// made and destroyed. The spread matters here: every run should fit a frame.
+void BenchCreate() {
+    Header("Create + destroy a toolbar of 100 buttons");
+    Scene s = MakeScene(0, 0, false);
+    std::vector<UINT> ids(100);
+    for (UINT i = 0; i < 100; ++i)
+        ids[i] = kFirstId + i;
+    Stats q = Measure([&] {
+        HWND pane =
+            QBR_CreateToolbar("Made", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, s.dock, ids.data(), static_cast<UINT>(ids.size()));
+        Pump();
+        UpdateWindow(pane);
+        QBR_DestroyToolbar(pane);
+        Pump();
+    });
+    NativeScene n = MakeNativeScene(0, 0, false);
+    Stats c = Measure([&] {
+        HWND bar = MakeNativeBar(n.frame, n.strip, 0, 100, kFirstId, false);
+        Pump();
+        UpdateWindow(bar);
+        DestroyWindow(bar);
+        Pump();
+    });
+    Row("create + destroy, 100 buttons, top dock", q, c);
+    DestroyNativeScene(n);
+    DestroyScene(s);
+}
+
 } // namespace
 
 int main(int argc, char **argv) {
     bool quick = false;
-    std::string only; // a section name: state, text, drop, layout, growth, keys, close, profile
+    std::string only; // a section name: state, text, drop, layout, growth, keys, close, scale, create, profile
     for (int i = 1; i < argc; ++i) {
         if (lstrcmpA(argv[i], "--quick") == 0)
             quick = true;
@@ -951,11 +1163,16 @@ int main(int argc, char **argv) {
     if (wanted("state")) BenchStateChanges();
     if (wanted("text")) BenchButtonText();
     if (wanted("drop")) BenchDrop();
-    if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 200} : std::vector<UINT>{4, 200, 1000});
+    if (wanted("layout")) BenchLayout(quick ? std::vector<UINT>{4, 20, 200} : std::vector<UINT>{4, 20, 200, 1000});
     if (wanted("growth")) BenchGrowth();
     if (wanted("keys")) BenchKeys();
     if (wanted("close")) BenchDestroyAndLongLines();
+    if (wanted("scale")) BenchScale();
+    if (wanted("create")) BenchCreate();
     if (wanted("profile")) {
+        ProfileCreate();
+        ProfileScale();
+        ProfileText();
         ProfileApply(200);
         if (!quick) ProfileApply(1000);
     }

@@ -261,6 +261,10 @@ UINT PackDock(DockArea *dock) {
         // a taller one pulls the row's bottom up one more pixel.
         row.bottom -= 1;
     }
+    // A pane that waited for this packing with a new size, and was not
+    // moved, is sized now, before the dock and the frame hear of it.
+    for (UINT i = 0; ToolbarRecord *toolbar = ListAt<ToolbarRecord>(dock->toolbars, i); ++i)
+        PlaceWaitingWindow(toolbar->paneWindow);
     overall.left = 0;
     overall.top = 0;
     PlaceDock(dock->window, &overall);
@@ -347,7 +351,8 @@ void FitSideDocksAboveBottom(ToolbarManager *manager) {
     for (UINT i = 0; DockArea *dock = ListAt<DockArea>(manager->docks, i); ++i) {
         if (IsAcrossDock(dock->side)) continue;
         RECT r = RectInParent(dock->window);
-        if (r.bottom != bottom)
+        // A dock not packed yet (still of no width) takes its height when it is.
+        if (r.bottom != bottom && r.right > r.left)
             SetWindowPos(dock->window, nullptr, 0, 0, r.right - r.left, bottom - r.top,
                          SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
     }

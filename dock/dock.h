@@ -26,6 +26,8 @@ UINT RewrapAllManagers(int newWidth, int newHeight);
 UINT RewrapManagerToolbars(ToolbarManager *manager, int newWidth, int newHeight);
 UINT RelayoutAllManagers();
 UINT RelayoutManagerToolbars(ToolbarManager *manager);
+// Packs every dock of the manager, those across the frame first.
+UINT PackManagerDocks(ToolbarManager *manager);
 // Measures a manager's toolbars again for another display scale, each
 // keeping its items and rows; 0 when the scale is 0 or unchanged.
 UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi);

@@ -43,9 +43,18 @@ UINT RelayoutManagerToolbars(ToolbarManager *manager) {
             ComputeRowBreaks(pane, ROLE_DOCKED);
         }
     }
+    return PackManagerDocks(manager);
+}
+
+UINT PackManagerDocks(ToolbarManager *manager) {
+    if (!manager) return 0;
     for (bool top : {true, false})
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             if (IsAcrossDock(dock->side) == top) PackDock(dock);
+    // Every pane stands in a dock's list, so the packings placed every pane
+    // that waited; this catches any that did not.
+    for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
+        PlaceWaitingWindow(record->paneWindow);
     return 1;
 }
 
@@ -58,7 +67,11 @@ UINT RescaleManagerToolbars(ToolbarManager *manager, UINT dpi) {
     int width = 0, height = 0;
     GetButtonSizes(&width, &height, nullptr, nullptr);
     manager->dpi = dpi;
-    RewrapManagerToolbars(manager, width, height);
+    {
+        // The panes take their new sizes as the packing places them.
+        DeferDockPacking deferred;
+        RewrapManagerToolbars(manager, width, height);
+    }
     if (manager->imageResource) ChooseImageStrip(manager);
     RelayoutManagerToolbars(manager);
     return 1;

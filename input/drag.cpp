@@ -20,8 +20,10 @@ void BeginToolbarDrag(HWND window, int x, int y) {
 // The floating frame goes to the drag frame's corner and keeps its own size,
 // which need not be the frame's if the drag began on the pane.
 static void MoveFloatingFrame(HWND window) {
-    SetWindowPos(ResolveRoleWindow(window, ROLE_FLOATING), nullptr, mouseTrack.dragFrame.left, mouseTrack.dragFrame.top,
-                 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+    RECT r;
+    GetToolbarWindowRect(window, ROLE_FLOATING, &r);
+    OffsetRect(&r, mouseTrack.dragFrame.left - r.left, mouseTrack.dragFrame.top - r.top);
+    MoveToolbarWindow(window, ROLE_FLOATING, &r);
 }
 
 static void DropOutsideDocks(HWND window, HWND pane) {

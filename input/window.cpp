@@ -30,6 +30,7 @@ static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
 
 static void OnSize(HWND window) {
     InvalidateRect(window, nullptr, TRUE);
+    if (ToolbarWindowsInCreation()) return;
     RefitToolbar(window, ROLE_SELF);
 }
 
@@ -87,6 +88,7 @@ static HWND sizingFrame = nullptr; // the frame whose border the user holds
 static bool refittingStep = false;
 
 static LRESULT OnWindowPosChanged(HWND window, WPARAM wParam, LPARAM lParam) {
+    WaitingWindowPlacedByOthers(window, reinterpret_cast<const WINDOWPOS *>(lParam));
     AccessWindowPosChanged(window, reinterpret_cast<const WINDOWPOS *>(lParam));
     if (!borderSizing || window != sizingFrame || refittingStep) return 0;
     refittingStep = true;
@@ -205,6 +207,9 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         WithCursor(window, wParam, OnToolbarRightUp);
         return 0;
     case WM_SHOWWINDOW: // the platform also hides and shows owned frames here
+        // A hidden frame's place is taken before anyone sees it (its owner
+        // restored shows it without the library).
+        if (wParam) PlaceWaitingWindow(window);
         AccessShowWindow(window, wParam, lParam);
         return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETOBJECT:

@@ -252,8 +252,7 @@ static void KeepRoomInsideBorders(HWND frame, UINT writtenDpi, RECT *rect) {
     // The borders this frame has, measured: under Wine every window has the
     // screen's, whatever scale its monitor is said to have. Of a frame sized
     // below its borders only the platform's numbers tell them.
-    GetWindowRect(frame, &outer);
-    GetClientRect(frame, &client);
+    GetPlacedRects(frame, &outer, &client);
     int nowWidth = (outer.right - outer.left) - client.right, nowHeight = (outer.bottom - outer.top) - client.bottom;
     if (client.right <= 0 || client.bottom <= 0) {
         RECT platform = {0, 0, 0, 0};
@@ -308,14 +307,15 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
     // all those moves (quadratic in a value's length). A title in a dock's
     // value that names the dock's own key reads on from that same cursor.
     std::vector<LPSTR> cursors(values, values + count);
-    for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
-        UINT dockIndex;
-        if (!FindLayoutIndex(keys, count, DockKey(side), &dockIndex)) continue;
-        HWND dock = QBR_CreateDock(manager, frame, side);
-        if (!dock) continue;
-        {
-            DeferDockPacking once;
-            while (*cursors[dockIndex]) {
+    {
+        // Every dock is packed once, with its toolbars, not empty first, and
+        // the docks across the frame before those between them at its sides.
+        DeferDockPacking once;
+        for (UINT side = DOCK_TOP; side <= DOCK_BOTTOM; ++side) {
+            UINT dockIndex;
+            if (!FindLayoutIndex(keys, count, DockKey(side), &dockIndex)) continue;
+            HWND dock = QBR_CreateDock(manager, frame, side);
+            while (dock && *cursors[dockIndex]) {
                 // Cut in place: the title stays readable until the values are
                 // tidied up below.
                 LPCSTR title = NextToken(&cursors[dockIndex]);
@@ -323,8 +323,8 @@ UINT ApplyLayoutRecords(ToolbarManager *manager, HWND frame, LPSTR *keys, LPSTR 
                 if (FindLayoutIndex(keys, count, title, &index)) RestoreToolbarAt(dock, title, &cursors[index]);
             }
         }
-        RelayoutDock(dock);
     }
+    PackManagerDocks(manager);
     for (UINT i = 0; i < count; ++i)
         TakeTokensRead(values[i], cursors[i]);
     return 1;
@@ -364,9 +364,10 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
         HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
         if (!frame) continue;
         RECT r;
-        GetWindowRect(frame, &r);
-        SetWindowPos(frame, nullptr, MulDiv(r.left, width, written.screenWidth),
-                     MulDiv(r.top, height, written.screenHeight), 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+        GetToolbarWindowRect(frame, ROLE_FLOATING, &r);
+        OffsetRect(&r, MulDiv(r.left, width, written.screenWidth) - r.left,
+                   MulDiv(r.top, height, written.screenHeight) - r.top);
+        MoveToolbarWindow(frame, ROLE_FLOATING, &r);
     }
 }
 

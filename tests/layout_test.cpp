@@ -1,10 +1,13 @@
 // The layout table: a frame's arrangement as text, and docks and toolbars built back.
+#include <algorithm>
+#include <array>
 #include <cstring>
 #include <map>
 #include <random>
 #include <vector>
 
 #include "harness.h"
+#include "modal.h" // TextOf
 #include "paint/paint.h"
 #include "quaybar.h"
 #include "toolbar/toolbar.h"
@@ -32,6 +35,24 @@ Entries Read(UINT count) {
 Entries Capture(ToolbarManager *manager) {
     UINT count = 0;
     return QBR_CaptureLayout(manager, &count) ? Read(count) : Entries();
+}
+
+// Every move, size, show and paint of the thread's windows: {moves, sizes, shows, paints}.
+std::map<HWND, std::array<int, 4>> acts;
+LRESULT CALLBACK CountSent(int code, WPARAM wParam, LPARAM lParam) {
+    const CWPSTRUCT *m = reinterpret_cast<const CWPSTRUCT *>(lParam);
+    if (code == HC_ACTION && m->message == WM_WINDOWPOSCHANGING) {
+        const UINT f = reinterpret_cast<const WINDOWPOS *>(m->lParam)->flags;
+        std::array<int, 4> &a = acts[m->hwnd];
+        a[0] += !(f & SWP_NOMOVE), a[1] += !(f & SWP_NOSIZE), a[2] += (f & SWP_SHOWWINDOW) != 0;
+    }
+    if (code == HC_ACTION && m->message == WM_PAINT) ++acts[m->hwnd][3];
+    return CallNextHookEx(nullptr, code, wParam, lParam);
+}
+LRESULT CALLBACK CountPosted(int code, WPARAM wParam, LPARAM lParam) {
+    const MSG *m = reinterpret_cast<const MSG *>(lParam);
+    if (code == HC_ACTION && wParam == PM_REMOVE && m->message == WM_PAINT) ++acts[m->hwnd][3];
+    return CallNextHookEx(nullptr, code, wParam, lParam);
 }
 
 class LayoutTest : public FrameTest {
@@ -89,7 +110,14 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
                        {"Bottom Dock", "Low"}}),
               (Entries{entries[0], entries[1], entries[2], entries[3], entries[5]}));
     EXPECT_EQ("ColumnLow", entries[4].first + entries[6].first);
+    acts.clear();
+    const HHOOK hooks[] = {SetWindowsHookExA(WH_CALLWNDPROC, CountSent, nullptr, GetCurrentThreadId()),
+                           SetWindowsHookExA(WH_GETMESSAGE, CountPosted, nullptr, GetCurrentThreadId())};
     ToolbarManager *other = Restore(entries);
+    for (HHOOK hook : hooks)
+        UnhookWindowsHookEx(hook);
+    for (const auto &a : acts) // no window moved, sized, shown or painted twice by an apply
+        EXPECT_LE(*std::max_element(a.second.begin(), a.second.end()), 1) << TextOf(a.first) << " " << a.first;
     EXPECT_EQ(entries, Capture(other));
     EXPECT_EQ(nullptr, QBR_GetDock(other, DOCK_RIGHT)) << "no key, no dock";
     EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(QBR_GetToolbar(other, 1), ROLE_FLOATING)));

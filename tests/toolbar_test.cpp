@@ -174,6 +174,10 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     Pump();
     for (HWND w : windows)
         EXPECT_EQ(0, heardBy[w]) << "window " << (std::find(windows.begin(), windows.end(), w) - windows.begin());
+    QBR_SetButtonText(1); // every pane grows: the next of the row is placed once, by the packing
+    EXPECT_EQ(1, heardBy[next]);
+    QBR_SetButtonText(0);
+    Pump();
     const int fx = GetSystemMetrics(SM_CXFRAME), fy = GetSystemMetrics(SM_CYFRAME); // a frame's sizing borders
     const RECT places[] = {WindowRectInParent(docked), WindowRectInParent(Frame(docked)), WindowRectInParent(next)};
     EXPECT_EQ(Rect(0, 0, 102 + 12 + 2 * fx, 22 + 6 + 2 * fy + captionHeight), places[1]) << "the docked one's frame";
@@ -194,6 +198,15 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     SetWindowPos(Frame(floating), nullptr, 0, 0, natural.right - natural.left, 2, SWP_NOMOVE | SWP_NOZORDER);
     RefitToolbar(floating, ROLE_FLOATING);
     EXPECT_EQ(natural, WindowRectInParent(Frame(floating))) << "a frame sized below its borders gets its height back";
+    Watch(WM_WINDOWPOSCHANGING, {Frame(docked)});
+    RemoveItem(RecordOfWindow(docked), Item(8));
+    EXPECT_EQ(0, heardBy[Frame(docked)]) << "a hidden frame is placed only as it shows";
+    const RECT placed = WindowRectInParent(Frame(docked));
+    QBR_SetToolbarFlags(docked, V | F);
+    RECT shown;
+    GetWindowRect(Frame(docked), &shown);
+    EXPECT_EQ(1, heardBy[Frame(docked)]);
+    EXPECT_EQ(placed, shown);
     Watch(0);
     EXPECT_EQ(0u, InsertItemAt(RecordOfWindow(docked), 0, Item(2))) << "a button stands once in a toolbar";
     const std::vector<UINT> cleaned[][2] = {{{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S, S}, {}}};

@@ -222,7 +222,7 @@ const ShownLayout &LayoutOf(const ToolbarRecord *record) {
     ShownLayout &layout = shownLayouts[record];
     HWND window = ResolveRoleWindow(record->paneWindow, ROLE_ACTIVE);
     RECT client = {};
-    if (window) GetClientRect(window, &client);
+    if (window) GetPlacedRects(window, nullptr, &client);
     const UINT count = PointerListCount(record->items);
     const ScaledMetrics &metrics = *ToolbarMetrics(record);
     int bw = 0, bh = 0;

@@ -58,6 +58,7 @@ void DestroyToolbarRecord(ToolbarRecord *record) {
     // A later window may get this pane's handle: the lookup cache must not
     // hand it this toolbar's manager.
     ForgetToolbarWindow(record->paneWindow);
+    ForgetWaitingWindow(ResolveRoleWindow(record->paneWindow, ROLE_FLOATING));
     ForgetShownLayout(record, true);
     MemoryBlockFree(record);
 }

@@ -67,6 +67,8 @@ UINT InsertionIndexAtPoint(const ToolbarRecord *record, int x, int y, UINT *outI
 
 // ---- The window pair ----------------------------------------------------------
 HWND CreateToolbarWindows(HWND dock, LPCSTR title);
+// True inside CreateToolbarWindows, while the pair is being made.
+bool ToolbarWindowsInCreation();
 HWND ResolveRoleWindow(HWND window, int role);
 UINT IsFloatingFrame(HWND window);
 UINT IsToolbarPane(HWND window);
@@ -77,6 +79,15 @@ void ForgetToolbarWindow(HWND window); // drops the ManagerOfToolbar cache entry
 void ForgetManager(const ToolbarManager *manager);
 HWND DockOfToolbar(HWND window);
 UINT IsSideDocked(HWND window);
+// The outer rectangle (screen coordinates) and the client rectangle of a
+// toolbar window where the library placed it: a hidden floating frame is put
+// there only as it shows, a shown pane sized while packing is deferred only
+// as the packing places it (PlaceWaitingWindow puts a window there now), and
+// both read so until then.
+void GetPlacedRects(HWND window, RECT *outer, RECT *client);
+void PlaceWaitingWindow(HWND window);
+void ForgetWaitingWindow(HWND window);
+void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos);
 void GetToolbarWindowRect(HWND window, int role, RECT *rect);
 void GetItemArea(HWND window, int role, RECT *rect);
 void MoveToolbarWindow(HWND window, int role, const RECT *rect);

@@ -3,6 +3,7 @@
 // one and show the other, and every edit refits both.
 #include <algorithm>
 #include <initializer_list>
+#include <unordered_map>
 
 #include "core/callbacks.h"
 #include "core/core.h"
@@ -14,6 +15,7 @@ const char kToolbarClassName[] = "QBR_ToolbarWindow";
 constexpr DWORD kPaneStyle = WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN | WS_BORDER;
 
 static HWND cachedToolbarPane = nullptr;
+static int windowsInCreation = 0;
 static ToolbarManager *cachedToolbarManager = nullptr;
 
 // ---- Identity -------------------------------------------------------------------
@@ -114,9 +116,17 @@ HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
         wc.lpszClassName = kToolbarClassName;
         if (!RegisterClassA(&wc)) return nullptr;
     }
-    // The pane's WM_CREATE makes the floating frame and the record.
-    return CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
+    // The pane's WM_CREATE makes the floating frame and the record. The
+    // WM_SIZE that creation sends is no refit: the items set next size both
+    // windows (SizeToolbarWindows), and an empty pane sized here would be
+    // sized, and its dock packed, once more for nothing.
+    ++windowsInCreation;
+    HWND pane = CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
+    --windowsInCreation;
+    return pane;
 }
+
+bool ToolbarWindowsInCreation() { return windowsInCreation != 0; }
 
 // ---- Coordinates ----------------------------------------------------------------
 
@@ -161,11 +171,162 @@ static bool SettleRole(HWND &window, int &role) {
     return role == ROLE_DOCKED || role == ROLE_FLOATING;
 }
 
+static int Width(const RECT &r) { return r.right - r.left; }
+static int Height(const RECT &r) { return r.bottom - r.top; }
+
+// ---- Places that wait -------------------------------------------------------------
+//
+// A floating frame is a top-level window, and moving or sizing one costs a
+// round trip to the window system even while it is hidden (under Wine its X
+// window and window-manager hints are configured again each time: about ten
+// times a child window's cost). A docked toolbar's frame is hidden, often for
+// the toolbar's whole life, yet every edit, new button size and scale change
+// refits it. So the library keeps the place it gives a hidden frame here and
+// puts the window there once, just before it shows. Everything the library
+// reads of a frame (its rectangle, its client area, its item area) comes
+// from this place while it waits, so rows, sizes and stored layouts come out
+// as if the window had been moved at once.
+//
+// A shown pane whose size changes while its dock's packing is deferred (a new
+// button size or scale for every toolbar) waits the same way, for the
+// packing: that places it once, moved and sized in one call, where it would
+// otherwise be sized now and moved again a moment later.
+namespace {
+struct WaitingPlace {
+    HWND twin;   // the twin when the place was taken: a handle used again is not this window
+    RECT outer;  // screen coordinates
+    SIZE around; // what the window system puts around the client area
+};
+std::unordered_map<HWND, WaitingPlace> waitingPlaces;
+} // namespace
+
+static const WaitingPlace *WaitingPlaceOf(HWND window) {
+    if (waitingPlaces.empty() || !window) return nullptr;
+    auto found = waitingPlaces.find(window);
+    if (found == waitingPlaces.end()) return nullptr;
+    if (found->second.twin != GetTwinWindow(window)) {
+        waitingPlaces.erase(found);
+        return nullptr;
+    }
+    return &found->second;
+}
+
+void GetPlacedRects(HWND window, RECT *outer, RECT *client) {
+    if (const WaitingPlace *place = WaitingPlaceOf(window)) {
+        if (outer) *outer = place->outer;
+        if (client)
+            *client = RECT{0, 0, std::max<int>(0, place->outer.right - place->outer.left - place->around.cx),
+                           std::max<int>(0, place->outer.bottom - place->outer.top - place->around.cy)};
+        return;
+    }
+    if (outer) GetWindowRect(window, outer);
+    if (client) GetClientRect(window, client);
+}
+
+// Takes a place for a hidden frame, or a new size for a shown pane while
+// packing is deferred; false when the window is to be placed at once.
+static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized) {
+    if (IsFloatingFrame(window)) {
+        if (IsWindowVisible(window)) return false;
+    } else if (moved || !DeferDockPacking::Active() || !IsToolbarPane(window) || !IsWindowVisible(window)) {
+        return false;
+    }
+    WaitingPlace place;
+    if (const WaitingPlace *waiting = WaitingPlaceOf(window)) {
+        place = *waiting;
+    } else {
+        RECT client;
+        GetWindowRect(window, &place.outer);
+        GetClientRect(window, &client);
+        // Of a window without a client area only the platform's numbers tell
+        // the borders, at the window's scale.
+        RECT borders;
+        WindowBordersAt(static_cast<DWORD>(GetWindowLongA(window, GWL_STYLE)),
+                        static_cast<DWORD>(GetWindowLongA(window, GWL_EXSTYLE)), WindowDpi(window), &borders);
+        const int width = place.outer.right - place.outer.left, height = place.outer.bottom - place.outer.top;
+        place.around.cx = client.right > 0 ? width - client.right : borders.right - borders.left;
+        place.around.cy = client.bottom > 0 ? height - client.bottom : borders.bottom - borders.top;
+        place.twin = GetTwinWindow(window);
+    }
+    RECT &outer = place.outer;
+    if (moved) OffsetRect(&outer, target.left - outer.left, target.top - outer.top);
+    if (sized) {
+        // As the window system would size a window with a sizing border: no
+        // larger than its largest tracking size (the toolbar window asks
+        // for no smallest).
+        const bool border = IsFloatingFrame(window) != 0;
+        outer.right = outer.left + (border ? std::min<int>(Width(target), GetSystemMetrics(SM_CXMAXTRACK)) : Width(target));
+        outer.bottom =
+            outer.top + (border ? std::min<int>(Height(target), GetSystemMetrics(SM_CYMAXTRACK)) : Height(target));
+    }
+    waitingPlaces[window] = place;
+    return true;
+}
+
+// Puts a waiting frame at its place, with `insertAfter` and `flags` added
+// (SWP_NOZORDER when it keeps its place in the z-order): one window call, so
+// a frame shown after it waited is moved, sized and shown at once.
+static void PlaceFrame(HWND frame, HWND insertAfter, UINT flags) {
+    const WaitingPlace *waiting = WaitingPlaceOf(frame);
+    if (!waiting) {
+        SetWindowPos(frame, insertAfter, 0, 0, 0, 0, flags | SWP_NOMOVE | SWP_NOSIZE);
+        return;
+    }
+    const RECT outer = waiting->outer;
+    RECT client;
+    GetPlacedRects(frame, nullptr, &client);
+    waitingPlaces.erase(frame);
+    SetWindowPos(frame, insertAfter, outer.left, outer.top, Width(outer), Height(outer), flags);
+    // The rows were made for the client area the frame was to have; if the
+    // window system gave it another, they are made again.
+    RECT now;
+    GetClientRect(frame, &now);
+    if (!EqualRect(&now, &client)) ComputeRowBreaks(frame, ROLE_FLOATING);
+}
+
+static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized);
+
+void PlaceWaitingWindow(HWND window) {
+    if (!WaitingPlaceOf(window)) return;
+    if (IsFloatingFrame(window))
+        PlaceFrame(window, nullptr, SWP_NOZORDER | SWP_NOACTIVATE);
+    else
+        PlaceWindow(window, RECT{}, false, false); // a pane: placed as the packing places it
+}
+
+void ForgetWaitingWindow(HWND window) {
+    if (window) waitingPlaces.erase(window);
+}
+
+// Someone else moved or sized a window that waits (the window system, a host
+// that holds its handle): what they changed is the window's now, the rest of
+// the waiting place stays. Shown so, it takes the rest of its place at once.
+void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos) {
+    auto found = waitingPlaces.find(window);
+    if (!pos || found == waitingPlaces.end()) return;
+    if (pos->flags & SWP_SHOWWINDOW) {
+        PlaceWaitingWindow(window);
+        return;
+    }
+    WaitingPlace &place = found->second;
+    RECT real, client;
+    GetWindowRect(window, &real);
+    if (!(pos->flags & SWP_NOMOVE)) OffsetRect(&place.outer, real.left - place.outer.left, real.top - place.outer.top);
+    if (!(pos->flags & SWP_NOSIZE)) {
+        place.outer.right = place.outer.left + Width(real);
+        place.outer.bottom = place.outer.top + Height(real);
+        GetClientRect(window, &client);
+        if (client.right > 0) place.around.cx = Width(real) - client.right;
+        if (client.bottom > 0) place.around.cy = Height(real) - client.bottom;
+    }
+    if (EqualRect(&place.outer, &real)) waitingPlaces.erase(found);
+}
+
 void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
     if (!SettleRole(window, role)) return;
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
-    GetWindowRect(target, rect);
+    GetPlacedRects(target, rect, nullptr);
     if (role == ROLE_DOCKED) ScreenRectToClient(GetParent(target), rect);
 }
 
@@ -183,13 +344,11 @@ void GetItemArea(HWND window, int role, RECT *rect) {
     HWND target = ResolveRoleWindow(window, role);
     if (!target) return;
     RECT client;
-    GetClientRect(target, &client);
+    GetPlacedRects(target, nullptr, &client);
     const RECT margins = AreaMargins(target, role);
     *rect = RECT{margins.left, margins.top, client.right - margins.right, client.bottom - margins.bottom};
 }
 
-static int Width(const RECT &r) { return r.right - r.left; }
-static int Height(const RECT &r) { return r.bottom - r.top; }
 
 // SetWindowPos for the library's own moves: never activating, never touching
 // the z-order, and only with the parts that change.
@@ -199,7 +358,21 @@ static int Height(const RECT &r) { return r.bottom - r.top; }
 // moves. The same parts are marked instead (the pane with its border, and the
 // dock surface it left) and painted together by the next update: the dock's,
 // at the end of the packing, or the pane's own after a refit.
-static void PlaceWindow(HWND window, const RECT &target, bool moved, bool sized) {
+static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized) {
+    if (WaitToPlace(window, placing, moved, sized)) return;
+    RECT target = placing;
+    if (const WaitingPlace *waiting = WaitingPlaceOf(window)) {
+        // What waited goes with this placing, in the same call.
+        RECT place = waiting->outer;
+        if (GetWindowLongA(window, GWL_STYLE) & WS_CHILD) ScreenRectToClient(GetParent(window), &place);
+        if (!moved) OffsetRect(&target, place.left - target.left, place.top - target.top);
+        if (!sized) {
+            target.right = target.left + Width(place);
+            target.bottom = target.top + Height(place);
+        }
+        moved = sized = true;
+        waitingPlaces.erase(window);
+    }
     UINT flags = SWP_NOZORDER | SWP_NOACTIVATE;
     if (!moved) flags |= SWP_NOMOVE;
     if (!sized) flags |= SWP_NOSIZE;
@@ -240,7 +413,7 @@ static SIZE OutsideItemArea(HWND target, int role) {
     RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
-    GetClientRect(target, &client);
+    GetPlacedRects(target, nullptr, &client);
     RECT borders = {0, 0, 0, 0};
     AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
                        static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
@@ -288,12 +461,11 @@ static RECT NearestWorkArea(const RECT &rect) {
 // Moves a window into the nearest work area by the shortest way, its size kept.
 static void MoveIntoWorkArea(HWND window) {
     RECT r;
-    GetWindowRect(window, &r);
+    GetPlacedRects(window, &r, nullptr);
     const RECT work = NearestWorkArea(r);
     const int x = std::max<int>(work.left, std::min<int>(r.left, work.right - Width(r)));
     const int y = std::max<int>(work.top, std::min<int>(r.top, work.bottom - Height(r)));
-    if (x != r.left || y != r.top)
-        SetWindowPos(window, nullptr, x, y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+    if (x != r.left || y != r.top) PlaceWindow(window, RECT{x, y, x + Width(r), y + Height(r)}, true, false);
 }
 
 // A floating frame is never larger than the work area of its monitor, so
@@ -303,7 +475,7 @@ static void MoveIntoWorkArea(HWND window) {
 // measured again here when it does not fit. True when it did not.
 static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *measured) {
     RECT outer;
-    GetWindowRect(frame, &outer);
+    GetPlacedRects(frame, &outer, nullptr);
     const RECT work = NearestWorkArea(outer);
     const SIZE outside = OutsideItemArea(frame, ROLE_FLOATING);
     const int mostWidth = Width(work) - outside.cx, mostHeight = Height(work) - outside.cy;
@@ -326,7 +498,7 @@ static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *me
 void KeepFloatingFrameOnScreen(HWND frame) {
     if (!IsFloatingFrame(frame)) return;
     RECT r;
-    GetWindowRect(frame, &r);
+    GetPlacedRects(frame, &r, nullptr);
     if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
     MoveIntoWorkArea(frame);
 }
@@ -345,7 +517,10 @@ static void SizePaneToNatural(HWND pane, int width, int height) {
     const RECT paneMargins = AreaMargins(pane, ROLE_DOCKED);
     RECT paneSize = {0, 0, width + paneMargins.left + paneMargins.right + 2 * GetSystemMetrics(SM_CXBORDER),
                      height + paneMargins.top + paneMargins.bottom + 2 * GetSystemMetrics(SM_CYBORDER)};
-    PlaceWindow(pane, paneSize, false, true);
+    RECT present;
+    GetToolbarWindowRect(pane, ROLE_DOCKED, &present);
+    if (Width(present) != Width(paneSize) || Height(present) != Height(paneSize))
+        PlaceWindow(pane, paneSize, false, true);
     ComputeRowBreaks(pane, ROLE_DOCKED);
 }
 
@@ -482,7 +657,7 @@ static void ShowWithoutActivating(HWND window) {
         ShowWindow(window, SW_SHOWNA);
         return;
     }
-    SetWindowPos(window, HWND_TOP, 0, 0, 0, 0, SWP_NOMOVE | SWP_NOSIZE | SWP_NOACTIVATE | SWP_SHOWWINDOW);
+    PlaceFrame(window, HWND_TOP, SWP_NOACTIVATE | SWP_SHOWWINDOW);
     HWND owner = GetWindow(window, GW_OWNER);
     if (owner && !IsWindowVisible(owner)) SetTimer(window, kWaitForOwnerTimer, kRestackPeriod, nullptr);
 }

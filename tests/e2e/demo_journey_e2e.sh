@@ -10,9 +10,10 @@ set -u
 
 main_section() { tr -d '\r' <"$ini" | awk '/^\[/ { inside = ($0 == "[Main Layout]"); next } inside && NF'; }
 # Every toolbar window and the top dock, sorted; side-docked panes are left
-# out (a restart measures them anew; in_side_dock checks those).
+# out (a restart measures them anew; in_side_dock checks those), and hidden
+# frames (placed only as they show; the stored lines keep their places).
 arrangement() {
-    { ctl toolbars "$main" | grep -v -e '^pane .* Standard$' -e '^pane .* Palette$'; dock_rect "$main" top | sed 's/^/top dock /'; } | sort
+    { ctl toolbars "$main" | grep -v -e '^pane .* Standard$' -e '^pane .* Palette$' -e '^frame 0 '; dock_rect "$main" top | sed 's/^/top dock /'; } | sort
 }
 # Pane $1 is shown inside the dock on side $2.
 in_side_dock() {

@@ -135,9 +135,11 @@ void FrameTest::AddButtons(UINT first, UINT count) {
 
 HWND FrameTest::MakeDock(UINT side) { return QBR_CreateDock(manager, frame, side); }
 
+// Where the library placed the window: a hidden floating frame goes there
+// when it shows.
 RECT WindowRectInParent(HWND window) {
     RECT r;
-    GetWindowRect(window, &r);
+    GetPlacedRects(window, &r, nullptr);
     if (GetWindowLongA(window, GWL_STYLE) & WS_CHILD) {
         HWND parent = GetParent(window);
         POINT a = {r.left, r.top}, b = {r.right, r.bottom};
@@ -150,7 +152,7 @@ RECT WindowRectInParent(HWND window) {
 
 RECT ClientRectOf(HWND window) {
     RECT r;
-    GetClientRect(window, &r);
+    GetPlacedRects(window, nullptr, &r);
     return r;
 }
 
