@@ -43,18 +43,7 @@ read -r v l2 _ <<<"$(toolbar_rect "$main" pane Style)"
 [ "$l2" = "$sl" ] || [ "$l2" -lt "$sl" ] || fail "Style did not close the gap: $sl -> $l2"
 shot journey-1-torn-off
 
-# ---- No stored layout: only a top dock; drops at the side edges only move frames ----
 [ -z "$(dock_rect "$main" left)$(dock_rect "$main" right)" ] || fail "a side dock exists on a first start"
-read -r x y <<<"$(caption_point $fl $ft $fr $fb)"
-ldrag $x $y $((ml + 4 + 10)) $((mt + 150))
-read -r fv fl2 ft2 _ <<<"$(toolbar_rect "$main" frame Standard)"
-[ "$fv" = 1 ] && [ "$fl2" -lt 100 ] || fail "Standard's frame did not follow to the left edge: $fv $fl2"
-read -r v l t r b <<<"$(toolbar_rect "$main" frame Palette)"
-read -r x y <<<"$(caption_point $l $t $r $b)"
-ldrag $x $y $((mr - 4 - 10)) $((mt + 150))
-read -r fv fl2 _ <<<"$(toolbar_rect "$main" frame Palette)"
-[ "$fv" = 1 ] && [ "$fl2" -gt 600 ] || fail "Palette's frame did not follow to the right edge: $fv $fl2"
-shot journey-2-no-side-docks
 stop_demo "first close"
 [ "$(ini_value 'Main Layout' 'Top Dock')" = "Standard,Style,Align,Palette" ] || fail "top dock line: $(ini_value 'Main Layout' 'Top Dock')"
 case "$(ini_value 'Main Layout' Standard)" in 10,101,102,104,0,107,108,109,0,106,151,33,*) ;;

@@ -47,6 +47,15 @@ static void PrintWindowLine(HWND window, const char *kind) {
            r.top, r.right, r.bottom, kind ? " " : "", kind ? title : "");
 }
 
+/* "left top right bottom visible" of a window. */
+static int PrintRect(HWND window) {
+    RECT r;
+    if (!window) return 1;
+    GetWindowRect(window, &r);
+    printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(window) ? 1 : 0);
+    return 0;
+}
+
 static BOOL CALLBACK PrintToolbarChild(HWND child, LPARAM unused) {
     (void)unused;
     if (IsClass(child, "QBR_ToolbarWindow")) PrintWindowLine(child, "pane");
@@ -128,27 +137,11 @@ int main(int argc, char **argv) {
     }
     if (strcmp(argv[1], "close") == 0) return PostMessageA(window, WM_CLOSE, 0, 0) ? 0 : 1;
     if (strcmp(argv[1], "childrect") == 0 && argc > 3) {
-        RECT r;
         wantedTitle = argv[3];
         EnumChildWindows(window, MatchChild, 0);
-        if (!foundChild) return 1;
-        GetWindowRect(foundChild, &r);
-        printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(foundChild) ? 1 : 0);
-        return 0;
+        return PrintRect(foundChild);
     }
-    if (strcmp(argv[1], "statusrect") == 0) {
-        RECT r;
-        HWND bar = FindWindowExA(window, NULL, "StatusBar", NULL);
-        if (!bar) return 1;
-        GetWindowRect(bar, &r);
-        printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(bar) ? 1 : 0);
-        return 0;
-    }
-    if (strcmp(argv[1], "rect") == 0) {
-        RECT r;
-        GetWindowRect(window, &r);
-        printf("%ld %ld %ld %ld %d\n", r.left, r.top, r.right, r.bottom, IsWindowVisible(window) ? 1 : 0);
-        return 0;
-    }
+    if (strcmp(argv[1], "statusrect") == 0) return PrintRect(FindWindowExA(window, NULL, "StatusBar", NULL));
+    if (strcmp(argv[1], "rect") == 0) return PrintRect(window);
     return 2;
 }
