@@ -3,8 +3,10 @@
 #include <cstring>
 #include <tuple>
 
+#include "command/command.h"
 #include "core/core.h"
 #include "harness.h"
+#include "toolbar/toolbar.h"
 
 extern "C" int CallsFromC(void);
 TEST(CApiTest, HeaderIsUsableFromC) { EXPECT_EQ(1, CallsFromC()); }
@@ -66,4 +68,38 @@ TEST(ClientLifeTest, DefaultsTheModuleInstanceAndEverythingBack) {
     }
     QBR_GetLiveCounts(&blocksAfter, &objectsAfter);
     EXPECT_EQ(std::make_pair(blocks, objects), std::make_pair(blocksAfter, objectsAfter)) << "blocks, GDI objects";
+}
+
+// A host may pump between QBR_DestroyManager and its frame's end: the docks hide and tell the frame at
+// once and name no manager; a press under way, paints and clicks then find nothing and tell nothing.
+TEST_F(FrameTest, ADestroyedManagerLeavesNoWindowOnFreedRecords) {
+    AddButtons(1, 8);
+    HWND top = MakeDock(DOCK_TOP), left = MakeDock(DOCK_LEFT);
+    const UINT ids[] = {1, 2, 0, 3}, six = 6, eight = 8;
+    HWND docked = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, ids, 4);
+    HWND column = QBR_CreateToolbar("C", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, left, &six, 1);
+    HWND floating = QBR_CreateToolbar("F", TBF_VISIBLE | TBF_FLOATING, 300, 200, 0, 0, top, &eight, 1);
+    Pump();
+    RECT button;
+    GetItemRect(RecordOfWindow(docked), 0, &button);
+    POINT on = {(button.left + button.right) / 2, (button.top + button.bottom) / 2};
+    ClientToScreen(docked, &on);
+    SendMouse(WM_LBUTTONDOWN, on, MK_LBUTTON);
+    ClearFrameLog();
+    QBR_DestroyManager(manager);
+    manager = nullptr;
+    EXPECT_EQ(2, CountHeard(WM_SIZE)) << Describe(FrameLog());
+    EXPECT_FALSE(IsWindowVisible(top) || IsWindowVisible(left));
+    EXPECT_EQ(nullptr, mouseTrack.hitItem) << "the pressed item is freed";
+    EXPECT_EQ(0, GetWindowLongPtrA(top, 0) | GetWindowLongPtrA(left, 0)) << "a dock names the freed manager";
+    ClearFrameLog();
+    SendMouse(WM_LBUTTONUP, on, 0);
+    EXPECT_EQ(nullptr, GetCapture()) << "the release still ends the press";
+    for (HWND window : {docked, column, floating, ResolveRoleWindow(floating, ROLE_FLOATING), top}) {
+        RedrawWindow(window, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE | RDW_UPDATENOW);
+        for (UINT m : {UINT(WM_LBUTTONDBLCLK), UINT(WM_RBUTTONDOWN), UINT(WM_RBUTTONUP), UINT(WM_SIZE)})
+            SendMessageA(window, m, 0, MAKELPARAM(3, 3));
+    }
+    Pump();
+    EXPECT_TRUE(FrameLog().empty()) << Describe(FrameLog());
 }

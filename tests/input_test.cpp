@@ -218,4 +218,36 @@ TEST_F(InputTest, SizingByTheBorderInManyStepsEndsAsOneRefit) {
     }
     EXPECT_EQ(0u, borderSizing);
 }
+// Another window was active: a real click on a toolbar brings the host back with its floating frames
+// above it in their own order (A, shown again last, on top: a restack in list order would bury it).
+TEST_F(InputTest, FloatingFramesKeepTheirOrderAboveTheHost) {
+    HWND docked = Make({1, 2}), a = Make({3, 4}, V | F), b = Make({5}, V | F), c = Make({6}, V | F);
+    QBR_SetToolbarFlags(a, H);
+    QBR_SetToolbarFlags(a, V | F);
+    auto frameOf = [](HWND pane) { return ResolveRoleWindow(pane, ROLE_FLOATING); };
+    const std::vector<HWND> order = {frameOf(a), frameOf(c), frameOf(b), frame};
+    auto stacking = [&] { // the order's windows, topmost first
+        std::vector<HWND> out;
+        for (HWND w = GetTopWindow(nullptr); w; w = GetWindow(w, GW_HWNDNEXT))
+            if (std::find(order.begin(), order.end(), w) != order.end()) out.push_back(w);
+        return out;
+    };
+    PumpFor(3 * kRestackPeriod);
+    ASSERT_EQ(order, stacking());
+    HWND other = CreateWindowExA(0, "STATIC", "Other", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 500, 200, 400, 300, nullptr,
+                                 nullptr, nullptr, nullptr);
+    SetForegroundWindow(other);
+    PumpFor(3 * kRestackPeriod);
+    POINT p = Centre(ItemRect(docked, 1));
+    ClientToScreen(docked, &p);
+    PlaceCursor(p);
+    SendButton(MOUSEEVENTF_LEFTDOWN), SendButton(MOUSEEVENTF_LEFTUP);
+    for (int round = 0; round < 400 && CountHeard(WM_COMMAND) == 0; ++round)
+        PumpFor(5);
+    PumpFor(3 * kRestackPeriod);
+    EXPECT_EQ(order, stacking());
+    EXPECT_EQ(frame, GetActiveWindow());
+    DestroyWindow(other);
+}
+
 } // namespace
