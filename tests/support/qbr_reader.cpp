@@ -16,6 +16,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -121,64 +122,58 @@ std::vector<HWND> ShownToolbars(HWND main) {
     return search.found;
 }
 
-IAccessible *ObjectOf(HWND window) {
-    IAccessible *object = nullptr;
-    if (FAILED(AccessibleObjectFromWindow(window, static_cast<DWORD>(OBJID_CLIENT), IID_IAccessible,
-                                          reinterpret_cast<void **>(&object))))
-        return nullptr;
-    return object;
+// Calls `act` with each shown toolbar's object until it gives an exit code (-1: go on).
+int EachToolbar(HWND main, const std::function<int(HWND, IAccessible *)> &act) {
+    for (HWND window : ShownToolbars(main)) {
+        IAccessible *object = nullptr;
+        if (FAILED(AccessibleObjectFromWindow(window, static_cast<DWORD>(OBJID_CLIENT), IID_IAccessible,
+                                              reinterpret_cast<void **>(&object))))
+            return 2;
+        const int result = act(window, object);
+        object->Release();
+        if (result >= 0) return result;
+    }
+    return -1;
 }
 
 int List(HWND main) {
-    for (HWND window : ShownToolbars(main)) {
-        IAccessible *object = ObjectOf(window);
-        if (!object) return 2;
+    const int result = EachToolbar(main, [](HWND, IAccessible *object) {
         LONG count = 0;
         object->get_accChildCount(&count);
         std::printf("%s \"%s\"\n", Role(object, CHILDID_SELF).c_str(), Name(object, CHILDID_SELF).c_str());
         for (LONG id = 1; id <= count; ++id)
             std::printf("  %ld %s \"%s\" %s \"%s\"\n", id, Role(object, id).c_str(), Name(object, id).c_str(),
                         State(object, id).c_str(), Action(object, id).c_str());
-        object->Release();
-    }
-    return 0;
+        return -1;
+    });
+    return result < 0 ? 0 : result;
 }
 
 int Focus(HWND main) {
-    for (HWND window : ShownToolbars(main)) {
-        IAccessible *object = ObjectOf(window);
-        if (!object) return 2;
+    const int result = EachToolbar(main, [main](HWND window, IAccessible *object) {
         VARIANT focus;
         VariantInit(&focus);
-        if (object->get_accFocus(&focus) == S_OK && focus.vt == VT_I4 && focus.lVal > 0 &&
-            (StateBits(object, focus.lVal) & STATE_SYSTEM_FOCUSED)) {
-            // A frame other than the named one is told: each frame has its own toolbars.
-            char frame[128] = "";
-            HWND root = GetAncestor(window, GA_ROOTOWNER);
-            if (root != main) GetWindowTextA(root, frame, sizeof frame);
-            std::printf("%s: %s%s%s%s\n", Name(object, CHILDID_SELF).c_str(), Name(object, focus.lVal).c_str(),
-                        *frame ? " [" : "", frame, *frame ? "]" : "");
-            object->Release();
-            return 0;
-        }
-        object->Release();
-    }
-    std::printf("none\n");
-    return 0;
+        if (object->get_accFocus(&focus) != S_OK || focus.vt != VT_I4 || focus.lVal <= 0 ||
+            !(StateBits(object, focus.lVal) & STATE_SYSTEM_FOCUSED))
+            return -1;
+        // A frame other than the named one is told: each frame has its own toolbars.
+        char frame[128] = "";
+        HWND root = GetAncestor(window, GA_ROOTOWNER);
+        if (root != main) GetWindowTextA(root, frame, sizeof frame);
+        std::printf("%s: %s%s%s%s\n", Name(object, CHILDID_SELF).c_str(), Name(object, focus.lVal).c_str(),
+                    *frame ? " [" : "", frame, *frame ? "]" : "");
+        return 0;
+    });
+    if (result < 0) std::printf("none\n");
+    return result < 0 ? 0 : result;
 }
 
-int Do(HWND main, const char *toolbar, LONG id) {
-    for (HWND window : ShownToolbars(main)) {
-        IAccessible *object = ObjectOf(window);
-        if (!object) return 2;
-        if (Name(object, CHILDID_SELF) == toolbar) {
-            HRESULT hr = object->accDoDefaultAction(Child(id));
-            object->Release();
-            return SUCCEEDED(hr) ? 0 : 2;
-        }
-        object->Release();
-    }
-    return 1;
+int Do(HWND main, const std::string &toolbar, LONG id) {
+    const int result = EachToolbar(main, [&](HWND, IAccessible *object) {
+        if (Name(object, CHILDID_SELF) != toolbar) return -1;
+        return SUCCEEDED(object->accDoDefaultAction(Child(id))) ? 0 : 2;
+    });
+    return result < 0 ? 1 : result;
 }
 
 } // namespace
