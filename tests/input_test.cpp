@@ -250,4 +250,27 @@ TEST_F(InputTest, FloatingFramesKeepTheirOrderAboveTheHost) {
     DestroyWindow(other);
 }
 
+// The drag frame: four 2-pixel strips without overlap, inverted through a checker whose rows are
+// 0xAA, 0x55, ... from the screen's origin (a pixel where x + y is even); drawn twice, it is gone.
+TEST_F(InputTest, TheDragFrameIsAnExactCheckerOfFourStrips) {
+    for (const RECT &f : {Rect(300, 200, 340, 230), Rect(301, 201, 338, 227), Rect(320, 221, 324, 226)}) {
+        const RECT area = {f.left - 4, f.top - 4, f.right + 4, f.bottom + 4};
+        RECT inside = f;
+        InflateRect(&inside, -2, -2);
+        const Pixels before = ReadScreenPixels(area);
+        DrawDragFrame(&f);
+        const Pixels now = ReadScreenPixels(area);
+        int wrong = 0;
+        for (int y = 0; y < now.height; ++y)
+            for (int x = 0; x < now.width; ++x) {
+                const POINT s = {area.left + x, area.top + y};
+                const bool inverted = PtInRect(&f, s) && !PtInRect(&inside, s) && (s.x + s.y) % 2 == 0;
+                wrong += now.At(x, y) != (inverted ? before.At(x, y) ^ 0xFFFFFF : before.At(x, y));
+            }
+        EXPECT_EQ(0, wrong) << f;
+        DrawDragFrame(&f);
+        EXPECT_TRUE(ReadScreenPixels(area).colors == before.colors) << "drawn twice " << f;
+    }
+}
+
 } // namespace
