@@ -7,6 +7,7 @@
 
 #include <map>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "access/access.h"
@@ -137,11 +138,9 @@ class AccessTest : public FrameTest {
     // Where the keyboard is: "title index", or "host".
     std::string Focus() const {
         char title[64];
-        for (UINT i = 0, index; HWND pane = QBR_GetToolbar(manager, i); ++i) {
-            if (!AccessFocusedIndex(pane, &index)) continue;
-            QBR_GetToolbarTitle(pane, title, sizeof title);
-            return std::string(title) + " " + std::to_string(index);
-        }
+        for (UINT i = 0, index; HWND pane = QBR_GetToolbar(manager, i); ++i)
+            if (AccessFocusedIndex(pane, &index))
+                return QBR_GetToolbarTitle(pane, title, sizeof title), title + (" " + std::to_string(index));
         return "host";
     }
     HWND top = nullptr;
@@ -179,10 +178,9 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
         {CHILDID_SELF, ROLE_SYSTEM_TOOLBAR, "Tools", "(none)", "(none)", DISP_E_MEMBERNOTFOUND},
     };
     for (const auto &item : items) {
-        EXPECT_EQ(item.role, reader.Role(item.child)) << item.child;
-        EXPECT_EQ(item.name, reader.Name(item.child)) << item.child;
-        EXPECT_EQ(item.description, reader.Description(item.child)) << item.child;
-        EXPECT_EQ(item.action, reader.Action(item.child)) << item.child;
+        const LONG c = item.child;
+        EXPECT_EQ(std::make_tuple(item.role, std::string(item.name), std::string(item.description), item.action),
+                  std::make_tuple(reader.Role(c), reader.Name(c), reader.Description(c), reader.Action(c)));
     }
     QBR_SetButtonEnabled(manager, 4, 0);
     for (const auto &item : items)
@@ -214,9 +212,9 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
         events.clear();
         row.set(manager, row.id, row.value);
         PumpFor(50); // out-of-context events arrive through the queue
-        EXPECT_EQ(row.heard, events) << "row " << &row - rows;
-        EXPECT_EQ(row.state1, reader.State(1)) << "row " << &row - rows;
-        EXPECT_EQ(row.state3, reader.State(3)) << "row " << &row - rows;
+        EXPECT_EQ(std::make_tuple(row.heard, row.state1, row.state3),
+                  std::make_tuple(events, reader.State(1), reader.State(3)))
+            << "row " << &row - rows;
     }
     // A mouse press draws its pressed look without the catalog: it is told too.
     events.clear();

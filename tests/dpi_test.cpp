@@ -249,6 +249,7 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
         if (!fresh) EXPECT_GT((other - here) * (LabelInk(pixels[0][1], ItemRects(pane)[0]) - before), 0) << before;
     }
     QBR_SetButtonText(0);
+    EXPECT_EQ(GetSysColor(COLOR_ACTIVECAPTION), pixels[0][2].At(pixels[0][2].width - 2, 1)) << "band, active or not";
     for (size_t i = 0; i < 3; ++i) {
         EXPECT_EQ(rects[1][i], rects[0][i]) << "dock, docked toolbar, floating frame: " << i;
         int differ = 0;
