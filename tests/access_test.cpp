@@ -1,14 +1,13 @@
-// Screen readers and the keyboard on real toolbars. The accessible objects
-// are read as a reader reads them (AccessibleObjectFromWindow, then the
-// IAccessible calls); events are caught by a real WinEvent hook; keys are
-// real input through a loop that hands every message to
-// QBR_TranslateToolbarKey first, as a host's loop does.
+// Screen readers and the keyboard on real toolbars: objects read as a reader
+// reads them, events from a real WinEvent hook, keys as real input through a
+// host's loop (QBR_TranslateToolbarKey first).
 #include <ole2.h>
 
 #include <oleacc.h>
 
+#include <map>
 #include <string>
-#include <utility>
+#include <tuple>
 #include <vector>
 
 #include "access/access.h"
@@ -21,8 +20,7 @@
 namespace {
 
 void SendKey(WORD vk, bool up) {
-    INPUT in = {};
-    in.type = INPUT_KEYBOARD;
+    INPUT in = {INPUT_KEYBOARD};
     in.ki.wVk = vk;
     in.ki.dwFlags = (up ? KEYEVENTF_KEYUP : 0) | (vk == VK_APPS ? KEYEVENTF_EXTENDEDKEY : 0);
     SendInput(1, &in, sizeof in);
@@ -31,28 +29,21 @@ void SendKey(WORD vk, bool up) {
 
 // A key pressed and let go; "+" before its name holds Shift, "^" Ctrl.
 void Key(const std::string &name) {
-    static const std::pair<const char *, WORD> kKeys[] = {
-        {"F6", VK_F6},     {"Esc", VK_ESCAPE}, {"Left", VK_LEFT},    {"Right", VK_RIGHT},  {"Up", VK_UP},
-        {"Down", VK_DOWN}, {"Home", VK_HOME},  {"End", VK_END},      {"Tab", VK_TAB},      {"F10", VK_F10},
-        {"A", 'A'},        {"Apps", VK_APPS},  {"Enter", VK_RETURN}, {"Delete", VK_DELETE}};
+    static const std::map<std::string, WORD> kKeys = {
+        {"F6", VK_F6},     {"Esc", VK_ESCAPE}, {"Left", VK_LEFT},    {"Right", VK_RIGHT}, {"Up", VK_UP},
+        {"Down", VK_DOWN}, {"Home", VK_HOME},  {"End", VK_END},      {"Tab", VK_TAB},     {"F10", VK_F10},
+        {"A", 'A'},        {"Apps", VK_APPS},  {"Delete", VK_DELETE}};
     const WORD held = name[0] == '+' ? VK_SHIFT : name[0] == '^' ? VK_CONTROL : 0;
-    for (const auto &k : kKeys)
-        if (name.substr(held ? 1 : 0) == k.first) {
-            if (held) SendKey(held, false);
-            SendKey(k.second, false);
-            SendKey(k.second, true);
-            if (held) SendKey(held, true);
-            return;
-        }
-    ADD_FAILURE() << "no key " << name;
+    const WORD vk = kKeys.at(name.substr(held ? 1 : 0));
+    if (held) SendKey(held, false);
+    SendKey(vk, false);
+    SendKey(vk, true);
+    if (held) SendKey(held, true);
 }
 
 VARIANT Child(LONG id) {
     VARIANT v;
-    VariantInit(&v);
-    v.vt = VT_I4;
-    v.lVal = id;
-    return v;
+    return VariantInit(&v), v.vt = VT_I4, v.lVal = id, v;
 }
 
 // An object read as a reader reads it: text ("(none)" where there is none),
@@ -65,9 +56,7 @@ struct Reader {
     explicit Reader(HWND window) {
         AccessibleObjectFromWindow(window, DWORD(OBJID_CLIENT), IID_IAccessible, reinterpret_cast<void **>(&object));
     }
-    ~Reader() {
-        if (object) object->Release();
-    }
+    ~Reader() { object && object->Release(); }
     std::string Str(HRESULT hr) const {
         if (hr != S_OK || !text) return hr == S_FALSE ? "(none)" : "(error)";
         char buffer[256] = "";
@@ -90,8 +79,7 @@ struct Reader {
     HRESULT Do(LONG id) const { return object->accDoDefaultAction(Child(id)); }
 };
 
-// What a reader heard, as "state 2; focus host 0; ": the event, "host" when
-// it came from the host's frame, and the child.
+// What a reader heard, as "state 2; focus host 0; " ("host": from the host's frame).
 std::string events;
 HWND host = nullptr;
 
@@ -108,10 +96,7 @@ std::string LastFocus() {
 }
 
 UINT SetRadioPair(ToolbarManager *m, UINT first, UINT on) { return QBR_SetRadioRange(m, first, first + 1, on); }
-UINT SetFlags(ToolbarManager *m, UINT, UINT flags) {
-    QBR_SetToolbarFlags(QBR_GetToolbar(m, 0), flags);
-    return 1;
-}
+UINT SetFlags(ToolbarManager *m, UINT, UINT flags) { return QBR_SetToolbarFlags(QBR_GetToolbar(m, 0), flags), 1; }
 
 class AccessTest : public FrameTest {
   protected:
@@ -143,24 +128,19 @@ class AccessTest : public FrameTest {
         HWND pane =
             QBR_CreateToolbar(title, flags, 300, 250, width, 0, dock ? dock : top, ids.data(), UINT(ids.size()));
         Pump();
-        ClearFrameLog();
-        events.clear();
-        return pane;
+        return ClearFrameLog(), events.clear(), pane;
     }
     static RECT ScreenItem(HWND pane, UINT index) {
         RECT r = {};
         GetItemRect(RecordOfWindow(pane), index, &r);
-        ClientRectToScreen(ResolveRoleWindow(pane, ROLE_ACTIVE), &r);
-        return r;
+        return ClientRectToScreen(ResolveRoleWindow(pane, ROLE_ACTIVE), &r), r;
     }
     // Where the keyboard is: "title index", or "host".
     std::string Focus() const {
         char title[64];
-        for (UINT i = 0, index; HWND pane = QBR_GetToolbar(manager, i); ++i) {
-            if (!AccessFocusedIndex(pane, &index)) continue;
-            QBR_GetToolbarTitle(pane, title, sizeof title);
-            return std::string(title) + " " + std::to_string(index);
-        }
+        for (UINT i = 0, index; HWND pane = QBR_GetToolbar(manager, i); ++i)
+            if (AccessFocusedIndex(pane, &index))
+                return QBR_GetToolbarTitle(pane, title, sizeof title), title + (" " + std::to_string(index));
         return "host";
     }
     HWND top = nullptr;
@@ -173,8 +153,7 @@ Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
 using Heards = std::vector<Heard>;
 
 // Each item as a reader reads it, its default action a click completed from
-// the message loop; each change of its state is there when a reader asks,
-// and told once.
+// the loop; each change of its state is there when asked, and told once.
 TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
     for (UINT id : {3u, 5u, 6u})
         QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
@@ -199,10 +178,9 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
         {CHILDID_SELF, ROLE_SYSTEM_TOOLBAR, "Tools", "(none)", "(none)", DISP_E_MEMBERNOTFOUND},
     };
     for (const auto &item : items) {
-        EXPECT_EQ(item.role, reader.Role(item.child)) << item.child;
-        EXPECT_EQ(item.name, reader.Name(item.child)) << item.child;
-        EXPECT_EQ(item.description, reader.Description(item.child)) << item.child;
-        EXPECT_EQ(item.action, reader.Action(item.child)) << item.child;
+        const LONG c = item.child;
+        EXPECT_EQ(std::make_tuple(item.role, std::string(item.name), std::string(item.description), item.action),
+                  std::make_tuple(reader.Role(c), reader.Name(c), reader.Description(c), reader.Action(c)));
     }
     QBR_SetButtonEnabled(manager, 4, 0);
     for (const auto &item : items)
@@ -234,9 +212,9 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
         events.clear();
         row.set(manager, row.id, row.value);
         PumpFor(50); // out-of-context events arrive through the queue
-        EXPECT_EQ(row.heard, events) << "row " << &row - rows;
-        EXPECT_EQ(row.state1, reader.State(1)) << "row " << &row - rows;
-        EXPECT_EQ(row.state3, reader.State(3)) << "row " << &row - rows;
+        EXPECT_EQ(std::make_tuple(row.heard, row.state1, row.state3),
+                  std::make_tuple(events, reader.State(1), reader.State(3)))
+            << "row " << &row - rows;
     }
     // A mouse press draws its pressed look without the catalog: it is told too.
     events.clear();
@@ -246,10 +224,9 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
     SendMouse(WM_LBUTTONUP, Centre(ScreenItem(pane, 2)), 0);
 }
 
-// Every item a user can see has its place, and a hit test there finds it;
-// items out of sight are read so and have no place: cut off behind the
-// chevron, on the docked copy of a floating toolbar, or a separator the
-// floating frame does not draw.
+// Every item seen has its place and a hit test there finds it; items out of
+// sight (cut off, on the docked copy of a floating toolbar, a separator the
+// floating frame leaves out) are read so and have none.
 TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
     const LONG O = STATE_SYSTEM_OFFSCREEN, I = STATE_SYSTEM_INVISIBLE;
     const UINT docked = TBF_VISIBLE | TBF_DOCKED, floating = TBF_VISIBLE | TBF_FLOATING;
@@ -295,8 +272,6 @@ TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
     }
 }
 
-// ---- The keyboard ---------------------------------------------------------------------------
-
 TEST_F(AccessTest, KeysWalkTheButtonsRowsAndToolbarsInOrder) {
     QBR_SetButtonEnabled(manager, 3, 0);
     QBR_SetButtonEnabled(manager, 8, 0);
@@ -338,9 +313,8 @@ TEST_F(AccessTest, KeysWalkTheButtonsRowsAndToolbarsInOrder) {
 }
 
 // The focused button is read focused, announced, shows the focus rectangle 3
-// pixels inside it and, after one period, its quick help tip below it; Space
-// presses it as the left button does, and a press let go after moving away is
-// no click.
+// pixels inside and, after one period, its tip below; Space presses it as the
+// left button does, and let go after moving away is no click.
 TEST_F(AccessTest, SpacePressesTheFocusedButtonAsTheLeftButtonDoes) {
     QBR_SetQuickHelp(1);
     HWND pane = Make("Tools", {1, 2}), help = CurrentClient()->helpWindow;
@@ -374,11 +348,10 @@ TEST_F(AccessTest, SpacePressesTheFocusedButtonAsTheLeftButtonDoes) {
     EXPECT_EQ(0u, QBR_IsButtonPressed(manager, 1));
 }
 
-// The window focus never leaves the host while the toolbars have the
-// keyboard, so the platform says nothing when it comes back: the library
-// announces the host's window (not when another window takes the activation:
-// the platform tells that). A closed toolbar menu announces the button again.
-// Keys the toolbars do not use are the host's: its accelerators see them.
+// The window focus stays with the host while the toolbars have the keyboard,
+// so the library announces the host when it comes back (unless another window
+// is activated: the platform tells that); a closed toolbar menu announces the
+// button again; keys the toolbars do not use are the host's.
 TEST_F(AccessTest, LeavingTheToolbarsGivesTheKeyboardBackAndAnnouncesIt) {
     HWND pane = Make("Tools", {1, 2});
     Make("Other", {3});
@@ -442,11 +415,10 @@ TEST_F(AccessTest, LeavingTheToolbarsGivesTheKeyboardBackAndAnnouncesIt) {
     EXPECT_EQ("Other 0", Focus());
 }
 
-// With customising on, Ctrl+Left/Right move the focused button and Delete
-// removes it; a reader finds the new order and hears each change as the
-// platform's own lists tell it (the item made or taken away, then the new
-// order), and is told the keys as each button's shortcut. Locked, Ctrl+arrows
-// only walk, Delete is the host's, and the toolbar reads as locked.
+// Customising, Ctrl+Left/Right move the focused button and Delete removes it;
+// a reader finds the new order, hears each change as the platform's lists
+// tell it, and reads the keys as the shortcut. Locked, Ctrl+arrows only walk,
+// Delete is the host's, and the toolbar reads as locked.
 TEST_F(AccessTest, CtrlArrowsMoveAndDeleteRemovesTheFocusedButton) {
     QBR_SetCustomize(1);
     HWND pane = Make("Tools", {1, 2, 0, 3});

@@ -1,6 +1,5 @@
-// The library at the display scale of the prefix it runs in. CTest runs this
-// program in the build folder's own prefix (96 DPI) and in its 144- and
-// 192-DPI prefixes, QBR_EXPECT_DPI naming the scale it was started for.
+// The library at the display scale of the prefix it runs in: CTest runs it at
+// 96, 144 and 192 DPI, QBR_EXPECT_DPI naming the scale it was started for.
 #include <algorithm>
 #include <cstdlib>
 #include <set>
@@ -22,9 +21,8 @@ int ScreenDpi() {
     return dpi;
 }
 
-// What 96-DPI pixels come to at each scale, and the strip that MAIN (drawn
-// at 100 and 150 %) gives there; SINGLE, drawn at 100 % only, is enlarged by
-// the whole factor dpi / 96.
+// What 96-DPI pixels come to at each scale, and the strip MAIN (drawn at 100
+// and 150 %) gives there; SINGLE (100 % only) is enlarged by dpi / 96 whole.
 struct Scaled {
     int dpi, buttonWidth, buttonHeight, imageWidth, imageHeight, textWidth, textHeight;
     int areaLeft, paneTop, paneBottom, frameTop, frameBottom, separator;
@@ -50,8 +48,7 @@ Pixels BitmapPixels(HBITMAP bitmap) {
 Pixels StripResource(const char *name) {
     HBITMAP bitmap = LoadImageStrip(nullptr, FindResourceA(nullptr, name, RT_BITMAP));
     const Pixels out = BitmapPixels(bitmap);
-    DeleteObject(bitmap);
-    return out;
+    return DeleteObject(bitmap), out;
 }
 
 std::vector<RECT> ItemRects(HWND pane) {
@@ -62,8 +59,8 @@ std::vector<RECT> ItemRects(HWND pane) {
     return rects;
 }
 
-// The client rectangle of a floating frame of `rows` rows of `across` buttons:
-// its caption band as tall as a 7-point font's ascent at the scale, then a line.
+// The client of a floating frame of `rows` rows of `across` buttons: its
+// caption band a 7-point font's ascent at the scale, then a line.
 RECT FloatingClient(const Scaled &s, int across, int rows) {
     HDC screen = GetDC(nullptr);
     HGDIOBJ old = SelectObject(screen, CreateFontA(-MulDiv(7, s.dpi, 72), 0, 0, 0, 400, 0, 0, 0, 0, 0, 0, 0,
@@ -101,31 +98,25 @@ class ScaleTest : public FrameTest {
     const Scaled &s = At(ScreenDpi());
 };
 
+const UINT kNine[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+
 // A frame standing on a monitor of `dpi`, its manager with buttons 1 to 9.
 struct Host {
     explicit Host(int dpi) : frame(CreateRecordingFrame()), manager(QBR_CreateManager(frame)) {
-        const UINT ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
-        QBR_AddButtons(manager, ids, 9);
+        QBR_AddButtons(manager, kNine, 9);
         if (dpi != ScreenDpi()) QBR_DpiChanged(frame, MAKEWPARAM(dpi, dpi), 0);
     }
-    ~Host() {
-        QBR_DestroyManager(manager);
-        DestroyWindow(frame);
-        Pump();
-    }
+    ~Host() { QBR_DestroyManager(manager), DestroyWindow(frame), Pump(); }
     HWND frame;
     ToolbarManager *manager;
 };
 
 } // namespace
 
-// ---- Sizes and images at the frame's scale ------------------------------------------------------
-
-// Buttons, margins and separators grow with the scale (the host's own sizes
-// are 96-DPI pixels too), neighbours still sharing one pixel column. A button
-// shows the strip drawn for the scale, else the nearest smaller one enlarged
-// by a whole factor: pixel for pixel the resource, each pixel a whole square
-// (nothing blurred), centred in the button.
+// Buttons, margins and separators grow with the scale (the host's sizes too),
+// neighbours sharing one column; a button shows the strip drawn for the scale,
+// else the nearest smaller one enlarged by a whole factor, pixel for pixel in
+// whole squares, centred.
 TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
     char value[16] = ""; // the scale this run was started for: a prefix that lost it would pass at 96
     ASSERT_EQ(GetEnvironmentVariableA("QBR_EXPECT_DPI", value, sizeof value) ? atoi(value) : 96, s.dpi);
@@ -156,7 +147,6 @@ TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
         EXPECT_EQ((std::vector<RECT>{Rect(l, t, l + bw, t + bh), Rect(sep, t, sep + s.separator, t + bh),
                                      Rect(two, t, two + bw, t + bh), Rect(three, t, three + bw, t + bh)}),
                   rects);
-        // The pane is its items, its margins and the border the platform gives.
         const RECT outer = WindowRectInParent(pane);
         EXPECT_EQ(three + bw + l + 2 * GetSystemMetrics(SM_CXBORDER), outer.right - outer.left);
         EXPECT_EQ(t + bh + s.paneBottom + 2 * GetSystemMetrics(SM_CYBORDER), outer.bottom - outer.top);
@@ -178,10 +168,9 @@ TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
     QBR_SetButtonText(0);
 }
 
-// The chevron of a toolbar cut off at the usable area's edge is 13 pixels
-// wide at 96 DPI and grows with the scale; its » is drawn in squares of whole
-// pixels (1 at 96 and 144, 2 at 192). Each line of its menu shows its own
-// button's image at the scale, pixel for pixel the one its button shows.
+// The chevron is 13 pixels wide at 96 DPI and grows with the scale, its » in
+// whole-pixel squares (2 at 192); each menu line shows its button's image at
+// the scale, pixel for pixel.
 TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
     HWND pane = Make({1, 2, 3, 4, 5, 6});
@@ -225,14 +214,9 @@ TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     EXPECT_GE(lines, 2);
 }
 
-// ---- A new scale for a frame ------------------------------------------------------------------
-
-// A frame moved to another scale (WM_DPICHANGED handed to the library, as the
-// README's host does) takes the suggested rectangle, and every dock, pane and
-// floating frame has the rectangle and the pixels of one made at that scale
-// (whose sizes the other tests check), so the floating toolbar keeps its
-// place and its three rows of three; the labels grow or shrink with the
-// scale (their font's ink, as installed).
+// A frame moved to another scale takes the suggested rectangle, and every
+// dock, pane and floating frame has the rectangle and pixels of one made at
+// that scale (three rows of three kept); the labels' ink grows or shrinks.
 TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
     const int here = ScreenDpi(), other = here == 96 ? 144 : here == 144 ? 192 : 96;
     RECT suggested = {60, 50, 760, 500};
@@ -245,11 +229,11 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
         Host h(fresh ? other : here);
         QBR_SetImageStrip(h.manager, "SINGLE");
         HWND top = QBR_CreateDock(h.manager, h.frame, DOCK_TOP);
-        const UINT docked[] = {1, 2, 0, 3}, ids[] = {1, 2, 3, 4, 5, 6, 7, 8, 9};
+        const UINT docked[] = {1, 2, 0, 3};
         HWND pane = QBR_CreateToolbar("Docked", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, top, docked, 4);
         // Three and a half labelled buttons wide at 96 DPI: three across at every scale.
         const int width = 3 * 47 + 25 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME);
-        HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 300, width, 0, top, ids, 9);
+        HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 300, width, 0, top, kNine, 9);
         Pump();
         if (!fresh) before = LabelInk(ReadWindowPixels(pane), ItemRects(pane)[0]);
         if (!fresh) QBR_DpiChanged(h.frame, MAKEWPARAM(other, other), LPARAM(&suggested));
@@ -265,6 +249,7 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
         if (!fresh) EXPECT_GT((other - here) * (LabelInk(pixels[0][1], ItemRects(pane)[0]) - before), 0) << before;
     }
     QBR_SetButtonText(0);
+    EXPECT_EQ(GetSysColor(COLOR_ACTIVECAPTION), pixels[0][2].At(pixels[0][2].width - 2, 1)) << "band, active or not";
     for (size_t i = 0; i < 3; ++i) {
         EXPECT_EQ(rects[1][i], rects[0][i]) << "dock, docked toolbar, floating frame: " << i;
         int differ = 0;
@@ -274,12 +259,9 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
     }
 }
 
-// ---- Floating frames across scales and screens ---------------------------------------------------
-
 namespace {
 
-// A floating toolbar's stored value: its frame sized for `across` buttons at
-// `dpi`, standing at (x, y).
+// A floating toolbar's stored value: its frame sized for `across` buttons at `dpi`, at (x, y).
 std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int x, int y) {
     RECT borders = {0, 0, 0, 0}; // the frame's border as a system at that scale gives it
     AdjustWindowRectExForDpi(&borders, WS_POPUP | WS_BORDER | WS_THICKFRAME, FALSE, 0, UINT(dpi));
@@ -294,14 +276,11 @@ std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int
 
 } // namespace
 
-// A table written at one scale and read at another, or read and then the
-// frame moved to another scale: a row of four and three rows of three keep
-// their rows, stand where they stood in proportion to the screen the table
-// was written on, and each frame is as large as its rows at the scale it ends
-// at. A frame with no part on any screen comes back inside the nearest
-// monitor's work area, then and when the display changes; one with a part on
-// a screen stays (negative coordinates and all, as on a monitor left of the
-// primary one). The table written back names its scale unless it is 96 DPI.
+// A table read at another scale, or read and the frame then moved: frames keep
+// their rows, stand in proportion to the screen written on, are as large as
+// their rows at the final scale; one on no screen comes back inside the work
+// area (then and at a display change), one partly on a screen stays. The
+// table written back names its scale unless 96 DPI.
 TEST_F(ClientTest, FloatingFramesSurviveEveryChangeOfScaleAndScreen) {
     const int other = ScreenDpi() == 96 ? 144 : ScreenDpi(), w = GetSystemMetrics(SM_CXSCREEN);
     const int h = GetSystemMetrics(SM_CYSCREEN);
@@ -365,8 +344,6 @@ TEST_F(ClientTest, FloatingFramesSurviveEveryChangeOfScaleAndScreen) {
     }
 }
 
-// ---- Colour schemes at this scale -------------------------------------------------------------
-
 // The weakest pair of a set of ink colours against a set of background colours.
 double Weakest(const std::set<COLORREF> &ink, const std::set<COLORREF> &back) {
     double weakest = ink.empty() || back.empty() ? 0 : 21;
@@ -376,12 +353,10 @@ double Weakest(const std::set<COLORREF> &ink, const std::set<COLORREF> &back) {
     return weakest;
 }
 
-// Every state of a button, with and without its label, in the dark and the
-// high-contrast scheme, read back from the pane: each glyph pixel against
-// every colour the glyph's background shows (the face, the dither's squares,
-// an inverted face) at least 3:1, and the label's strongest pixel against
-// that background at least 4.5:1. Ink and background are told apart by the
-// stored strip, which the high-contrast scheme loads with its own colours.
+// Every state, with and without labels, dark and high contrast, read back:
+// each glyph pixel against every colour of its background at least 3:1, the
+// label's strongest pixel at least 4.5:1 (ink and background told apart by
+// the stored strip).
 TEST_F(ScaleTest, EveryStateReadsClearlyInTheDarkAndHighContrastSchemes) {
     AddButtons(7, 2);
     SetWindowPos(frame, nullptr, 0, 0, 1000, 300, SWP_NOZORDER | SWP_NOACTIVATE); // eight labelled buttons at 200 %

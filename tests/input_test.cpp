@@ -253,6 +253,11 @@ TEST_F(InputTest, FloatingFramesKeepTheirOrderAboveTheHost) {
 // The drag frame: four 2-pixel strips without overlap, inverted through a checker whose rows are
 // 0xAA, 0x55, ... from the screen's origin (a pixel where x + y is even); drawn twice, it is gone.
 TEST_F(InputTest, TheDragFrameIsAnExactCheckerOfFourStrips) {
+    auto ReadScreenPixels = [](const RECT &r) {
+        HDC screen = GetDC(nullptr);
+        const Pixels out = ReadPixelsFrom(screen, r.left, r.top, r.right - r.left, r.bottom - r.top);
+        return ReleaseDC(nullptr, screen), out;
+    };
     for (const RECT &f : {Rect(300, 200, 340, 230), Rect(301, 201, 338, 227), Rect(320, 221, 324, 226)}) {
         const RECT area = {f.left - 4, f.top - 4, f.right + 4, f.bottom + 4};
         RECT inside = f;

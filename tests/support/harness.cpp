@@ -10,12 +10,9 @@
 
 void Pump() {
     MSG msg;
-    for (int round = 0; round < 3; ++round) {
-        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
-            TranslateMessage(&msg);
-            DispatchMessageA(&msg);
-        }
-    }
+    for (int round = 0; round < 3; ++round)
+        while (PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE))
+            TranslateMessage(&msg), DispatchMessageA(&msg);
 }
 
 void PumpFor(DWORD ms) {
@@ -45,10 +42,7 @@ static std::vector<Heard> frameLog;
 std::vector<Heard> &FrameLog() { return frameLog; }
 void ClearFrameLog() { frameLog.clear(); }
 int CountHeard(UINT message) {
-    int n = 0;
-    for (const Heard &h : frameLog)
-        n += h.message == message;
-    return n;
+    return int(std::count_if(frameLog.begin(), frameLog.end(), [&](const Heard &h) { return h.message == message; }));
 }
 
 std::string Describe(const std::vector<Heard> &messages) {
@@ -65,28 +59,24 @@ std::string Describe(const std::vector<Heard> &messages) {
 }
 
 static LRESULT CALLBACK RecordingFrameProc(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
-    switch (message) {
-    case WM_COMMAND:
-    case kPressMessage:
-    case kReleaseMessage:
-        frameLog.push_back({message, wParam, lParam});
-        return 0;
-    case WM_SIZE:
-        frameLog.push_back({message, wParam, lParam});
-        break;
-    }
-    return DefWindowProcA(window, message, wParam, lParam);
+    const bool handled = message == WM_COMMAND || message == kPressMessage || message == kReleaseMessage;
+    if (handled || message == WM_SIZE) frameLog.push_back({message, wParam, lParam});
+    return handled ? 0 : DefWindowProcA(window, message, wParam, lParam);
 }
 
 HWND CreateRecordingFrame(int x, int y, int width, int height) {
     static bool registered = false;
     if (!registered) {
-        WNDCLASSA wc = {};
-        wc.lpfnWndProc = RecordingFrameProc;
-        wc.hInstance = GetModuleHandleA(nullptr);
-        wc.hCursor = LoadCursor(nullptr, IDC_ARROW);
-        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1);
-        wc.lpszClassName = "QbrTestFrame";
+        const WNDCLASSA wc = {0,
+                              RecordingFrameProc,
+                              0,
+                              0,
+                              GetModuleHandleA(nullptr),
+                              nullptr,
+                              LoadCursor(nullptr, IDC_ARROW),
+                              reinterpret_cast<HBRUSH>(COLOR_WINDOW + 1),
+                              nullptr,
+                              "QbrTestFrame"};
         registered = RegisterClassA(&wc) != 0;
     }
     HWND frame = CreateWindowExA(0, "QbrTestFrame", "Test Frame", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, x, y, width,
@@ -127,16 +117,12 @@ void FrameTest::TearDown() {
 }
 
 void FrameTest::AddButtons(UINT first, UINT count) {
-    std::vector<UINT> ids;
+    std::vector<UINT> ids(count);
     for (UINT i = 0; i < count; ++i)
-        ids.push_back(first + i);
+        ids[i] = first + i;
     ASSERT_EQ(1u, QBR_AddButtons(manager, ids.data(), count));
 }
 
-HWND FrameTest::MakeDock(UINT side) { return QBR_CreateDock(manager, frame, side); }
-
-// Where the library placed the window: a hidden floating frame goes there
-// when it shows.
 RECT WindowRectInParent(HWND window) {
     RECT r;
     GetPlacedRects(window, &r, nullptr);
@@ -156,20 +142,12 @@ RECT ClientRectOf(HWND window) {
     return r;
 }
 
-// Copies a rectangle of a device context into a top-down 32-bit DIB and
-// hands back its colours.
 Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height) {
     Pixels out;
-    out.width = width;
-    out.height = height;
+    out.width = width, out.height = height;
     if (width <= 0 || height <= 0 || !source) return out;
     HDC memory = CreateCompatibleDC(source);
-    BITMAPINFO info = {};
-    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-    info.bmiHeader.biWidth = width;
-    info.bmiHeader.biHeight = -height; // top-down
-    info.bmiHeader.biPlanes = 1;
-    info.bmiHeader.biBitCount = 32;
+    BITMAPINFO info = {{sizeof(BITMAPINFOHEADER), width, -height, 1, 32}}; // top-down
     void *bits = nullptr;
     HBITMAP dib = CreateDIBSection(memory, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
     HGDIOBJ old = SelectObject(memory, dib);
@@ -177,10 +155,8 @@ Pixels ReadPixelsFrom(HDC source, int left, int top, int width, int height) {
     GdiFlush();
     out.colors.resize(static_cast<size_t>(width) * height);
     auto *raw = static_cast<const DWORD *>(bits);
-    for (size_t i = 0; i < out.colors.size(); ++i) {
-        DWORD p = raw[i]; // 0x00RRGGBB
-        out.colors[i] = RGB((p >> 16) & 0xff, (p >> 8) & 0xff, p & 0xff);
-    }
+    for (size_t i = 0; i < out.colors.size(); ++i) // 0x00RRGGBB
+        out.colors[i] = RGB((raw[i] >> 16) & 0xff, (raw[i] >> 8) & 0xff, raw[i] & 0xff);
     SelectObject(memory, old);
     DeleteObject(dib);
     DeleteDC(memory);
@@ -237,21 +213,11 @@ HWND SendMouse(UINT message, POINT p, WPARAM keys) {
     return window;
 }
 
-Pixels ReadScreenPixels(const RECT &rect) {
-    HDC screen = GetDC(nullptr);
-    Pixels out = ReadPixelsFrom(screen, rect.left, rect.top, rect.right - rect.left, rect.bottom - rect.top);
-    ReleaseDC(nullptr, screen);
-    return out;
-}
-
 double Luminance(COLORREF color) {
-    double sum = 0;
-    const double weights[3] = {0.2126, 0.7152, 0.0722};
-    const int channels[3] = {GetRValue(color), GetGValue(color), GetBValue(color)};
-    for (int i = 0; i < 3; ++i) {
-        const double v = channels[i] / 255.0;
+    double sum = 0, weights[3] = {0.2126, 0.7152, 0.0722}, v;
+    for (int i = 0; i < 3; ++i)
+        v = ((color >> (8 * i)) & 0xff) / 255.0,
         sum += weights[i] * (v <= 0.03928 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4));
-    }
     return sum;
 }
 

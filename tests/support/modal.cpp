@@ -37,10 +37,8 @@ void CALLBACK Tick(HWND, UINT, UINT_PTR, DWORD) {
     insertAt = 0;
     const bool done = step();
     running = false;
-    if (done)
-        idleTicks = 0;
-    else
-        steps.push_front(std::move(step));
+    if (done) idleTicks = 0;
+    if (!done) steps.push_front(std::move(step));
 }
 
 bool CursorAt(POINT at) {
@@ -87,21 +85,13 @@ void ModalSteps::Stop() {
     steps.clear();
 }
 
-void PlaceCursorStep(POINT at) {
-    SetCursorPos(at.x, at.y);
+void ClickAtStep(POINT at) {
     auto ticksThere = std::make_shared<int>(0);
     ModalSteps::Until([at, ticksThere] {
-        if (!CursorAt(at)) {
-            SetCursorPos(at.x, at.y);
-            *ticksThere = 0;
-            return false;
-        }
-        return ++*ticksThere >= 3;
+        if (CursorAt(at)) return ++*ticksThere >= 3;
+        SetCursorPos(at.x, at.y);
+        return bool(*ticksThere = 0);
     });
-}
-
-void ClickAtStep(POINT at) {
-    PlaceCursorStep(at);
     ModalSteps::Add([] {
         SendButton(MOUSEEVENTF_LEFTDOWN);
         SendButton(MOUSEEVENTF_LEFTUP);
@@ -109,8 +99,7 @@ void ClickAtStep(POINT at) {
 }
 
 void SendButton(DWORD flags) {
-    INPUT input = {};
-    input.type = INPUT_MOUSE;
+    INPUT input = {INPUT_MOUSE};
     input.mi.dwFlags = flags;
     SendInput(1, &input, sizeof input);
 }
@@ -127,16 +116,12 @@ std::string DescribeMenu(HMENU menu) {
     std::string out;
     for (int i = 0; i < GetMenuItemCount(menu); ++i) {
         UINT state = GetMenuState(menu, i, MF_BYPOSITION);
-        if (!out.empty()) out += " | ";
-        if (state & MF_SEPARATOR) {
-            out += "--";
-            continue;
-        }
         char text[64] = "";
         GetMenuStringA(menu, i, text, sizeof text, MF_BYPOSITION);
-        out += text;
-        if (state & MF_CHECKED) out += "*";
-        out += ":" + std::to_string(GetMenuItemID(menu, i));
+        out += (out.empty() ? "" : " | ") +
+               ((state & MF_SEPARATOR)
+                    ? "--"
+                    : text + std::string(state & MF_CHECKED ? "*:" : ":") + std::to_string(GetMenuItemID(menu, i)));
     }
     return out;
 }

@@ -21,20 +21,17 @@ void Until(std::function<bool()> step);
 void Stop(); // drops what is left; call after the modal loop returned
 } // namespace ModalSteps
 
-// Steps that put the cursor at a screen point and wait until it stays there
-// (Wine's X driver can deliver the motion of an earlier warp late and put the
-// cursor back); the second then clicks the left button there.
-void PlaceCursorStep(POINT at);
+// Steps that put the cursor at a screen point, wait until it stays there
+// (Wine's X driver can deliver an earlier warp late), and click there.
 void ClickAtStep(POINT at);
 // A real mouse button event at the cursor (MOUSEEVENTF_LEFTDOWN, ...).
 void SendButton(DWORD flags);
 // The thread has taken the last message of this button (VK_LBUTTON, ...).
 bool ButtonDown(int key);
 
-// The popup menu on the screen, or null.
+// The popup menu on the screen, or null; its entries as "text:id", a star
+// after a checked text, "--" for a separator, joined by " | ".
 HMENU OpenMenu();
-// Its entries as "text:id", a star after a checked text, "--" for a
-// separator, joined by " | ".
 std::string DescribeMenu(HMENU menu);
 // Steps that click the entry with this text.
 void ClickMenuEntry(HMENU menu, const char *text);
