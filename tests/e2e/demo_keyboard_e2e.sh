@@ -87,11 +87,7 @@ keys F6 Tab Tab
 expect_focus "Palette: Eraser" "Tab skips the hidden Align"
 keys Escape
 
-# With button text on, and in a view window, whose toolbars are its own.
-keys alt+v b
-keys F6 Right
-expect_focus "Standard: Open" "F6 Right in button-text mode"
-keys Escape
+# A view window has toolbars of its own.
 keys alt+v o
 ctl wait "View Window" 10000 || fail "no view window"
 sleep 1

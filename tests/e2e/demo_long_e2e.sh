@@ -61,11 +61,16 @@ check_invariants() {
     local list title order at mainAt lowest dv dl dt dr db
     list=$(ctl toolbars "$main")
     [ "$(wc -l <<<"$list")" = 8 ] || fail "not 8 toolbar windows (seed $seed): $list"
-    order=$(ctl zorder)
-    mainAt=$(grep -n "^$main\$" <<<"$order" | cut -d: -f1)
     for title in "${titles[@]}"; do
         [ "$(grep -c "^pane .* $title\$" <<<"$list") $(grep -c "^frame .* $title\$" <<<"$list") $(grep -c "^[a-z]* 1 .* $title\$" <<<"$list")" = "1 1 1" ] ||
             fail "$title: not one pane, one frame, one shown (seed $seed): $list"
+    done
+    # Under Wine an activated host is raised on the window system's own time;
+    # the library restacks the frames once the activation settled (250 ms).
+    sleep 0.5
+    order=$(ctl zorder)
+    mainAt=$(grep -n "^$main\$" <<<"$order" | cut -d: -f1)
+    for title in "${titles[@]}"; do
         at=$(grep -n "^$title owned by $main\$" <<<"$order" | cut -d: -f1)
         [ -z "$at" ] || [ "$at" -lt "$mainAt" ] || fail "$title floats behind the main window (seed $seed): $order"
     done
@@ -97,23 +102,6 @@ drag_toolbar() {
     else tx=$(clamp_x $((x + fx - l))) ty=$((y + fy - t)); fi
     log "drag $title ($kind) from $x,$y to $tx,$ty"
     ldrag "$x" "$y" "$tx" "$ty"
-}
-# A toolbar torn off by a double click floats where its frame was last, maybe
-# over the main window: it is brought below.
-double_click() {
-    local title=${titles[RANDOM % 4]} kind l t r b x y fx fy
-    read -r kind l t r b <<<"$(shown "$title")"
-    read -r x y <<<"$(grip "$kind" "$l" "$t" "$r" "$b")"
-    on_screen "$x" "$y" || return
-    log "double click $title ($kind) at $x,$y"
-    xdotool mousemove "$x" "$y" click --repeat 2 --delay 80 1
-    settle
-    read -r kind l t r b <<<"$(shown "$title")"
-    if [ "$kind" = frame ] && [ "$t" -lt "$mb" ]; then
-        read -r x y <<<"$(caption_point "$l" "$t" "$r" "$b")"
-        float_corner $((r - l))
-        on_screen "$x" "$y" && ldrag "$x" "$y" "$(clamp_x $((x + fx - l)))" $((y + fy - t))
-    fi
 }
 move_button() {
     local from=${titles[RANDOM % 4]} to=${titles[RANDOM % 4]} index=$((RANDOM % 2)) x y kind l t r b
@@ -164,7 +152,7 @@ end=$(($(date +%s) + seconds))
 while [ "$(date +%s)" -lt "$end" ]; do
     for _ in $(seq 1 "$batch"); do
         case $((RANDOM % 10)) in
-        0 | 1) click_button ;; 2 | 3) drag_toolbar ;; 4) double_click ;; 5 | 6) move_button ;;
+        0 | 1) click_button ;; 2 | 3 | 4) drag_toolbar ;; 5 | 6) move_button ;;
         7) nudge_button ;; 8) button_text_round_trip ;; 9) view_window ;;
         esac
         gestures=$((gestures + 1))

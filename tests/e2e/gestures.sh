@@ -1,17 +1,12 @@
-# Mouse gestures and window lookups shared by the end-to-end scripts that
-# rearrange toolbars. Source it after lib.sh. All coordinates are screen
-# coordinates, which Wine's virtual desktop shares with X.
-
-# Short pauses between steps: a drag with capture follows X input reliably
-# when each step has time to reach the program's queue.
+# Mouse gestures and window lookups for the end-to-end scripts (source after
+# lib.sh); screen coordinates, which Wine's virtual desktop shares with X. A
+# drag with capture follows X input reliably when each step has a short pause.
 step() { sleep "${1:-0.05}"; }
 
-# Pumps the program through one round trip, so what the input did has been
-# handled before anyone looks.
+# One round trip through the program, so what the input did has been handled.
 settle() { sleep 0.2; ctl ping "$main" 5000 >/dev/null || fail "the program does not answer"; }
 
-# A drag with mouse button $1 from ($2, $3) to ($4, $5), through a few points
-# on the way, as a hand moves.
+# A drag with mouse button $1 from ($2, $3) to ($4, $5) through a few points.
 drag() {
     local button=$1 x1=$2 y1=$3 x2=$4 y2=$5 i
     xdotool mousemove "$x1" "$y1"
@@ -29,8 +24,7 @@ drag() {
 ldrag() { drag 1 "$@"; }
 rdrag() { drag 3 "$@"; }
 
-# The separator gesture: a right press on a button, a few pixels sideways, a
-# release on the same button.
+# The separator gesture: a right press, a few pixels sideways, a release.
 nudge() {
     local x=$1 y=$2 dx=$3
     xdotool mousemove "$x" "$y"
@@ -51,12 +45,9 @@ toolbar_rect() {
         $1 == k && title == t { print $2, $3, $4, $5, $6 }'
 }
 
-# "visible left top right bottom" of the dock on side $2 (top, left, right,
-# bottom) of frame $1, found by its place: the top dock is the highest, at
-# the client area's top; the bottom dock the lowest of those as wide as the
-# top dock (both are full-screen wide); the side docks start below the top
-# dock, the left one at the client area's left edge, which the top dock
-# shares.
+# "visible left top right bottom" of the dock on side $2 of frame $1, by its
+# place: the top dock highest; the bottom dock the lowest as wide as it; the
+# side docks below it, the left one at its left edge.
 dock_rect() {
     ctl docks "$1" | sort -n -k3 | awk -v side="$2" '
         { v[NR] = $0; l[NR] = $2; w[NR] = $4 - $2 }
@@ -69,10 +60,9 @@ dock_rect() {
         }'
 }
 
-# Centre of the button at place $3 (0 = first) of a docked or floating
-# toolbar window whose outer rectangle starts at ($1, $2), counting only
-# buttons before the first separator: a pane has a one-pixel border and an
-# item area 6 pixels in and 3 down; buttons share one pixel column.
+# Centre of button $3 (0 = first, before any separator) of a pane whose outer
+# rectangle starts at ($1, $2): a one-pixel border, items 6 in and 3 down,
+# neighbours sharing a pixel column.
 button_centre() { # left top index [buttonWidth buttonHeight]
     local w=${4:-24} h=${5:-22}
     echo $(($1 + 1 + 6 + ($w - 1) * $3 + $w / 2)) $(($2 + 1 + 3 + $h / 2))

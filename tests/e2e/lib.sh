@@ -1,8 +1,6 @@
-# Shared by the end-to-end scripts: the Wine environment of a build folder,
-# the control tool, starting and ending the demonstration program.
-# Source it with the build folder as $1 and, for a script that runs at a
-# display scale, the DPI as $2 (96 when absent): the program then runs in the
-# build folder's prefix of that scale (wine-env.sh BUILD_DIR DPI).
+# Shared by the end-to-end scripts: the Wine environment, the control tool,
+# starting and ending the demo. $1 is the build folder, $2 the DPI (96 when
+# absent; the build folder's prefix of that scale, wine-env.sh BUILD_DIR DPI).
 build=$(cd "$1" && pwd)
 dpi=${2:-96}
 suffix=""
@@ -12,10 +10,8 @@ here=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
 . "$build/wine-env$suffix/exports.sh"
 out="$build/e2e"
 mkdir -p "$out"
-# Each script runs the program from a folder of its own, BUILD/e2e/<script>/
-# (BUILD/e2e/<script>-DPI/ at another scale), so the settings file it reads
-# and writes ($ini) is that folder's and the user's own build/bin/qbrdemo.INI
-# is never touched.
+# Each script runs the program from BUILD/e2e/<script>[-DPI]/, so its settings
+# file ($ini) is its own and the user's build/bin/qbrdemo.INI is never touched.
 run="$out/$(basename "$0" .sh)$suffix"
 mkdir -p "$run"
 ini="$run/qbrdemo.INI"
@@ -23,8 +19,7 @@ main="Quaybar Demo"
 demo_pid=""
 
 ctl() { wine "$build/bin/qbr_ctl.exe" "$@" </dev/null 2>/dev/null | tr -d "\r"; return "${PIPESTATUS[0]}"; }
-# A failure may leave a dialog open, whose modal loop would keep the main
-# window from closing: the dialogs go first.
+# A dialog left open by a failure would keep the main window open: it goes first.
 fail() {
     echo "FAIL: $*"
     if [ -n "$demo_pid" ]; then
@@ -49,8 +44,7 @@ start_demo() {
     cp "$build/bin/qbrdemo.exe" "$build/bin/QBRDEMO.TXT" "$run/" || fail "cannot copy the program to $run"
     wine "$run/qbrdemo.exe" </dev/null >>"$out/demo.log" 2>&1 &
     demo_pid=$!
-    # Generous: a start under a loaded machine (Wine's process start-up, the
-    # desktop) once took longer than 20 s; a program that hangs still fails.
+    # Generous: a start on a loaded machine once took over 20 s.
     ctl wait "$main" 60000 || fail "the main window did not appear ($1)"
     sleep 1
 }
