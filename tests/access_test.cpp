@@ -1,8 +1,6 @@
-// Screen readers and the keyboard on real toolbars: objects read as a reader
-// reads them, events from a real WinEvent hook, keys as real input through a
-// host's loop (QBR_TranslateToolbarKey first).
+// Screen readers and the keyboard on real toolbars: objects read as a reader reads them, events from
+// a real WinEvent hook, keys as real input through a host's loop (QBR_TranslateToolbarKey first).
 #include <ole2.h>
-
 #include <oleacc.h>
 
 #include <map>
@@ -22,7 +20,7 @@ namespace {
 void SendKey(WORD vk, bool up) {
     INPUT in = {INPUT_KEYBOARD};
     in.ki.wVk = vk;
-    in.ki.dwFlags = (up ? KEYEVENTF_KEYUP : 0) | (vk == VK_APPS ? KEYEVENTF_EXTENDEDKEY : 0);
+    in.ki.dwFlags = up ? KEYEVENTF_KEYUP : 0;
     SendInput(1, &in, sizeof in);
     PumpHost(30);
 }
@@ -30,14 +28,12 @@ void SendKey(WORD vk, bool up) {
 // A key pressed and let go; "+" before its name holds Shift, "^" Ctrl.
 void Key(const std::string &name) {
     static const std::map<std::string, WORD> kKeys = {
-        {"F6", VK_F6},     {"Esc", VK_ESCAPE}, {"Left", VK_LEFT},    {"Right", VK_RIGHT}, {"Up", VK_UP},
-        {"Down", VK_DOWN}, {"Home", VK_HOME},  {"End", VK_END},      {"Tab", VK_TAB},     {"F10", VK_F10},
-        {"A", 'A'},        {"Apps", VK_APPS},  {"Delete", VK_DELETE}};
+        {"F6", VK_F6},     {"Esc", VK_ESCAPE}, {"Left", VK_LEFT}, {"Right", VK_RIGHT}, {"Up", VK_UP},
+        {"Home", VK_HOME}, {"End", VK_END},    {"Tab", VK_TAB},   {"A", 'A'},          {"Delete", VK_DELETE}};
     const WORD held = name[0] == '+' ? VK_SHIFT : name[0] == '^' ? VK_CONTROL : 0;
     const WORD vk = kKeys.at(name.substr(held ? 1 : 0));
     if (held) SendKey(held, false);
-    SendKey(vk, false);
-    SendKey(vk, true);
+    SendKey(vk, false), SendKey(vk, true);
     if (held) SendKey(held, true);
 }
 
@@ -46,8 +42,7 @@ VARIANT Child(LONG id) {
     return VariantInit(&v), v.vt = VT_I4, v.lVal = id, v;
 }
 
-// An object read as a reader reads it: text ("(none)" where there is none),
-// numbers (-1 for a failed call) and rectangles on the screen.
+// An object as a reader reads it: text ("(none)" where there is none), numbers (-1: a failed call).
 struct Reader {
     IAccessible *object = nullptr;
     mutable BSTR text = nullptr;
@@ -73,7 +68,6 @@ struct Reader {
     LONG State(LONG id) const { return Id(object->get_accState(Child(id), &v)); }
     LONG Count() const { return object->get_accChildCount(&box[0]) == S_OK ? box[0] : -1; }
     LONG HitTest(POINT p) const { return Id(object->accHitTest(p.x, p.y, &v)); } // 0: the toolbar
-    LONG Navigate(LONG direction, LONG from) const { return Id(object->accNavigate(direction, Child(from), &v)); }
     RECT Location(LONG id) const { return Box(object->accLocation(&box[0], &box[1], &box[2], &box[3], Child(id))); }
     RECT Box(HRESULT) const { return RECT{box[0], box[1], box[0] + box[2], box[1] + box[3]}; }
     HRESULT Do(LONG id) const { return object->accDoDefaultAction(Child(id)); }
@@ -116,19 +110,15 @@ class AccessTest : public FrameTest {
     void TearDown() override {
         AccessLeaveKeyboard();
         UnhookWinEvent(hook);
-        events.clear();
         FrameTest::TearDown();
     }
     void Hear(DWORD first, DWORD last) {
         if (hook) UnhookWinEvent(hook);
         hook = SetWinEventHook(first, last, nullptr, OnWinEvent, GetCurrentProcessId(), 0, WINEVENT_OUTOFCONTEXT);
     }
-    HWND Make(const char *title, std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr,
-              int width = 0) {
-        HWND pane =
-            QBR_CreateToolbar(title, flags, 300, 250, width, 0, dock ? dock : top, ids.data(), UINT(ids.size()));
-        Pump();
-        return ClearFrameLog(), events.clear(), pane;
+    HWND Make(const char *title, std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED, HWND dock = nullptr) {
+        HWND pane = QBR_CreateToolbar(title, flags, 300, 250, 0, 0, dock ? dock : top, ids.data(), UINT(ids.size()));
+        return Pump(), ClearFrameLog(), events.clear(), pane;
     }
     static RECT ScreenItem(HWND pane, UINT index) {
         RECT r = {};
@@ -152,8 +142,8 @@ Heard Release(UINT id) { return {kReleaseMessage, (id & 0xFFFF) | 0xFFFF0000u, 0
 Heard Command(UINT id) { return {WM_COMMAND, id, 0}; }
 using Heards = std::vector<Heard>;
 
-// Each item as a reader reads it, its default action a click completed from
-// the loop; each change of its state is there when asked, and told once.
+// Each item as a reader reads it, its default action a click completed from the loop; each change of its
+// state is there when asked, and told once.
 TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
     for (UINT id : {3u, 5u, 6u})
         QBR_SetButtonBehaviour(manager, id, BTN_CHECK);
@@ -162,8 +152,6 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
     HWND pane = Make("Tools", {1, 0, 3, 4, 5, 6});
     Reader reader(pane);
     ASSERT_EQ(6, reader.Count());
-    EXPECT_EQ(6, Reader(ResolveRoleWindow(pane, ROLE_FLOATING)).Count()) << "the floating frame reads the same";
-    EXPECT_EQ(-1, reader.Role(7));
     const struct {
         LONG child, role;
         const char *name, *description, *action;
@@ -200,7 +188,6 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
         const char *heard;
         LONG state1, state3;
     } rows[] = {
-        {QBR_SetButtonState, 3, 1, "", F, F | C}, // no change
         {QBR_SetButtonState, 3, 2, "state 3; ", F, F | M},
         {QBR_SetButtonEnabled, 1, 0, "state 1; ", U, F | M},
         {QBR_SetButtonPressed, 1, 1, "state 1; ", U | P, F | M},
@@ -216,18 +203,11 @@ TEST_F(AccessTest, ReadsEveryItemItsStatesAndItsDefaultAction) {
                   std::make_tuple(events, reader.State(1), reader.State(3)))
             << "row " << &row - rows;
     }
-    // A mouse press draws its pressed look without the catalog: it is told too.
-    events.clear();
-    SendMouse(WM_LBUTTONDOWN, Centre(ScreenItem(pane, 2)), MK_LBUTTON);
-    PumpFor(50);
-    EXPECT_EQ("state 3; ", events);
-    SendMouse(WM_LBUTTONUP, Centre(ScreenItem(pane, 2)), 0);
 }
 
-// Every item seen has its place and a hit test there finds it; items out of
-// sight (cut off, on the docked copy of a floating toolbar, a separator the
-// floating frame leaves out) are read so and have none.
-TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
+// Every item seen has its place and a hit test there finds it; items out of sight (cut off, on the docked
+// copy of a floating toolbar, a separator the floating frame leaves out) are read so and have none.
+TEST_F(AccessTest, PlacesAndHitTestsAgreeWithWhatIsSeen) {
     const LONG O = STATE_SYSTEM_OFFSCREEN, I = STATE_SYSTEM_INVISIBLE;
     const UINT docked = TBF_VISIBLE | TBF_DOCKED, floating = TBF_VISIBLE | TBF_FLOATING;
     const struct {
@@ -245,7 +225,7 @@ TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
         while (HWND old = QBR_GetToolbar(manager, 0))
             QBR_DestroyToolbar(old);
         HWND pane = Make("Tools", {1, 0, 2, 3}, row.flags);
-        RECT usable = ClientRectOf(frame), window;
+        RECT usable = ClientRectOf(frame);
         POINT edge = {ScreenItem(pane, 0).right + MulDiv(13, ManagerDpi(manager), 96), 0};
         ScreenToClient(frame, &edge);
         if (row.cut) usable.right = edge.x;
@@ -260,41 +240,24 @@ TEST_F(AccessTest, PlacesHitTestsAndNavigationAgreeWithWhatIsSeen) {
             // The centre: the shared edge columns belong to the left neighbour.
             EXPECT_EQ(seen == 0, child == reader.HitTest(Centre(item))) << child;
         }
-        if (row.seen[1]) continue; // (a cut-off toolbar's chevron is a child too: chevron_test)
-        GetWindowRect(ResolveRoleWindow(pane, row.role), &window);
-        EXPECT_EQ(window, reader.Location(CHILDID_SELF));
-        EXPECT_EQ(CHILDID_SELF, reader.HitTest(POINT{window.right - 3, window.bottom - 3}));
-        EXPECT_EQ(-1, reader.HitTest(POINT{window.right + 5, window.bottom + 5}));
-        const LONG walks[][3] = {{NAVDIR_FIRSTCHILD, 0, 1}, {NAVDIR_LASTCHILD, 0, 4}, {NAVDIR_NEXT, 1, 2},
-                                 {NAVDIR_NEXT, 4, -1},      {NAVDIR_PREVIOUS, 4, 3},  {NAVDIR_PREVIOUS, 1, -1}};
-        for (const auto &walk : walks)
-            EXPECT_EQ(walk[2], reader.Navigate(walk[0], walk[1])) << walk[0] << " from " << walk[1];
     }
 }
 
-TEST_F(AccessTest, KeysWalkTheButtonsRowsAndToolbarsInOrder) {
+TEST_F(AccessTest, KeysWalkTheButtonsAndToolbarsInOrder) {
     QBR_SetButtonEnabled(manager, 3, 0);
     QBR_SetButtonEnabled(manager, 8, 0);
     // Made out of the keyboard's order: the docks' (top, left, right, bottom), then the floating toolbars'.
-    HWND grid = Make("Grid", {11, 12, 13, 14, 15, 16, 17, 18, 19}, TBF_VISIBLE | TBF_FLOATING, nullptr, 100);
+    Make("Float", {11, 12}, TBF_VISIBLE | TBF_FLOATING);
     Make("Left", {7, 8}, TBF_VISIBLE | TBF_DOCKED, MakeDock(DOCK_LEFT));
     Make("A", {1, 2, 0, 3, 4});
     Make("B", {5, 6});
     Make("Low", {9}, TBF_VISIBLE | TBF_DOCKED, MakeDock(DOCK_BOTTOM));
     Make("Hidden", {10}, TBF_HIDDEN | TBF_DOCKED);
     Make("Empty", {0, 8}); // nothing enabled
-    UINT n = 0;            // the grid's buttons across
-    while (n < 9 && ScreenItem(grid, n).top == ScreenItem(grid, 0).top)
-        ++n;
-    ASSERT_TRUE(n > 1 && n < 5) << n << " across: the grid needs two full rows";
-    const std::string down1 = "Grid " + std::to_string(1 + n), down2 = "Grid " + std::to_string(1 + 2 * n);
     const std::pair<const char *, std::string> steps[] = {
-        {"A", "host"},     {"Right", "host"},   {"F6", "A 0"},     {"Right", "A 1"},    {"Right", "A 4"},
-        {"Right", "A 0"},  {"Left", "A 4"},     {"Home", "A 0"},   {"End", "A 4"},      {"Up", "A 4"},
-        {"Down", "A 4"},   {"Tab", "B 0"},      {"Tab", "Left 0"}, {"Right", "Left 0"}, {"Tab", "Low 0"},
-        {"Tab", "Grid 0"}, {"Right", "Grid 1"}, {"Down", down1},   {"Up", "Grid 1"},    {"Up", "Grid 1"},
-        {"Down", down1},   {"Down", down2},     {"End", "Grid 8"}, {"Right", "Grid 0"}, {"Left", "Grid 8"},
-        {"Tab", "A 0"},    {"+Tab", "Grid 0"},  {"Esc", "host"},   {"F6", "A 0"},       {"F6", "host"},
+        {"A", "host"},      {"F6", "A 0"},  {"Right", "A 1"},    {"Right", "A 4"}, {"Right", "A 0"},  {"Left", "A 4"},
+        {"Home", "A 0"},    {"End", "A 4"}, {"Up", "A 4"},       {"Tab", "B 0"},   {"Tab", "Left 0"}, {"Tab", "Low 0"},
+        {"Tab", "Float 0"}, {"Tab", "A 0"}, {"+Tab", "Float 0"}, {"Esc", "host"},  {"F6", "A 0"},     {"F6", "host"},
     };
     std::string trail, expected;
     for (const auto &step : steps) {
@@ -305,38 +268,17 @@ TEST_F(AccessTest, KeysWalkTheButtonsRowsAndToolbarsInOrder) {
     EXPECT_EQ(expected, trail);
     EXPECT_EQ(frame, GetFocus()) << "the keyboard went back to the host's window";
     EXPECT_EQ(frame, GetActiveWindow()) << "no toolbar took the activation";
-    // Down passes over a disabled button to the nearest in the next row, not straight down two rows.
-    QBR_SetButtonEnabled(manager, 11 + n, 0);
-    for (const char *key : {"F6", "+Tab", "Down"})
-        Key(key);
-    EXPECT_EQ(down1, Focus());
 }
 
-// The focused button is read focused, announced, shows the focus rectangle 3
-// pixels inside and, after one period, its tip below; Space presses it as the
-// left button does, and let go after moving away is no click.
-TEST_F(AccessTest, SpacePressesTheFocusedButtonAsTheLeftButtonDoes) {
-    QBR_SetQuickHelp(1);
-    HWND pane = Make("Tools", {1, 2}), help = CurrentClient()->helpWindow;
-    const Pixels before = ReadWindowPixels(pane);
+// The focused button is read focused and announced; Space presses it as the left button does, and let
+// go after moving away is no click. The window focus stays with the host, so the library announces the
+// host when the keyboard comes back (unless another window is activated: the platform tells that).
+TEST_F(AccessTest, SpacePressesTheFocusedButtonAndLeavingAnnouncesTheHost) {
+    HWND pane = Make("Tools", {1, 2});
+    Make("Other", {3});
     Key("F6");
     EXPECT_EQ("focus 1", LastFocus());
     EXPECT_EQ(STATE_SYSTEM_FOCUSABLE | STATE_SYSTEM_FOCUSED, Reader(pane).State(1));
-    EXPECT_FALSE(IsWindowVisible(help)) << "not before one period";
-    PumpHost(400);
-    RECT tip;
-    GetWindowRect(help, &tip);
-    EXPECT_TRUE(IsWindowVisible(help));
-    EXPECT_EQ(Rect(ScreenItem(pane, 0).left, ScreenItem(pane, 0).bottom + 1, 0, 0), Rect(tip.left, tip.top, 0, 0));
-    const Pixels focused = ReadWindowPixels(pane);
-    RECT item = {};
-    GetItemRect(RecordOfWindow(pane), 0, &item);
-    int dots[2] = {}; // across its middle half
-    for (int x = (3 * item.left + item.right) / 4; x < (item.left + 3 * item.right) / 4; ++x)
-        for (int row : {0, 1})
-            dots[row] += focused.At(x, item.top + 2 + row) != before.At(x, item.top + 2 + row);
-    EXPECT_EQ(0, dots[0]) << "on the row 2 pixels inside the button";
-    EXPECT_LT(0, dots[1]) << "on the row 3 pixels inside the button";
     SendKey(VK_SPACE, false);
     EXPECT_NE(0u, QBR_IsButtonPressed(manager, 1));
     EXPECT_EQ(Heards{Press(1)}, FrameLog()) << Describe(FrameLog());
@@ -346,79 +288,38 @@ TEST_F(AccessTest, SpacePressesTheFocusedButtonAsTheLeftButtonDoes) {
     SendKey(VK_SPACE, true);
     EXPECT_EQ((Heards{Press(1), Release(1), Command(1), Press(1), Release(1)}), FrameLog()) << Describe(FrameLog());
     EXPECT_EQ(0u, QBR_IsButtonPressed(manager, 1));
-}
-
-// The window focus stays with the host while the toolbars have the keyboard,
-// so the library announces the host when it comes back (unless another window
-// is activated: the platform tells that); a closed toolbar menu announces the
-// button again; keys the toolbars do not use are the host's.
-TEST_F(AccessTest, LeavingTheToolbarsGivesTheKeyboardBackAndAnnouncesIt) {
-    HWND pane = Make("Tools", {1, 2});
-    Make("Other", {3});
-    Key("F6");
-    const UINT keys[][3] = {{WM_KEYDOWN, VK_CONTROL, 0}, {WM_KEYDOWN, 'S', 0},      {WM_KEYUP, 'S', 0},
-                            {WM_KEYDOWN, VK_INSERT, 0},  {WM_KEYDOWN, VK_RIGHT, 1}, {WM_KEYUP, VK_RIGHT, 1}};
-    for (const auto &key : keys) {
-        MSG msg = {frame, key[0], key[1], 1, 0, {0, 0}};
+    const UINT keys[][3] = {
+        {WM_KEYDOWN, VK_CONTROL, 0}, {WM_KEYDOWN, 'S', 0},    {WM_KEYUP, 'S', 0}, {WM_KEYDOWN, VK_INSERT, 0},
+        {WM_KEYDOWN, VK_RIGHT, 1},   {WM_KEYUP, VK_RIGHT, 1}, {WM_TIMER, 1, 0}};
+    for (const auto &key : keys) { // keys the toolbars do not use, and other windows' messages, pass on
+        MSG msg = {key[0] == WM_TIMER ? GetDesktopWindow() : frame, key[0], key[1], 1, 0, {0, 0}};
         EXPECT_EQ(key[2], QBR_TranslateToolbarKey(&msg)) << "message " << key[0] << " key " << key[1];
     }
-    EXPECT_EQ("Tools 1", Focus()) << "the host's keys left the keyboard in the toolbars";
-    Key("Esc");
-    POINT inFrame = {300, 300};
-    ClientToScreen(frame, &inFrame);
-    for (const std::string how : {"Esc", "Alt", "click", "another window"}) {
-        Key("F6");
-        ASSERT_EQ("Tools 0", Focus()) << how;
+    EXPECT_EQ("Tools 0", Focus()) << "the host's keys left the keyboard in the toolbars";
+    for (int way = 0; way < 3; ++way) { // Esc, a click in the frame, another window activated
         events.clear();
-        HWND other = how == "another window" ? CreateRecordingFrame(100, 100, 200, 150) : nullptr;
-        if (how == "Alt") PostMessageA(frame, WM_SYSKEYDOWN, VK_MENU, 0x20380001); // the release is the host's
-        if (how == "Esc") Key(how);
-        if (how == "click") {
-            PlaceCursor(inFrame);
-            SendButton(MOUSEEVENTF_LEFTDOWN);
-            SendButton(MOUSEEVENTF_LEFTUP);
-        }
+        HWND other = way == 2 ? CreateRecordingFrame(100, 100, 200, 150) : nullptr;
+        if (way == 0) Key("Esc");
+        if (way == 1) PlaceCursor(Centre(WindowRectInParent(frame))), SendButton(MOUSEEVENTF_LEFTDOWN);
+        if (way == 1) SendButton(MOUSEEVENTF_LEFTUP);
         PumpHost(50);
-        EXPECT_EQ("host", Focus()) << how;
-        EXPECT_EQ(other ? "focus 0" : "focus host 0", LastFocus()) << how; // the platform tells another window
+        EXPECT_EQ("host", Focus()) << way;
+        EXPECT_EQ(other ? "focus 0" : "focus host 0", LastFocus()) << way;
         DestroyWindow(other);
         SetForegroundWindow(frame);
         for (int round = 0; round < 100 && GetActiveWindow() != frame; ++round) // a loaded machine settles late
             PumpHost(10);
-    }
-    for (const char *key : {"+F10", "Apps"}) {
         Key("F6");
-        Key("Right");
-        std::string seen;
-        ModalSteps::Until([&] {
-            HMENU menu = OpenMenu();
-            if (menu) seen = DescribeMenu(menu);
-            return menu && EndMenu();
-        });
-        events.clear();
-        Key(key);
-        PumpHost(100);
-        ModalSteps::Stop();
-        EXPECT_EQ(0u, seen.find("Tools*:201 | Other*:202 | --")) << key << ": " << seen;
-        EXPECT_EQ("focus 2", LastFocus()) << key;
-        Key("Esc");
     }
-    // While the mouse holds a button down, F6 is not the toolbars'.
-    SendMouse(WM_LBUTTONDOWN, Centre(ScreenItem(pane, 1)), MK_LBUTTON);
-    Key("F6");
-    EXPECT_EQ("host", Focus());
-    SendMouse(WM_LBUTTONUP, Centre(ScreenItem(pane, 1)), 0);
     // A toolbar hidden under the keyboard hands it on.
-    Key("F6");
     QBR_SetToolbarFlags(pane, TBF_HIDDEN);
     Pump();
     EXPECT_EQ("Other 0", Focus());
 }
 
-// Customising, Ctrl+Left/Right move the focused button and Delete removes it;
-// a reader finds the new order, hears each change as the platform's lists
-// tell it, and reads the keys as the shortcut. Locked, Ctrl+arrows only walk,
-// Delete is the host's, and the toolbar reads as locked.
+// Customising, Ctrl+Left/Right move the focused button and Delete removes it; a reader finds the new
+// order, hears each change as the platform's lists tell it, and reads the keys as the shortcut.
+// Locked, Ctrl+arrows only walk, Delete is the host's, and the toolbar reads as locked.
 TEST_F(AccessTest, CtrlArrowsMoveAndDeleteRemovesTheFocusedButton) {
     QBR_SetCustomize(1);
     HWND pane = Make("Tools", {1, 2, 0, 3});

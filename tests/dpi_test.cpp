@@ -17,20 +17,19 @@ namespace {
 int ScreenDpi() {
     HDC screen = GetDC(nullptr);
     const int dpi = GetDeviceCaps(screen, LOGPIXELSY);
-    ReleaseDC(nullptr, screen);
-    return dpi;
+    return ReleaseDC(nullptr, screen), dpi;
 }
 
 // What 96-DPI pixels come to at each scale, and the strip MAIN (drawn at 100
 // and 150 %) gives there; SINGLE (100 % only) is enlarged by dpi / 96 whole.
 struct Scaled {
     int dpi, buttonWidth, buttonHeight, imageWidth, imageHeight, textWidth, textHeight;
-    int areaLeft, paneTop, paneBottom, frameTop, frameBottom, separator;
+    int areaLeft, paneTop, frameTop, frameBottom, separator;
     const char *main;
 };
-constexpr Scaled kScales[] = {{96, 24, 22, 16, 15, 48, 44, 6, 3, 4, 3, 3, 10, "MAIN"},
-                              {144, 36, 33, 24, 23, 72, 66, 9, 5, 6, 5, 5, 15, "MAIN_150"},
-                              {192, 48, 44, 32, 30, 96, 88, 12, 6, 8, 6, 6, 20, "MAIN_150"}};
+constexpr Scaled kScales[] = {{96, 24, 22, 16, 15, 48, 44, 6, 3, 3, 3, 10, "MAIN"},
+                              {144, 36, 33, 24, 23, 72, 66, 9, 5, 5, 5, 15, "MAIN_150"},
+                              {192, 48, 44, 32, 30, 96, 88, 12, 6, 6, 6, 20, "MAIN_150"}};
 const Scaled &At(int dpi) { return kScales[dpi == 144 ? 1 : dpi == 192 ? 2 : 0]; }
 
 Pixels BitmapPixels(HBITMAP bitmap) {
@@ -39,9 +38,7 @@ Pixels BitmapPixels(HBITMAP bitmap) {
     HDC dc = CreateCompatibleDC(nullptr);
     HGDIOBJ old = SelectObject(dc, bitmap);
     const Pixels out = ReadPixelsFrom(dc, 0, 0, info.bmWidth, info.bmHeight);
-    SelectObject(dc, old);
-    DeleteDC(dc);
-    return out;
+    return SelectObject(dc, old), DeleteDC(dc), out;
 }
 
 // A strip resource as the library loads it (recoloured, not enlarged): 23 images by 2.
@@ -59,27 +56,16 @@ std::vector<RECT> ItemRects(HWND pane) {
     return rects;
 }
 
-// The client of a floating frame of `rows` rows of `across` buttons: its
-// caption band a 7-point font's ascent at the scale, then a line.
-RECT FloatingClient(const Scaled &s, int across, int rows) {
+// The client of a floating frame of one row of 4 buttons: its caption band a 7-point font's ascent, a line.
+RECT FloatingClient(const Scaled &s) {
     HDC screen = GetDC(nullptr);
     HGDIOBJ old = SelectObject(screen, CreateFontA(-MulDiv(7, s.dpi, 72), 0, 0, 0, 400, 0, 0, 0, 0, 0, 0, 0,
                                                    VARIABLE_PITCH | FF_SWISS, nullptr));
     TEXTMETRICA font = {};
     GetTextMetricsA(screen, &font);
     DeleteObject(SelectObject(screen, old));
-    ReleaseDC(nullptr, screen);
-    return Rect(0, 0, 2 * s.areaLeft + across * (s.buttonWidth - 1) + 1,
-                font.tmAscent + 1 + s.frameTop + rows * s.buttonHeight + s.frameBottom);
-}
-
-// The height of the ink of a button's label: below its image, clear of its edges.
-int LabelInk(const Pixels &p, const RECT &b) {
-    int first = b.bottom, last = 0;
-    for (int y = (b.top + b.bottom) / 2 + 1; y < b.bottom - 4; ++y)
-        for (int x = b.left + 3; x < b.right - 4; ++x)
-            if (p.At(x, y) != GetSysColor(COLOR_BTNFACE)) first = std::min(first, y), last = std::max(last, y);
-    return last - first + 1;
+    return ReleaseDC(nullptr, screen), Rect(0, 0, 2 * s.areaLeft + 4 * (s.buttonWidth - 1) + 1,
+                                            font.tmAscent + 1 + s.frameTop + s.buttonHeight + s.frameBottom);
 }
 
 class ScaleTest : public FrameTest {
@@ -89,10 +75,9 @@ class ScaleTest : public FrameTest {
         AddButtons(1, 6);
         top = MakeDock(DOCK_TOP);
     }
-    HWND Make(std::vector<UINT> ids, UINT flags = TBF_VISIBLE | TBF_DOCKED) {
-        HWND pane = QBR_CreateToolbar("T", flags, 300, 200, 0, 0, top, ids.data(), UINT(ids.size()));
-        Pump();
-        return pane;
+    HWND Make(std::vector<UINT> ids) {
+        HWND pane = QBR_CreateToolbar("T", TBF_VISIBLE | TBF_DOCKED, 300, 200, 0, 0, top, ids.data(), UINT(ids.size()));
+        return Pump(), pane;
     }
     HWND top = nullptr;
     const Scaled &s = At(ScreenDpi());
@@ -113,31 +98,22 @@ struct Host {
 
 } // namespace
 
-// Buttons, margins and separators grow with the scale (the host's sizes too),
-// neighbours sharing one column; a button shows the strip drawn for the scale,
-// else the nearest smaller one enlarged by a whole factor, pixel for pixel in
-// whole squares, centred.
+// Buttons, margins and separators grow with the scale, neighbours sharing one column; a button shows the
+// strip drawn for the scale, else the nearest smaller one enlarged by a whole factor in whole squares, centred.
 TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
     char value[16] = ""; // the scale this run was started for: a prefix that lost it would pass at 96
     ASSERT_EQ(GetEnvironmentVariableA("QBR_EXPECT_DPI", value, sizeof value) ? atoi(value) : 96, s.dpi);
-    EXPECT_EQ(UINT(s.dpi), ManagerDpi(manager));
-    const UINT none[6] = {}, host[6] = {30, 28, 20, 18, 60, 50};
     const struct {
         const char *strip, *resource;
         UINT text;
-        const UINT *metrics;
         int bw, bh;
     } rows[] = {
-        {"MAIN", s.main, 0, none, s.buttonWidth, s.buttonHeight},
-        {"SINGLE", "SINGLE", 0, none, s.buttonWidth, s.buttonHeight},
-        {"MAIN", nullptr, 1, none, s.textWidth, s.textHeight},
-        {"MAIN", nullptr, 0, host, 30 * s.dpi / 96, 28 * s.dpi / 96},
-        {"MAIN", nullptr, 1, host, 60 * s.dpi / 96, 50 * s.dpi / 96},
+        {"MAIN", s.main, 0, s.buttonWidth, s.buttonHeight},
+        {"SINGLE", "SINGLE", 0, s.buttonWidth, s.buttonHeight},
+        {"MAIN", nullptr, 1, s.textWidth, s.textHeight},
     };
     for (const auto &row : rows) {
         SCOPED_TRACE(&row - rows);
-        const UINT *m = row.metrics;
-        QBR_SetButtonMetrics(m[0], m[1], m[2], m[3], m[4], m[5]);
         QBR_SetButtonText(row.text);
         ASSERT_EQ(1u, QBR_SetImageStrip(manager, row.strip));
         HWND pane = Make({1, 0, 2, 3});
@@ -147,9 +123,6 @@ TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
         EXPECT_EQ((std::vector<RECT>{Rect(l, t, l + bw, t + bh), Rect(sep, t, sep + s.separator, t + bh),
                                      Rect(two, t, two + bw, t + bh), Rect(three, t, three + bw, t + bh)}),
                   rects);
-        const RECT outer = WindowRectInParent(pane);
-        EXPECT_EQ(three + bw + l + 2 * GetSystemMetrics(SM_CXBORDER), outer.right - outer.left);
-        EXPECT_EQ(t + bh + s.paneBottom + 2 * GetSystemMetrics(SM_CYBORDER), outer.bottom - outer.top);
         const Pixels shown = ReadWindowPixels(pane), strip = row.resource ? StripResource(row.resource) : shown;
         const int f = row.resource == s.main ? 1 : s.dpi / 96, cw = strip.width / 23 * f, ch = strip.height / 2 * f;
         for (UINT item : {0u, 2u, 3u}) {
@@ -164,13 +137,11 @@ TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
         }
         QBR_DestroyToolbar(pane);
     }
-    QBR_SetButtonMetrics(0, 0, 0, 0, 0, 0);
     QBR_SetButtonText(0);
 }
 
-// The chevron is 13 pixels wide at 96 DPI and grows with the scale, its » in
-// whole-pixel squares (2 at 192); each menu line shows its button's image at
-// the scale, pixel for pixel.
+// The chevron is 13 pixels wide at 96 DPI and grows with the scale; each menu line shows its button's
+// image at the scale, pixel for pixel.
 TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     ASSERT_EQ(1u, QBR_SetImageStrip(manager, "MAIN"));
     HWND pane = Make({1, 2, 3, 4, 5, 6});
@@ -181,12 +152,7 @@ TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     RECT chevron;
     ASSERT_EQ(1u, ChevronRect(RecordOfWindow(pane), &chevron));
     EXPECT_EQ(MulDiv(13, s.dpi, 96), chevron.right - chevron.left);
-    const Pixels p = ReadWindowPixels(pane), strip = StripResource(s.main);
-    int inked = 0;
-    for (int y = chevron.top; y < chevron.bottom; ++y)
-        for (int x = chevron.left; x < chevron.right; ++x)
-            inked += p.At(x, y) == GetSysColor(COLOR_BTNTEXT);
-    EXPECT_EQ(28 * std::max(1, s.dpi / 96) * std::max(1, s.dpi / 96), inked) << "two heads of 7 rows of 2 pixels";
+    const Pixels strip = StripResource(s.main);
     const int cw = strip.width / 23, ch = strip.height / 2;
     int lines = 0, right = 0; // lines with an image; those showing the button's own, at the scale's size
     ModalSteps::Until([&] {
@@ -214,9 +180,8 @@ TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     EXPECT_GE(lines, 2);
 }
 
-// A frame moved to another scale takes the suggested rectangle, and every
-// dock, pane and floating frame has the rectangle and pixels of one made at
-// that scale (three rows of three kept); the labels' ink grows or shrinks.
+// A frame moved to another scale takes the suggested rectangle, and every dock, pane and floating frame
+// has the rectangle and pixels of one made at that scale (three rows of three kept).
 TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
     const int here = ScreenDpi(), other = here == 96 ? 144 : here == 144 ? 192 : 96;
     RECT suggested = {60, 50, 760, 500};
@@ -224,7 +189,6 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
     QBR_SetQuickHelp(0);
     std::vector<RECT> rects[2];
     std::vector<Pixels> pixels[2];
-    int before = 0;
     for (int fresh = 0; fresh < 2; ++fresh) {
         Host h(fresh ? other : here);
         QBR_SetImageStrip(h.manager, "SINGLE");
@@ -235,7 +199,6 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
         const int width = 3 * 47 + 25 + 2 * 6 + 2 * GetSystemMetrics(SM_CXFRAME);
         HWND floating = QBR_CreateToolbar("Floating", TBF_VISIBLE | TBF_FLOATING, 300, 300, width, 0, top, kNine, 9);
         Pump();
-        if (!fresh) before = LabelInk(ReadWindowPixels(pane), ItemRects(pane)[0]);
         if (!fresh) QBR_DpiChanged(h.frame, MAKEWPARAM(other, other), LPARAM(&suggested));
         if (fresh) SetWindowPos(h.frame, nullptr, 60, 50, 700, 450, SWP_NOZORDER | SWP_NOACTIVATE);
         Pump();
@@ -246,29 +209,23 @@ TEST_F(ClientTest, AFrameMovedToAnotherScaleIsAsOneMadeThere) {
             rects[fresh].push_back(WindowRectInParent(w));
             pixels[fresh].push_back(ReadWindowPixels(w));
         }
-        if (!fresh) EXPECT_GT((other - here) * (LabelInk(pixels[0][1], ItemRects(pane)[0]) - before), 0) << before;
     }
     QBR_SetButtonText(0);
     EXPECT_EQ(GetSysColor(COLOR_ACTIVECAPTION), pixels[0][2].At(pixels[0][2].width - 2, 1)) << "band, active or not";
     for (size_t i = 0; i < 3; ++i) {
         EXPECT_EQ(rects[1][i], rects[0][i]) << "dock, docked toolbar, floating frame: " << i;
-        int differ = 0;
-        for (size_t k = 0; k < pixels[1][i].colors.size(); ++k)
-            differ += pixels[1][i].colors[k] != pixels[0][i].colors.at(k);
-        EXPECT_EQ(0, differ) << "pixels differ: " << i;
+        EXPECT_TRUE(pixels[1][i].colors == pixels[0][i].colors) << "pixels differ: " << i;
     }
 }
 
 namespace {
 
-// A floating toolbar's stored value: its frame sized for `across` buttons at `dpi`, at (x, y).
-std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int x, int y) {
+// A floating toolbar of buttons 1 to 4 as stored: its frame sized for them at `dpi`, at (x, y).
+std::string FloatingValue(int dpi, int x, int y) {
     RECT borders = {0, 0, 0, 0}; // the frame's border as a system at that scale gives it
     AdjustWindowRectExForDpi(&borders, WS_POPUP | WS_BORDER | WS_THICKFRAME, FALSE, 0, UINT(dpi));
-    std::string value = std::to_string(ids.size());
-    for (UINT id : ids)
-        value += "," + std::to_string(id);
-    const int width = FloatingClient(At(dpi), across, 1).right + borders.right - borders.left;
+    std::string value = "4,1,2,3,4";
+    const int width = FloatingClient(At(dpi)).right + borders.right - borders.left;
     for (int n : {33, x, y, x + width, y + 100})
         value += "," + std::to_string(n);
     return value;
@@ -276,71 +233,45 @@ std::string FloatingValue(const std::vector<UINT> &ids, int across, int dpi, int
 
 } // namespace
 
-// A table read at another scale, or read and the frame then moved: frames keep
-// their rows, stand in proportion to the screen written on, are as large as
-// their rows at the final scale; one on no screen comes back inside the work
-// area (then and at a display change), one partly on a screen stays. The
-// table written back names its scale unless 96 DPI.
+// A table read at another scale: frames stand in proportion to the screen written on and are as large as
+// their buttons at the scale; one on no screen comes back inside the work area, one partly on a screen stays.
 TEST_F(ClientTest, FloatingFramesSurviveEveryChangeOfScaleAndScreen) {
     const int other = ScreenDpi() == 96 ? 144 : ScreenDpi(), w = GetSystemMetrics(SM_CXSCREEN);
     const int h = GetSystemMetrics(SM_CYSCREEN);
     RECT work;
     SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0);
     const struct {
-        int written, read, after, shrink; // after: a live change of the frame; shrink: of the written screen
-    } cases[] = {{96, other, 0, 1}, {other, 96, 0, 2}, {96, 96, other, 1}, {other, other, 96, 1}};
-    const std::vector<UINT> four = {1, 2, 3, 4};
+        int written, read, shrink; // shrink: of the screen written on
+    } cases[] = {{96, other, 1}, {other, 96, 2}};
     const struct {
         const char *title;
-        std::vector<UINT> ids;
-        int across, rows, x, y;
-    } bars[] = {{"Row", four, 4, 1, 150, 100},
-                {"Grid", {1, 2, 3, 0, 4, 5, 6, 0, 7, 8, 9}, 3, 3, 150, 250},
-                {"Far", four, 4, 1, 5000, -3000},
-                {"West", four, 4, 1, -1500, 200},
-                {"Partly", four, 4, 1, -20, -10}};
+        int x, y;
+    } bars[] = {{"Row", 150, 100}, {"Far", 5000, -3000}, {"Partly", -20, -10}};
     for (const auto &c : cases) {
-        SCOPED_TRACE(testing::Message() << c.written << " DPI read at " << c.read << " then " << c.after);
+        SCOPED_TRACE(testing::Message() << c.written << " DPI read at " << c.read);
         QBR_BeginLayout();
-        QBR_AddLayoutEntry("Top Dock", "Row,Grid,Far,West,Partly");
+        QBR_AddLayoutEntry("Top Dock", "Row,Far,Partly");
         for (const auto &bar : bars)
-            QBR_AddLayoutEntry(bar.title, FloatingValue(bar.ids, bar.across, c.written, bar.x, bar.y).c_str());
+            QBR_AddLayoutEntry(bar.title, FloatingValue(c.written, bar.x, bar.y).c_str());
         const std::string scale =
             std::to_string(c.written) + "," + std::to_string(w / c.shrink) + "," + std::to_string(h / c.shrink);
         if (c.written != 96) QBR_AddLayoutEntry("Display Scale", scale.c_str());
         Host made(c.read);
         QBR_ApplyLayout(made.manager, made.frame);
         QBR_FreeLayout();
-        if (c.after) QBR_DpiChanged(made.frame, MAKEWPARAM(c.after, c.after), 0);
         Pump();
         // Where a frame of `size` stands along one axis: in proportion, or brought back inside.
         auto want = [&](int at, int screen, LONG low, LONG high, int size) {
             const int scaled = MulDiv(at, screen, screen / c.shrink);
             return scaled + size <= 0 ? low : scaled >= screen ? high - size : scaled;
         };
-        for (UINT i = 0; i < 5; ++i) {
+        for (UINT i = 0; i < 3; ++i) {
             HWND floating = ResolveRoleWindow(QBR_GetToolbar(made.manager, i), ROLE_FLOATING);
             const RECT r = WindowRectInParent(floating);
-            EXPECT_EQ(FloatingClient(At(c.after ? c.after : c.read), bars[i].across, bars[i].rows),
-                      ClientRectOf(floating))
-                << bars[i].title;
-            if (!c.after || bars[i].x < w) // (a frame brought back at its right edge keeps its left on a new scale)
-                EXPECT_EQ(want(bars[i].x, w, work.left, work.right, r.right - r.left), r.left) << bars[i].title;
+            EXPECT_EQ(FloatingClient(At(c.read)), ClientRectOf(floating)) << bars[i].title;
+            EXPECT_EQ(want(bars[i].x, w, work.left, work.right, r.right - r.left), r.left) << bars[i].title;
             EXPECT_EQ(want(bars[i].y, h, work.top, work.bottom, r.bottom - r.top), r.top) << bars[i].title;
         }
-        // The screen that held a frame is gone: the window system leaves it there, the library does not.
-        HWND row = ResolveRoleWindow(QBR_GetToolbar(made.manager, 0), ROLE_FLOATING);
-        const RECT was = WindowRectInParent(row);
-        SetWindowPos(row, nullptr, -3000, 5000, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
-        SendMessageA(row, WM_DISPLAYCHANGE, 32, MAKELPARAM(w, h));
-        EXPECT_EQ(Rect(work.left, work.bottom - (was.bottom - was.top), work.left + was.right - was.left, work.bottom),
-                  WindowRectInParent(row));
-        UINT count = 0;
-        char key[64], value[512];
-        QBR_CaptureLayout(made.manager, &count);
-        QBR_GetLayoutEntry(0, key, value);
-        QBR_FreeLayout();
-        EXPECT_EQ((c.after ? c.after : c.read) != 96, std::string(key) == "Display Scale") << key;
     }
 }
 
@@ -353,9 +284,8 @@ double Weakest(const std::set<COLORREF> &ink, const std::set<COLORREF> &back) {
     return weakest;
 }
 
-// Every state, with and without labels, dark and high contrast, read back:
-// each glyph pixel against every colour of its background at least 3:1, the
-// label's strongest pixel at least 4.5:1 (ink and background told apart by
+// Every labelled state, dark and high contrast, read back: each glyph pixel against every colour of its
+// background at least 3:1, the label's strongest pixel at least 4.5:1 (ink and background told apart by
 // the stored strip).
 TEST_F(ScaleTest, EveryStateReadsClearlyInTheDarkAndHighContrastSchemes) {
     AddButtons(7, 2);
@@ -367,47 +297,43 @@ TEST_F(ScaleTest, EveryStateReadsClearlyInTheDarkAndHighContrastSchemes) {
     const Pixels stored = BitmapPixels(manager->imageStrip);
     int cw = 0, ch = 0;
     StripCellSize(manager, &cw, &ch);
-    for (UINT scheme : {QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST})
-        for (UINT text : {0u, 1u}) {
-            SCOPED_TRACE(std::string(scheme == QBR_SCHEME_DARK ? "dark" : "high contrast") + (text ? ", labels" : ""));
-            QBR_SetColorScheme(scheme);
-            QBR_SetButtonText(text);
-            HWND pane = Make({1, 2, 3, 4, 5, 6, 7, 8});
-            for (UINT i = 0; i < 8; ++i) {
-                QBR_SetButtonState(manager, i + 1, (states[i] & BS_ON) ? 1 : (states[i] & BS_MIXED) ? 2 : 0);
-                QBR_SetButtonEnabled(manager, i + 1, (states[i] & BS_DISABLED) ? 0 : 1);
-                QBR_SetButtonPressed(manager, i + 1, (states[i] & BS_PRESSED) ? 1 : 0);
-            }
-            Pump();
-            RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
-            const Pixels shown = ReadWindowPixels(pane);
-            const std::vector<RECT> rects = ItemRects(pane);
-            for (UINT i = 0; i < 8; ++i) {
-                const RECT &r = rects[i];
-                UINT image = 0;
-                QBR_GetButtonImage(manager, i + 1, &image);
-                const int sunk = (states[i] & (BS_ON | BS_PRESSED)) ? 1 : 0;
-                const int ix = r.left + 1 + ((r.right - r.left - 2 - cw - 1) >> 1) + sunk;
-                const int iy = r.top + 1 + sunk +
-                               (text ? ManagerMetrics(manager).labelImageTop : (r.bottom - r.top - 2 - ch) >> 1);
-                std::set<COLORREF> ink, back;
-                for (int y = 0; y < ch; ++y)
-                    for (int x = 0; x < cw; ++x) {
-                        const COLORREF was = stored.At(int(image % 23) * cw + x, int(image / 23) * ch + y);
-                        if (was == RGB(192, 192, 192)) back.insert(shown.At(ix + x, iy + y));
-                        if (was != RGB(192, 192, 192) && was != RGB(255, 255, 255))
-                            ink.insert(shown.At(ix + x, iy + y));
-                    }
-                EXPECT_GE(Weakest(ink, back), 3.0) << "glyph, state " << states[i];
-                double strongest = 0; // the label's core against every background colour
-                for (int y = iy + ch; text && y < r.bottom - 1; ++y)
-                    for (int x = r.left + 3; x < r.right - 3; ++x)
-                        if (!back.count(shown.At(x, y)))
-                            strongest = std::max(strongest, Weakest({shown.At(x, y)}, back));
-                if (text) EXPECT_GE(strongest, 4.5) << "label, state " << states[i];
-            }
-            QBR_DestroyToolbar(pane);
+    QBR_SetButtonText(1);
+    for (UINT scheme : {QBR_SCHEME_DARK, QBR_SCHEME_HIGHCONTRAST}) {
+        SCOPED_TRACE(scheme == QBR_SCHEME_DARK ? "dark" : "high contrast");
+        QBR_SetColorScheme(scheme);
+        HWND pane = Make({1, 2, 3, 4, 5, 6, 7, 8});
+        for (UINT i = 0; i < 8; ++i) {
+            QBR_SetButtonState(manager, i + 1, (states[i] & BS_ON) ? 1 : (states[i] & BS_MIXED) ? 2 : 0);
+            QBR_SetButtonEnabled(manager, i + 1, (states[i] & BS_DISABLED) ? 0 : 1);
+            QBR_SetButtonPressed(manager, i + 1, (states[i] & BS_PRESSED) ? 1 : 0);
         }
+        Pump();
+        RedrawWindow(pane, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW);
+        const Pixels shown = ReadWindowPixels(pane);
+        const std::vector<RECT> rects = ItemRects(pane);
+        for (UINT i = 0; i < 8; ++i) {
+            const RECT &r = rects[i];
+            UINT image = 0;
+            QBR_GetButtonImage(manager, i + 1, &image);
+            const int sunk = (states[i] & (BS_ON | BS_PRESSED)) ? 1 : 0;
+            const int ix = r.left + 1 + ((r.right - r.left - 2 - cw - 1) >> 1) + sunk;
+            const int iy = r.top + 1 + sunk + ManagerMetrics(manager).labelImageTop;
+            std::set<COLORREF> ink, back;
+            for (int y = 0; y < ch; ++y)
+                for (int x = 0; x < cw; ++x) {
+                    const COLORREF was = stored.At(int(image % 23) * cw + x, int(image / 23) * ch + y);
+                    if (was == RGB(192, 192, 192)) back.insert(shown.At(ix + x, iy + y));
+                    if (was != RGB(192, 192, 192) && was != RGB(255, 255, 255)) ink.insert(shown.At(ix + x, iy + y));
+                }
+            EXPECT_GE(Weakest(ink, back), 3.0) << "glyph, state " << states[i];
+            double strongest = 0; // the label's core against every background colour
+            for (int y = iy + ch; y < r.bottom - 1; ++y)
+                for (int x = r.left + 3; x < r.right - 3; ++x)
+                    if (!back.count(shown.At(x, y))) strongest = std::max(strongest, Weakest({shown.At(x, y)}, back));
+            EXPECT_GE(strongest, 4.5) << "label, state " << states[i];
+        }
+        QBR_DestroyToolbar(pane);
+    }
     QBR_SetButtonText(0);
     QBR_SetColorScheme(QBR_SCHEME_SYSTEM);
 }
