@@ -24,12 +24,12 @@ int ScreenDpi() {
 // and 150 %) gives there; SINGLE (100 % only) is enlarged by dpi / 96 whole.
 struct Scaled {
     int dpi, buttonWidth, buttonHeight, imageWidth, imageHeight, textWidth, textHeight;
-    int areaLeft, paneTop, frameTop, frameBottom, separator;
+    int areaLeft, paneTop, paneBottom, frameTop, frameBottom, separator;
     const char *main;
 };
-constexpr Scaled kScales[] = {{96, 24, 22, 16, 15, 48, 44, 6, 3, 3, 3, 10, "MAIN"},
-                              {144, 36, 33, 24, 23, 72, 66, 9, 5, 5, 5, 15, "MAIN_150"},
-                              {192, 48, 44, 32, 30, 96, 88, 12, 6, 6, 6, 20, "MAIN_150"}};
+constexpr Scaled kScales[] = {{96, 24, 22, 16, 15, 48, 44, 6, 3, 4, 3, 3, 10, "MAIN"},
+                              {144, 36, 33, 24, 23, 72, 66, 9, 5, 6, 5, 5, 15, "MAIN_150"},
+                              {192, 48, 44, 32, 30, 96, 88, 12, 6, 8, 6, 6, 20, "MAIN_150"}};
 const Scaled &At(int dpi) { return kScales[dpi == 144 ? 1 : dpi == 192 ? 2 : 0]; }
 
 Pixels BitmapPixels(HBITMAP bitmap) {
@@ -123,6 +123,8 @@ TEST_F(ScaleTest, ItemsImagesAndPaneSizeAtTheFramesScale) {
         EXPECT_EQ((std::vector<RECT>{Rect(l, t, l + bw, t + bh), Rect(sep, t, sep + s.separator, t + bh),
                                      Rect(two, t, two + bw, t + bh), Rect(three, t, three + bw, t + bh)}),
                   rects);
+        EXPECT_EQ(t + bh + s.paneBottom + 2 * GetSystemMetrics(SM_CYBORDER), WindowRectInParent(pane).bottom -
+                                                                                 WindowRectInParent(pane).top);
         const Pixels shown = ReadWindowPixels(pane), strip = row.resource ? StripResource(row.resource) : shown;
         const int f = row.resource == s.main ? 1 : s.dpi / 96, cw = strip.width / 23 * f, ch = strip.height / 2 * f;
         for (UINT item : {0u, 2u, 3u}) {
@@ -152,7 +154,12 @@ TEST_F(ScaleTest, TheChevronAndItsMenuAtTheFramesScale) {
     RECT chevron;
     ASSERT_EQ(1u, ChevronRect(RecordOfWindow(pane), &chevron));
     EXPECT_EQ(MulDiv(13, s.dpi, 96), chevron.right - chevron.left);
-    const Pixels strip = StripResource(s.main);
+    const Pixels p = ReadWindowPixels(pane), strip = StripResource(s.main);
+    int inked = 0; // the » in whole-pixel squares: two heads of 7 rows of 2 pixels
+    for (int y = chevron.top; y < chevron.bottom; ++y)
+        for (int x = chevron.left; x < chevron.right; ++x)
+            inked += p.At(x, y) == GetSysColor(COLOR_BTNTEXT);
+    EXPECT_EQ(28 * std::max(1, s.dpi / 96) * std::max(1, s.dpi / 96), inked);
     const int cw = strip.width / 23, ch = strip.height / 2;
     int lines = 0, right = 0; // lines with an image; those showing the button's own, at the scale's size
     ModalSteps::Until([&] {
