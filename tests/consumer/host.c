@@ -33,24 +33,13 @@ static int CALLBACK HostHelpText(UINT id, UINT kind, LPSTR buffer, int size) {
     return id == HOST_NEW ? lstrlenA(lstrcpynA(buffer, "New", size)) : 0;
 }
 
-static void PumpFor(DWORD milliseconds) {
-    DWORD start = GetTickCount();
-    MSG msg;
-    do {
-        while (PeekMessageA(&msg, NULL, 0, 0, PM_REMOVE)) {
-            TranslateMessage(&msg);
-            DispatchMessageA(&msg);
-        }
-        Sleep(5);
-    } while (GetTickCount() - start < milliseconds);
-}
-
 int WINAPI WinMain(HINSTANCE instance, HINSTANCE previous, LPSTR commandLine, int show) {
     static const UINT ids[] = {HOST_NEW, HOST_OPEN, HOST_SAVE};
     WNDCLASSA frameClass;
     OPENFILENAMEA openFile; /* comdlg32's, which a trimmed windows.h would not declare */
     HINSTANCE(WINAPI * openDocument)(HWND, LPCSTR, LPCSTR, LPCSTR, LPCSTR, INT) = ShellExecuteA;
     char text[64];
+    MSG msg;
     HWND frame, dock, pane;
     RECT paneRect;
     ToolbarManager *manager;
@@ -92,7 +81,8 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE previous, LPSTR commandLine, in
     ShowWindow(frame, SW_SHOWNORMAL);
     SetForegroundWindow(frame);
     UpdateWindow(frame);
-    PumpFor(200);
+    while (PeekMessageA(&msg, NULL, 0, 0, PM_REMOVE))
+        DispatchMessageA(&msg);
     GetWindowRect(pane, &paneRect);
     if (!IsWindowVisible(pane) || paneRect.right - paneRect.left < 3 * 16 || paneRect.bottom - paneRect.top < 15)
         return Fail(10, "the toolbar is not shown at its size");
