@@ -75,8 +75,7 @@ class LayoutTest : public FrameTest {
             EXPECT_EQ(1u, QBR_AddLayoutEntry(e.first.c_str(), e.second.c_str()));
         EXPECT_EQ(1u, QBR_ApplyLayout(others.back().second, window));
         Pump();
-        const Entries rest = Read(static_cast<UINT>(entries.size()));
-        if (left) *left = rest;
+        if (const Entries rest = Read(static_cast<UINT>(entries.size())); left) *left = rest;
         return others.back().second;
     }
     void Clear() {

@@ -67,9 +67,7 @@ TEST_F(ToolbarTest, TheFlowPlacesItemsInRows) {
         QBR_DestroyToolbar(pane);
         pane = Make(k.ids, k.flags);
         HWND target = ResolveRoleWindow(pane, (k.flags & F) ? ROLE_FLOATING : ROLE_DOCKED);
-        RECT outer, client;
-        GetWindowRect(target, &outer);
-        GetClientRect(target, &client);
+        const RECT outer = WindowRectInParent(target), client = ClientRectOf(target);
         SetWindowPos(target, nullptr, 0, 0, k.right + kAreaRight + (outer.right - outer.left) - client.right,
                      200 + (outer.bottom - outer.top) - client.bottom, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
         EXPECT_EQ(k.expected, Rects(pane)) << "flags " << k.flags << " right " << k.right;
@@ -166,6 +164,9 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     EXPECT_EQ(places[2].left + 23, WindowRectInParent(next).left);
     EXPECT_EQ(1, heardBy[next]) << "the moved pane is painted once";
     EXPECT_EQ(0, CountHeard(WM_SIZE));
+    EXPECT_EQ(24, Rects(docked)[1].right - Rects(docked)[1].left); // a move inside: the same size, other rectangles
+    RemoveItem(RecordOfWindow(docked), Item(S)), InsertItemAt(RecordOfWindow(docked), 1, Item(S));
+    EXPECT_EQ(10, Rects(docked)[1].right - Rects(docked)[1].left) << "a moved separator's width where it went";
     const RECT natural = Rect(200, 200, 200 + 70 + 12 + 2 * fx, 200 + 22 + 6 + 2 * fy + captionHeight);
     SetWindowPos(Frame(floating), nullptr, 0, 0, natural.right - natural.left, 2, SWP_NOMOVE | SWP_NOZORDER);
     RefitToolbar(floating, ROLE_FLOATING);
@@ -180,12 +181,11 @@ TEST_F(ToolbarTest, SettersRefitsAndEditsPaintAndPlaceOnlyWhatChanged) {
     EXPECT_EQ(1, heardBy[Frame(docked)]);
     EXPECT_EQ(placed, shown);
     Watch(0);
-    HWND pane = nullptr;
     EXPECT_EQ(0u, InsertItemAt(RecordOfWindow(docked), 0, Item(2))) << "a button stands once in a toolbar";
     const std::vector<UINT> cleaned[][2] = {{{1, S, S, S, 2}, {1, S, S, 2}}, {{S, 1, S}, {1}}, {{S, S}, {}}};
     for (const auto &k : cleaned) { // no separator at an end, no three side by side
-        CleanSeparators(RecordOfWindow(pane = Make(k[0])));
-        EXPECT_EQ(k[1], ToolbarIds(pane));
+        CleanSeparators(RecordOfWindow(next = Make(k[0])));
+        EXPECT_EQ(k[1], ToolbarIds(next));
     }
 }
 
