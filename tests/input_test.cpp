@@ -102,10 +102,9 @@ TEST_F(InputTest, ACompletedPressActsByBehaviour) {
     }
 }
 
-// Scripts of mouse steps and i, a (application inactive, active). `looks`: whether button 1 looks pressed after
-// each step (the look is on the screen when the host hears the press); button 2, a disabled check button, is
-// reported but never looks pressed or acts. A double click on the empty space or the caption docks or floats a
-// toolbar whose place is not locked; the close box tracks like a button and hides it.
+// Mouse steps and i, a (application inactive, active); `looks`: button 1 looks pressed after each step (on the screen
+// as the host hears the press); button 2, disabled, is reported but never looks pressed or acts. A double click on the
+// empty space or caption docks or floats an unlocked toolbar; the close box tracks like a button and hides it.
 TEST_F(InputTest, ScriptsOfPressesMovesAndDoubleClicks) {
     QBR_SetButtonBehaviour(manager, 2, BTN_CHECK);
     QBR_SetButtonEnabled(manager, 2, 0);
@@ -172,7 +171,8 @@ TEST_F(InputTest, FloatingFramesKeepTheirOrderAboveTheHost) {
     };
     PumpFor(3 * kRestackPeriod);
     ASSERT_EQ(order, stacking());
-    HWND other = CreateWindowExA(0, "STATIC", "", WS_POPUP | WS_VISIBLE, 500, 200, 400, 300, nullptr, 0, 0, nullptr);
+    HWND other = CreateWindowExA(0, "STATIC", "Other", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 500, 200, 400, 300, nullptr,
+                                 nullptr, nullptr, nullptr);
     SetForegroundWindow(other);
     PumpFor(3 * kRestackPeriod);
     POINT p = Centre(ItemRect(docked, 1));

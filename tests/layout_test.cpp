@@ -120,7 +120,8 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     HWND restoredTop = QBR_GetDock(other, DOCK_TOP), restoredBottom = QBR_GetDock(other, DOCK_BOTTOM);
     const RECT pane = WindowRectInParent(QBR_GetToolbar(other, 0)); // the docks shown and packed
     EXPECT_EQ(Rect(-1, -1, pane.right, ClientRectOf(restoredTop).bottom), pane);
-    EXPECT_TRUE(IsWindowVisible(restoredBottom) &&
+    EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(QBR_GetToolbar(other, 1), ROLE_FLOATING)) &&
+                IsWindowVisible(restoredBottom) &&
                 ClientRectOf(GetParent(restoredBottom)).bottom == WindowRectInParent(restoredBottom).bottom);
 }
 

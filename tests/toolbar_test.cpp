@@ -1,5 +1,4 @@
-// Toolbars in real windows: the flow of items into rows, hit tests and drops, the
-// pane and frame pair and its flags, and what setters, refits and edits cost.
+// Toolbars in real windows: the flow of items into rows, the pane and frame pair, what setters and edits cost.
 #include <algorithm>
 #include <map>
 #include <vector>
