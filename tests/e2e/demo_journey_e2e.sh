@@ -90,6 +90,12 @@ read -r v l t r b <<<"$(toolbar_rect "$main" pane Style)"
 read -r v l2 t2 r2 b2 <<<"$(toolbar_rect "$main" pane Standard)"
 [ $((r2 - l2)) = $((pr - pl - 23)) ] || [ $((b2 - t2)) -lt $((pb - pt)) ] || fail "Standard did not lose a button: $pl $pt $pr $pb -> $l2 $t2 $r2 $b2"
 
+# ---- Align's frame narrowed by its right edge: its buttons take more rows ----
+read -r v l t r b <<<"$(toolbar_rect "$main" frame Align)"
+ldrag $((r - 2)) $(((t + b) / 2)) $((r - 50)) $(((t + b) / 2))
+read -r v l2 t2 r2 b2 <<<"$(toolbar_rect "$main" frame Align)"
+[ "$r2" -lt "$r" ] && [ $((b2 - t2)) -gt $((b - t)) ] || fail "Align was not sized by its edge: $l $t $r $b -> $l2 $t2 $r2 $b2"
+
 # ---- Button text on, from the keyboard: View > Button Text ----
 xdotool mousemove $((ml + 300)) $((mb - 100)) click 1 # the edit control takes the focus
 settle

@@ -56,11 +56,6 @@ BOOL CALLBACK FindMenuWindow(HWND window, LPARAM) {
     return TRUE;
 }
 
-BOOL CALLBACK CollectText(HWND child, LPARAM out) {
-    *reinterpret_cast<std::string *>(out) += TextOf(child) + "|";
-    return TRUE;
-}
-
 } // namespace
 
 void ModalSteps::Add(std::function<void()> step) {
@@ -104,8 +99,6 @@ void SendButton(DWORD flags) {
     SendInput(1, &input, sizeof input);
 }
 
-bool ButtonDown(int key) { return (GetKeyState(key) & 0x8000) != 0; }
-
 HMENU OpenMenu() {
     visibleMenuWindow = nullptr;
     EnumThreadWindows(GetCurrentThreadId(), FindMenuWindow, 0);
@@ -146,10 +139,4 @@ std::string TextOf(HWND window) {
     char text[300] = "";
     GetWindowTextA(window, text, sizeof text);
     return text;
-}
-
-std::string ChildTexts(HWND window) {
-    std::string out;
-    EnumChildWindows(window, CollectText, reinterpret_cast<LPARAM>(&out));
-    return out;
 }

@@ -26,8 +26,6 @@ void Stop(); // drops what is left; call after the modal loop returned
 void ClickAtStep(POINT at);
 // A real mouse button event at the cursor (MOUSEEVENTF_LEFTDOWN, ...).
 void SendButton(DWORD flags);
-// The thread has taken the last message of this button (VK_LBUTTON, ...).
-bool ButtonDown(int key);
 
 // The popup menu on the screen, or null; its entries as "text:id", a star
 // after a checked text, "--" for a separator, joined by " | ".
@@ -38,5 +36,3 @@ void ClickMenuEntry(HMENU menu, const char *text);
 
 POINT Centre(const RECT &r);
 std::string TextOf(HWND window);
-// The texts of a window's children, each followed by "|".
-std::string ChildTexts(HWND window);
