@@ -5,7 +5,7 @@ set -eu
 # clang and g++-mingw-w64-i686 serve the portable builds (scripts/portable-build.sh);
 # python3 only the tests and tools, never the build.
 packages="g++-mingw-w64-x86-64 mingw-w64-tools wine wine64 xvfb xauth cmake make googletest xdotool imagemagick x11-apps python3 util-linux rsync"
-packages="$packages clang g++-mingw-w64-i686 g++-mingw-w64-i686-posix"
+packages="$packages clang g++-mingw-w64-i686 g++-mingw-w64-i686-posix ccache"
 missing=""
 for p in $packages; do
     dpkg-query -W -f='${Status}' "$p" 2>/dev/null | grep -q "install ok installed" || missing="$missing $p"
