@@ -8,24 +8,11 @@
 UINT appActive = 1; // moves are served before the first WM_ACTIVATEAPP
 UINT borderSizing = 0;
 
-constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
-
-// The pane makes its floating frame, links the two and makes the record. The
-// frame passes through here too, and does nothing.
+// The pane makes the record (its floating frame is made when first needed).
+// The frame passes through here too, and does nothing.
 static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
     if (!(create->style & WS_CHILD)) return 0;
-    HWND frame =
-        CreateWindowExA(0, create->lpszClass, create->lpszName, kFrameStyle, CW_USEDEFAULT, CW_USEDEFAULT, create->cx,
-                        create->cy, GetParent(create->hwndParent), nullptr, create->hInstance, create->lpCreateParams);
-    if (!frame) return -1;
-    ApplyFrameScheme(frame);
-    SetTwinWindow(frame, window);
-    SetTwinWindow(window, frame);
-    if (!CreateToolbarRecord(window)) {
-        DestroyWindow(frame);
-        return -1;
-    }
-    return 0;
+    return CreateToolbarRecord(window) ? 0 : -1;
 }
 
 static void OnSize(HWND window) {

@@ -92,8 +92,7 @@ extern "C" UINT QBR_GetLayoutEntrySize(UINT index, UINT *keyLength, UINT *valueL
 
 UINT FormatToolbarLayout(ToolbarRecord *toolbar, LPSTR *key, LPSTR *value) {
     char buffer[256];
-    HWND frame = ResolveRoleWindow(toolbar->paneWindow, ROLE_FLOATING);
-    if (!frame || !GetWindowTextA(frame, buffer, 255)) buffer[0] = '\0';
+    QBR_GetToolbarTitle(toolbar->paneWindow, buffer, 255);
     if (!StringDuplicate(key, buffer)) return 0;
     UINT count = PointerListCount(toolbar->items);
     wsprintfA(buffer, "%d", static_cast<int>(count));
@@ -130,8 +129,7 @@ static void FreeEntries(LPSTR *keys, LPSTR *values, UINT count) {
 }
 
 static bool HasTitle(const ToolbarRecord *toolbar) {
-    HWND frame = ResolveRoleWindow(toolbar->paneWindow, ROLE_FLOATING);
-    return frame && GetWindowTextLengthA(frame) > 0;
+    return GetWindowTextLengthA(toolbar->paneWindow) > 0;
 }
 
 // The dock's toolbars that are stored: an empty title at the end of the
@@ -243,16 +241,15 @@ constexpr UINT kMostLayoutItems = 65535;
 // instead of 4 on each side at 150 %) the last item of a full row would wrap.
 // So the rectangle grows or shrinks by the difference, and the items have
 // the room they had.
-static void KeepRoomInsideBorders(HWND frame, UINT writtenDpi, RECT *rect) {
-    if (!frame) return;
-    const DWORD style = static_cast<DWORD>(GetWindowLongA(frame, GWL_STYLE));
-    const DWORD exStyle = static_cast<DWORD>(GetWindowLongA(frame, GWL_EXSTYLE));
+static void KeepRoomInsideBorders(HWND pane, UINT writtenDpi, RECT *rect) {
+    const DWORD style = GetToolbarWindowStyle(pane, ROLE_FLOATING, GWL_STYLE);
+    const DWORD exStyle = GetToolbarWindowStyle(pane, ROLE_FLOATING, GWL_EXSTYLE);
     RECT written, outer, client;
     WindowBordersAt(style, exStyle, writtenDpi, &written);
     // The borders this frame has, measured: under Wine every window has the
     // screen's, whatever scale its monitor is said to have. Of a frame sized
     // below its borders only the platform's numbers tell them.
-    GetPlacedRects(frame, &outer, &client);
+    GetToolbarPlacedRects(pane, ROLE_FLOATING, &outer, &client);
     int nowWidth = (outer.right - outer.left) - client.right, nowHeight = (outer.bottom - outer.top) - client.bottom;
     if (client.right <= 0 || client.bottom <= 0) {
         RECT platform = {0, 0, 0, 0};
@@ -285,7 +282,7 @@ static HWND RestoreToolbarAt(HWND dockWindow, LPCSTR title, LPSTR *cursor) {
     r.top = NextTokenInt(cursor);
     r.right = NextTokenInt(cursor);
     r.bottom = NextTokenInt(cursor);
-    KeepRoomInsideBorders(ResolveRoleWindow(pane, ROLE_FLOATING), ManagerDpi(manager), &r);
+    KeepRoomInsideBorders(pane, ManagerDpi(manager), &r);
     MoveToolbarWindow(pane, ROLE_FLOATING, &r);
     DockArea *dock = FindDockRecord(dockWindow);
     if (dock) InsertToolbarBefore(dock, nullptr, record);
@@ -361,13 +358,11 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
     const int width = GetSystemMetrics(SM_CXSCREEN), height = GetSystemMetrics(SM_CYSCREEN);
     if (width == written.screenWidth && height == written.screenHeight) return;
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
-        HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
-        if (!frame) continue;
         RECT r;
-        GetToolbarWindowRect(frame, ROLE_FLOATING, &r);
+        GetToolbarWindowRect(record->paneWindow, ROLE_FLOATING, &r);
         OffsetRect(&r, MulDiv(r.left, width, written.screenWidth) - r.left,
                    MulDiv(r.top, height, written.screenHeight) - r.top);
-        MoveToolbarWindow(frame, ROLE_FLOATING, &r);
+        MoveToolbarWindow(record->paneWindow, ROLE_FLOATING, &r);
     }
 }
 
@@ -384,6 +379,6 @@ extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     PlaceFloatingInProportion(manager, written);
     // A table may name places on a monitor that is gone.
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i)
-        KeepFloatingFrameOnScreen(ResolveRoleWindow(record->paneWindow, ROLE_FLOATING));
+        KeepFloatingFrameOnScreen(record->paneWindow);
     return ok;
 }

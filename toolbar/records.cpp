@@ -58,7 +58,8 @@ void DestroyToolbarRecord(ToolbarRecord *record) {
     // A later window may get this pane's handle: the lookup cache must not
     // hand it this toolbar's manager.
     ForgetToolbarWindow(record->paneWindow);
-    ForgetWaitingWindow(ResolveRoleWindow(record->paneWindow, ROLE_FLOATING));
+    ForgetWaitingWindow(GetTwinWindow(record->paneWindow));
+    ForgetWaitingWindow(record->paneWindow);
     ForgetShownLayout(record, true);
     MemoryBlockFree(record);
 }
@@ -137,9 +138,9 @@ extern "C" UINT QBR_IsToolbarVisible(HWND pane) { return RecordIsVisible(RecordO
 
 extern "C" void QBR_GetToolbarTitle(HWND window, LPSTR buffer, int size) {
     if (!buffer || size <= 0) return;
-    HWND frame =
-        (IsToolbarPane(window) || IsFloatingFrame(window)) ? ResolveRoleWindow(window, ROLE_FLOATING) : nullptr;
-    if (!frame || !GetWindowTextA(frame, buffer, size)) buffer[0] = '\0';
+    // Both windows are made with the title; the pane's is there before the frame is.
+    HWND pane = (IsToolbarPane(window) || IsFloatingFrame(window)) ? ResolveRoleWindow(window, ROLE_DOCKED) : nullptr;
+    if (!pane || !GetWindowTextA(pane, buffer, size)) buffer[0] = '\0';
 }
 
 extern "C" HWND QBR_GetToolbarDock(HWND pane) {

@@ -85,6 +85,10 @@ UINT IsSideDocked(HWND window);
 // as the packing places it (PlaceWaitingWindow puts a window there now), and
 // both read so until then.
 void GetPlacedRects(HWND window, RECT *outer, RECT *client);
+// The same for a toolbar's window of `role`, and its style (`which`: GWL_STYLE
+// or GWL_EXSTYLE), whether or not its floating frame is made yet.
+void GetToolbarPlacedRects(HWND window, int role, RECT *outer, RECT *client);
+DWORD GetToolbarWindowStyle(HWND window, int role, int which);
 void PlaceWaitingWindow(HWND window);
 void ForgetWaitingWindow(HWND window);
 void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos);
@@ -100,8 +104,9 @@ UINT ShapePaneForDock(HWND window);
 UINT RefitToolbar(HWND window, int role);
 UINT RefitToolbarForDrop(HWND window, int role, ToolbarItem *item);
 UINT ShowToolbarWindow(HWND window, UINT show);
-// Brings a floating frame that lies on no monitor into the nearest work area.
-void KeepFloatingFrameOnScreen(HWND frame);
+// Brings a toolbar's floating frame (made or not) that lies on no monitor
+// into the nearest work area.
+void KeepFloatingFrameOnScreen(HWND window);
 // Timers of a floating frame shown while its owner was hidden: the first
 // waits for the owner to show, the second lets it settle before the frame
 // goes back above it.

@@ -1,9 +1,11 @@
 // The two windows of a toolbar: the pane in a dock and the floating frame.
-// Both exist for the toolbar's whole life; docking and floating only hide the
-// one and show the other, and every edit refits both.
+// The pane lives as long as the toolbar; the frame is made the first time it
+// is needed and then lives as long. Docking and floating only hide the one
+// and show the other, and every edit refits both.
 #include <algorithm>
 #include <initializer_list>
 #include <unordered_map>
+#include <vector>
 
 #include "core/callbacks.h"
 #include "core/core.h"
@@ -13,6 +15,7 @@
 const char kToolbarClassName[] = "QBR_ToolbarWindow";
 
 constexpr DWORD kPaneStyle = WS_CHILD | WS_CLIPSIBLINGS | WS_CLIPCHILDREN | WS_BORDER;
+constexpr DWORD kFrameStyle = WS_POPUP | WS_BORDER | WS_THICKFRAME;
 
 static HWND cachedToolbarPane = nullptr;
 static int windowsInCreation = 0;
@@ -40,6 +43,8 @@ HWND GetTwinWindow(HWND window) {
     return HasClass(window, kToolbarClassName) ? reinterpret_cast<HWND>(GetWindowLongPtrA(window, 0)) : nullptr;
 }
 
+static HWND FloatingFrameOf(HWND pane);
+
 HWND ResolveRoleWindow(HWND window, int role) {
     if (!window) return nullptr;
     LONG style = GetWindowLongA(window, GWL_STYLE);
@@ -47,7 +52,7 @@ HWND ResolveRoleWindow(HWND window, int role) {
     case ROLE_DOCKED:
         return (style & WS_CHILD) ? window : GetTwinWindow(window);
     case ROLE_FLOATING:
-        return (style & WS_POPUP) ? window : GetTwinWindow(window);
+        return (style & WS_POPUP) ? window : FloatingFrameOf(window);
     case ROLE_ACTIVE: {
         HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
         return QBR_IsToolbarFloating(pane) ? ResolveRoleWindow(pane, ROLE_FLOATING) : pane;
@@ -116,13 +121,14 @@ HWND CreateToolbarWindows(HWND dock, LPCSTR title) {
         wc.lpszClassName = kToolbarClassName;
         if (!RegisterClassA(&wc)) return nullptr;
     }
-    // The pane's WM_CREATE makes the floating frame and the record. The
-    // WM_SIZE that creation sends is no refit: the items set next size both
-    // windows (SizeToolbarWindows), and an empty pane sized here would be
-    // sized, and its dock packed, once more for nothing.
+    // The pane's WM_CREATE makes the record. The WM_SIZE that creation sends
+    // is no refit: the items set next size both windows (SizeToolbarWindows),
+    // and an empty pane sized here would be sized, and its dock packed, once
+    // more for nothing.
     ++windowsInCreation;
     HWND pane = CreateWindowExA(0, kToolbarClassName, title, kPaneStyle, 0, 0, 0, 0, dock, nullptr, instance, nullptr);
     --windowsInCreation;
+    ForgetWaitingWindow(pane); // a handle used again starts with a frame place of its own
     return pane;
 }
 
@@ -211,16 +217,31 @@ static const WaitingPlace *WaitingPlaceOf(HWND window) {
     return &found->second;
 }
 
+static void RectsOfPlace(const WaitingPlace &place, RECT *outer, RECT *client) {
+    if (outer) *outer = place.outer;
+    if (client)
+        *client = RECT{0, 0, std::max<int>(0, Width(place.outer) - place.around.cx),
+                       std::max<int>(0, Height(place.outer) - place.around.cy)};
+}
+
 void GetPlacedRects(HWND window, RECT *outer, RECT *client) {
     if (const WaitingPlace *place = WaitingPlaceOf(window)) {
-        if (outer) *outer = place->outer;
-        if (client)
-            *client = RECT{0, 0, std::max<int>(0, place->outer.right - place->outer.left - place->around.cx),
-                           std::max<int>(0, place->outer.bottom - place->outer.top - place->around.cy)};
+        RectsOfPlace(*place, outer, client);
         return;
     }
     if (outer) GetWindowRect(window, outer);
     if (client) GetClientRect(window, client);
+}
+
+// A place moved and sized as the window system would move and size a window
+// (with a sizing `border`: no larger than its largest tracking size; the
+// toolbar window asks for no smallest).
+static void MovePlace(WaitingPlace &place, const RECT &target, bool moved, bool sized, bool border) {
+    RECT &outer = place.outer;
+    if (moved) OffsetRect(&outer, target.left - outer.left, target.top - outer.top);
+    if (!sized) return;
+    outer.right = outer.left + (border ? std::min<int>(Width(target), GetSystemMetrics(SM_CXMAXTRACK)) : Width(target));
+    outer.bottom = outer.top + (border ? std::min<int>(Height(target), GetSystemMetrics(SM_CYMAXTRACK)) : Height(target));
 }
 
 // Takes a place for a hidden frame, or a new size for a shown pane while
@@ -248,17 +269,7 @@ static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized)
         place.around.cy = client.bottom > 0 ? height - client.bottom : borders.bottom - borders.top;
         place.twin = GetTwinWindow(window);
     }
-    RECT &outer = place.outer;
-    if (moved) OffsetRect(&outer, target.left - outer.left, target.top - outer.top);
-    if (sized) {
-        // As the window system would size a window with a sizing border: no
-        // larger than its largest tracking size (the toolbar window asks
-        // for no smallest).
-        const bool border = IsFloatingFrame(window) != 0;
-        outer.right = outer.left + (border ? std::min<int>(Width(target), GetSystemMetrics(SM_CXMAXTRACK)) : Width(target));
-        outer.bottom =
-            outer.top + (border ? std::min<int>(Height(target), GetSystemMetrics(SM_CYMAXTRACK)) : Height(target));
-    }
+    MovePlace(place, target, moved, sized, IsFloatingFrame(window) != 0);
     waitingPlaces[window] = place;
     return true;
 }
@@ -284,7 +295,114 @@ static void PlaceFrame(HWND frame, HWND insertAfter, UINT flags) {
     if (!EqualRect(&now, &client)) ComputeRowBreaks(frame, ROLE_FLOATING);
 }
 
+// ---- The floating frame, made when first needed -----------------------------------
+//
+// A top-level window costs the window system many times what a child costs
+// (under Wine an X window with its hints: milliseconds each, most of the
+// start-up of a frame with many toolbars, and again as it closes), and most
+// toolbars never float. So a pane is made alone, and its floating frame the
+// first time the window itself is wanted: to float or show the toolbar
+// there, or for a caller who asks for it by its role. Until then the
+// frame's place waits here, read and changed as a hidden frame's is (its
+// rectangle, its client area, its item area, its rows), and the frame is
+// made at that place.
+namespace {
+std::unordered_map<HWND, WaitingPlace> unbornFrames; // by pane
+}
+
+static WaitingPlace &UnbornPlaceOf(HWND pane) {
+    auto found = unbornFrames.find(pane);
+    if (found != unbornFrames.end()) return found->second;
+    // Where the window system puts a popup made at CW_USEDEFAULT with no
+    // size: the top left corner of the screen.
+    WaitingPlace place = {pane, RECT{0, 0, 0, 0}, SIZE{0, 0}};
+    RECT borders;
+    WindowBordersAt(kFrameStyle, 0, WindowDpi(pane), &borders);
+    place.around = SIZE{Width(borders), Height(borders)};
+    return unbornFrames[pane] = place;
+}
+
+// Whether `target` stands for a frame that is not made yet: the floating
+// role of a toolbar names its pane then.
+static bool IsUnborn(HWND target, int role) { return role == ROLE_FLOATING && IsToolbarPane(target); }
+
+// The window to act on for `role` (settled): the pane itself for the
+// floating role of a toolbar whose frame is not made.
+static HWND RoleTarget(HWND window, int role) {
+    if (role != ROLE_FLOATING || IsFloatingFrame(window)) return ResolveRoleWindow(window, role);
+    if (!IsToolbarPane(window)) return nullptr;
+    HWND frame = GetTwinWindow(window);
+    return frame ? frame : window;
+}
+
+static void RolePlacedRects(HWND target, int role, RECT *outer, RECT *client) {
+    if (IsUnborn(target, role))
+        RectsOfPlace(UnbornPlaceOf(target), outer, client);
+    else
+        GetPlacedRects(target, outer, client);
+}
+
+static DWORD RoleStyle(HWND target, int role, int which) {
+    if (IsUnborn(target, role)) return which == GWL_STYLE ? kFrameStyle : 0;
+    return static_cast<DWORD>(GetWindowLongA(target, which));
+}
+
+void GetToolbarPlacedRects(HWND window, int role, RECT *outer, RECT *client) {
+    if (!SettleRole(window, role)) return;
+    if (HWND target = RoleTarget(window, role)) RolePlacedRects(target, role, outer, client);
+}
+
+DWORD GetToolbarWindowStyle(HWND window, int role, int which) {
+    if (!SettleRole(window, role)) return 0;
+    HWND target = RoleTarget(window, role);
+    return target ? RoleStyle(target, role, which) : 0;
+}
+
+static void MoveIntoWorkArea(HWND target);
+
+static HWND FloatingFrameOf(HWND pane) {
+    HWND frame = GetTwinWindow(pane);
+    // Nothing is made for a window that is no pane, nor inside the making of
+    // a pane or frame.
+    if (frame || !IsToolbarPane(pane) || windowsInCreation) return frame;
+    // A made frame hears of a display change and comes back onto a monitor;
+    // one made after a change comes there as it is made.
+    RECT r;
+    RectsOfPlace(UnbornPlaceOf(pane), &r, nullptr);
+    if (!MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) MoveIntoWorkArea(pane);
+    const WaitingPlace place = UnbornPlaceOf(pane);
+    RECT client;
+    RectsOfPlace(place, nullptr, &client);
+    std::vector<char> title(static_cast<size_t>(GetWindowTextLengthA(pane)) + 1, '\0');
+    GetWindowTextA(pane, title.data(), static_cast<int>(title.size()));
+    HWND dock = GetParent(pane);
+    auto instance = reinterpret_cast<HINSTANCE>(GetWindowLongPtrA(pane, GWLP_HINSTANCE));
+    // Its WM_SIZE is no refit: the rows were made for this place.
+    ++windowsInCreation;
+    frame = CreateWindowExA(0, kToolbarClassName, title.data(), kFrameStyle, place.outer.left, place.outer.top,
+                            Width(place.outer), Height(place.outer), dock ? GetParent(dock) : nullptr, nullptr,
+                            instance, nullptr);
+    --windowsInCreation;
+    if (!frame) return nullptr;
+    unbornFrames.erase(pane);
+    ApplyFrameScheme(frame);
+    SetTwinWindow(frame, pane);
+    SetTwinWindow(pane, frame);
+    RECT now;
+    GetClientRect(frame, &now);
+    if (!EqualRect(&now, &client)) ComputeRowBreaks(pane, ROLE_FLOATING);
+    return frame;
+}
+
 static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized);
+
+// PlaceWindow for a role's target: a frame not made yet only takes its place.
+static void PlaceRoleWindow(HWND target, int role, const RECT &placing, bool moved, bool sized) {
+    if (IsUnborn(target, role))
+        MovePlace(UnbornPlaceOf(target), placing, moved, sized, true);
+    else
+        PlaceWindow(target, placing, moved, sized);
+}
 
 void PlaceWaitingWindow(HWND window) {
     if (!WaitingPlaceOf(window)) return;
@@ -295,7 +413,9 @@ void PlaceWaitingWindow(HWND window) {
 }
 
 void ForgetWaitingWindow(HWND window) {
-    if (window) waitingPlaces.erase(window);
+    if (!window) return;
+    waitingPlaces.erase(window);
+    unbornFrames.erase(window);
 }
 
 // Someone else moved or sized a window that waits (the window system, a host
@@ -324,9 +444,9 @@ void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos) {
 
 void GetToolbarWindowRect(HWND window, int role, RECT *rect) {
     if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
+    HWND target = RoleTarget(window, role);
     if (!target) return;
-    GetPlacedRects(target, rect, nullptr);
+    RolePlacedRects(target, role, rect, nullptr);
     if (role == ROLE_DOCKED) ScreenRectToClient(GetParent(target), rect);
 }
 
@@ -341,10 +461,10 @@ RECT AreaMargins(HWND window, int role) {
 
 void GetItemArea(HWND window, int role, RECT *rect) {
     if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
+    HWND target = RoleTarget(window, role);
     if (!target) return;
     RECT client;
-    GetPlacedRects(target, nullptr, &client);
+    RolePlacedRects(target, role, nullptr, &client);
     const RECT margins = AreaMargins(target, role);
     *rect = RECT{margins.left, margins.top, client.right - margins.right, client.bottom - margins.bottom};
 }
@@ -393,14 +513,14 @@ static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized
 
 void MoveToolbarWindow(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
+    HWND target = RoleTarget(window, role);
     if (!target) return;
     RECT present;
     GetToolbarWindowRect(target, role, &present);
     bool moved = rect->left != present.left || rect->top != present.top;
     bool sized = Width(*rect) != Width(present) || Height(*rect) != Height(present);
     if (!moved && !sized) return;
-    PlaceWindow(target, *rect, moved, sized);
+    PlaceRoleWindow(target, role, *rect, moved, sized);
     ComputeRowBreaks(target, role);
 }
 
@@ -413,10 +533,9 @@ static SIZE OutsideItemArea(HWND target, int role) {
     RECT outer, area, client;
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
-    GetPlacedRects(target, nullptr, &client);
+    RolePlacedRects(target, role, nullptr, &client);
     RECT borders = {0, 0, 0, 0};
-    AdjustWindowRectEx(&borders, static_cast<DWORD>(GetWindowLongA(target, GWL_STYLE)), FALSE,
-                       static_cast<DWORD>(GetWindowLongA(target, GWL_EXSTYLE)));
+    AdjustWindowRectEx(&borders, RoleStyle(target, role, GWL_STYLE), FALSE, RoleStyle(target, role, GWL_EXSTYLE));
     const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
     const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
     return SIZE{outsideW + Width(client) - Width(area), outsideH + Height(client) - Height(area)};
@@ -424,20 +543,20 @@ static SIZE OutsideItemArea(HWND target, int role) {
 
 void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
+    HWND target = RoleTarget(window, role);
     if (!target) return;
     RECT area;
     GetItemArea(target, role, &area);
     if (Width(*rect) == Width(area) && Height(*rect) == Height(area)) return;
     const SIZE outside = OutsideItemArea(target, role);
     RECT size = {0, 0, Width(*rect) + outside.cx, Height(*rect) + outside.cy};
-    PlaceWindow(target, size, false, true);
+    PlaceRoleWindow(target, role, size, false, true);
 }
 
 void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
-    HWND target = ResolveRoleWindow(window, role);
-    if (!target) return;
+    HWND target = RoleTarget(window, role);
+    if (!target || IsUnborn(target, role)) return;
     InvalidateRect(target, rect, FALSE);
     if (role == ROLE_DOCKED && DeferDockPacking::Active()) return;
     UpdateWindow(target);
@@ -458,14 +577,16 @@ static RECT NearestWorkArea(const RECT &rect) {
     return work;
 }
 
-// Moves a window into the nearest work area by the shortest way, its size kept.
-static void MoveIntoWorkArea(HWND window) {
+// Moves a floating frame (`target`) into the nearest work area by the
+// shortest way, its size kept.
+static void MoveIntoWorkArea(HWND target) {
     RECT r;
-    GetPlacedRects(window, &r, nullptr);
+    RolePlacedRects(target, ROLE_FLOATING, &r, nullptr);
     const RECT work = NearestWorkArea(r);
     const int x = std::max<int>(work.left, std::min<int>(r.left, work.right - Width(r)));
     const int y = std::max<int>(work.top, std::min<int>(r.top, work.bottom - Height(r)));
-    if (x != r.left || y != r.top) PlaceWindow(window, RECT{x, y, x + Width(r), y + Height(r)}, true, false);
+    if (x != r.left || y != r.top)
+        PlaceRoleWindow(target, ROLE_FLOATING, RECT{x, y, x + Width(r), y + Height(r)}, true, false);
 }
 
 // A floating frame is never larger than the work area of its monitor, so
@@ -475,7 +596,7 @@ static void MoveIntoWorkArea(HWND window) {
 // measured again here when it does not fit. True when it did not.
 static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *measured) {
     RECT outer;
-    GetPlacedRects(frame, &outer, nullptr);
+    RolePlacedRects(frame, ROLE_FLOATING, &outer, nullptr);
     const RECT work = NearestWorkArea(outer);
     const SIZE outside = OutsideItemArea(frame, ROLE_FLOATING);
     const int mostWidth = Width(work) - outside.cx, mostHeight = Height(work) - outside.cy;
@@ -495,12 +616,13 @@ static bool FitWithinWorkArea(HWND frame, HWND pane, const RECT &given, RECT *me
 // frame on no monitor at all, stored on one that is gone or moved there
 // before the display changed, comes into the nearest work area by the
 // shortest way, its size kept.
-void KeepFloatingFrameOnScreen(HWND frame) {
-    if (!IsFloatingFrame(frame)) return;
+void KeepFloatingFrameOnScreen(HWND window) {
+    HWND target = RoleTarget(window, ROLE_FLOATING);
+    if (!target) return;
     RECT r;
-    GetPlacedRects(frame, &r, nullptr);
+    RolePlacedRects(target, ROLE_FLOATING, &r, nullptr);
     if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
-    MoveIntoWorkArea(frame);
+    MoveIntoWorkArea(target);
 }
 
 // ---- Sizing and refits -------------------------------------------------------------
@@ -541,7 +663,7 @@ UINT SizeToolbarWindows(HWND window) {
     const RECT frameMargins = AreaMargins(pane, ROLE_FLOATING);
     RECT frameSize = {0, 0, width + frameMargins.left + frameMargins.right + 2 * GetSystemMetrics(SM_CXFRAME),
                       height + frameMargins.top + frameMargins.bottom + 2 * GetSystemMetrics(SM_CYFRAME)};
-    PlaceWindow(ResolveRoleWindow(pane, ROLE_FLOATING), frameSize, false, true);
+    PlaceRoleWindow(RoleTarget(pane, ROLE_FLOATING), ROLE_FLOATING, frameSize, false, true);
     ComputeRowBreaks(pane, ROLE_FLOATING);
     RefitToolbar(pane, ROLE_BOTH);
     return 1;
@@ -556,7 +678,7 @@ static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
         role = ROLE_DOCKED;
     }
     if (!SettleRole(window, role)) return 0;
-    HWND target = ResolveRoleWindow(window, role);
+    HWND target = RoleTarget(window, role);
     if (!target) return 0;
     RECT area;
     GetItemArea(target, role, &area);
@@ -571,7 +693,7 @@ static UINT Refit(HWND window, int role, ToolbarItem *dropped, bool forDrop) {
     RepaintToolbarWindow(target, role, nullptr);
     // By the toolbar's state, not the role: a refit of the hidden frame of a
     // docked toolbar lays the dock out too.
-    if (ResolveRoleWindow(target, ROLE_ACTIVE) == pane) return RelayoutDockOf(target);
+    if (!QBR_IsToolbarFloating(pane)) return RelayoutDockOf(target);
     return 1;
 }
 
@@ -668,7 +790,7 @@ static void RestackFloatingFrames(ToolbarManager *manager, bool now) {
     if (!manager) return;
     if (now) LiftFloatingFramesAboveHost(manager->frame);
     for (UINT i = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, i); ++i) {
-        HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
+        HWND frame = GetTwinWindow(record->paneWindow); // a frame not made is not shown
         if (frame && IsWindowVisible(frame)) {
             SetTimer(frame, kSettleTimer, kRestackPeriod, nullptr);
             return;
@@ -739,12 +861,13 @@ UINT ShowToolbarWindow(HWND window, UINT show) {
 
 static UINT Switch(HWND window, bool toFloating) {
     HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
-    HWND frame = ResolveRoleWindow(window, ROLE_FLOATING);
+    // Docking needs no frame: one not made yet stays so.
+    HWND frame = toFloating ? ResolveRoleWindow(window, ROLE_FLOATING) : RoleTarget(pane, ROLE_FLOATING);
     HWND shown = toFloating ? frame : pane;
     HWND hidden = toFloating ? pane : frame;
     if (!pane || !frame) return 0;
     if (IsWindowVisible(shown) || (QBR_GetToolbarFlags(pane) & TBF_HIDDEN)) return 1;
-    ShowWindow(hidden, SW_HIDE);
+    if (hidden != shown) ShowWindow(hidden, SW_HIDE);
     ShowWithoutActivating(shown);
     return RelayoutDockOf(pane);
 }
