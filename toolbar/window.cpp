@@ -202,6 +202,7 @@ struct WaitingPlace {
     HWND twin;   // the twin when the place was taken: a handle used again is not this window
     RECT outer;  // screen coordinates
     SIZE around; // what the window system puts around the client area
+    bool onMonitor = true; // of a frame not made: whether its place lay on a monitor when taken
 };
 std::unordered_map<HWND, WaitingPlace> waitingPlaces;
 } // namespace
@@ -315,7 +316,7 @@ static WaitingPlace &UnbornPlaceOf(HWND pane) {
     if (found != unbornFrames.end()) return found->second;
     // Where the window system puts a popup made at CW_USEDEFAULT with no
     // size: the top left corner of the screen.
-    WaitingPlace place = {pane, RECT{0, 0, 0, 0}, SIZE{0, 0}};
+    WaitingPlace place = {pane, RECT{0, 0, 0, 0}, SIZE{0, 0}, true};
     RECT borders;
     WindowBordersAt(kFrameStyle, 0, WindowDpi(pane), &borders);
     place.around = SIZE{Width(borders), Height(borders)};
@@ -365,11 +366,12 @@ static HWND FloatingFrameOf(HWND pane) {
     // Nothing is made for a window that is no pane, nor inside the making of
     // a pane or frame.
     if (frame || !IsToolbarPane(pane) || windowsInCreation) return frame;
-    // A made frame hears of a display change and comes back onto a monitor;
-    // one made after a change comes there as it is made.
+    // A made frame hears of a display change and comes back onto a monitor.
+    // One whose place was on a monitor that is gone since comes there as it
+    // is made; one placed off every monitor stays where it was put.
     RECT r;
     RectsOfPlace(UnbornPlaceOf(pane), &r, nullptr);
-    if (!MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) MoveIntoWorkArea(pane);
+    if (UnbornPlaceOf(pane).onMonitor && !MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) MoveIntoWorkArea(pane);
     const WaitingPlace place = UnbornPlaceOf(pane);
     RECT client;
     RectsOfPlace(place, nullptr, &client);
@@ -398,9 +400,11 @@ static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized
 
 // PlaceWindow for a role's target: a frame not made yet only takes its place.
 static void PlaceRoleWindow(HWND target, int role, const RECT &placing, bool moved, bool sized) {
-    if (IsUnborn(target, role))
-        MovePlace(UnbornPlaceOf(target), placing, moved, sized, true);
-    else
+    if (IsUnborn(target, role)) {
+        WaitingPlace &place = UnbornPlaceOf(target);
+        MovePlace(place, placing, moved, sized, true);
+        place.onMonitor = MonitorFromRect(&place.outer, MONITOR_DEFAULTTONULL) != nullptr;
+    } else
         PlaceWindow(target, placing, moved, sized);
 }
 
