@@ -54,6 +54,8 @@ LRESULT CALLBACK CountPosted(int code, WPARAM wParam, LPARAM lParam) {
     return CallNextHookEx(nullptr, code, wParam, lParam);
 }
 
+BOOL CALLBACK CountFrame(HWND w, LPARAM n) { return *reinterpret_cast<int *>(n) += IsFloatingFrame(w) != 0, TRUE; }
+
 class LayoutTest : public FrameTest {
   protected:
     void SetUp() override {
@@ -116,6 +118,9 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
         UnhookWindowsHookEx(hook);
     for (const auto &a : acts) // no window moved, sized, shown or painted twice by an apply
         EXPECT_LE(*std::max_element(a.second.begin(), a.second.end()), 1) << TextOf(a.first) << " " << a.first;
+    int frames = 0; // a floating frame for each toolbar that floats, none for the others (made when they float)
+    EnumThreadWindows(GetCurrentThreadId(), CountFrame, LPARAM(&frames));
+    EXPECT_EQ(2, frames);
     EXPECT_EQ(entries, Capture(other));
     HWND restoredTop = QBR_GetDock(other, DOCK_TOP), restoredBottom = QBR_GetDock(other, DOCK_BOTTOM);
     const RECT pane = WindowRectInParent(QBR_GetToolbar(other, 0)); // the docks shown and packed
