@@ -1173,6 +1173,7 @@ int main(int argc, char **argv) {
         ProfileCreate();
         ProfileScale();
         ProfileText();
+        ProfileApply(20);
         ProfileApply(200);
         if (!quick) ProfileApply(1000);
     }

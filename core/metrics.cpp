@@ -198,3 +198,82 @@ void ForgetManagerMetrics(const ToolbarManager *manager) {
 }
 
 void ButtonMetricsChanged() { ++metricsGeneration; }
+
+// ---- Screen readings ---------------------------------------------------------------
+
+namespace {
+struct Monitor {
+    RECT area, work;
+};
+struct Readings {
+    bool monitorsRead = false, sizeRead = false;
+    std::vector<Monitor> monitors;
+    SIZE largest = {0, 0};
+};
+UINT readingsOpen = 0;
+Readings readings;
+
+BOOL CALLBACK AddMonitor(HMONITOR monitor, HDC, LPRECT, LPARAM list) {
+    MONITORINFO info = {};
+    info.cbSize = sizeof info;
+    if (GetMonitorInfoA(monitor, &info))
+        reinterpret_cast<std::vector<Monitor> *>(list)->push_back(Monitor{info.rcMonitor, info.rcWork});
+    return TRUE;
+}
+
+// The monitors as read once, or none outside readings.
+const std::vector<Monitor> *ReadMonitors() {
+    if (!readingsOpen) return nullptr;
+    if (!readings.monitorsRead) {
+        EnumDisplayMonitors(nullptr, nullptr, AddMonitor, reinterpret_cast<LPARAM>(&readings.monitors));
+        readings.monitorsRead = true;
+    }
+    return &readings.monitors;
+}
+
+// The monitor a non-empty rectangle meets most (the platform's rule), or none.
+const Monitor *MostMet(const std::vector<Monitor> &monitors, const RECT &rect) {
+    const Monitor *best = nullptr;
+    LONGLONG bestArea = 0;
+    for (const Monitor &m : monitors) {
+        RECT meet;
+        if (!IntersectRect(&meet, &rect, &m.area)) continue;
+        const LONGLONG area = LONGLONG(meet.right - meet.left) * (meet.bottom - meet.top);
+        if (area > bestArea) best = &m, bestArea = area;
+    }
+    return best;
+}
+} // namespace
+
+ScreenReadings::ScreenReadings() { ++readingsOpen; }
+ScreenReadings::~ScreenReadings() {
+    if (--readingsOpen == 0) readings = Readings();
+}
+
+SIZE LargestWindowSize() {
+    if (readingsOpen && readings.sizeRead) return readings.largest;
+    const SIZE largest = {GetSystemMetrics(SM_CXMAXTRACK), GetSystemMetrics(SM_CYMAXTRACK)};
+    if (readingsOpen) readings.largest = largest, readings.sizeRead = true;
+    return largest;
+}
+
+RECT NearestWorkArea(const RECT &rect) {
+    // Of an empty rectangle, or one on no monitor, the platform's own answer
+    // decides: its rules for those are its own.
+    const std::vector<Monitor> *monitors = IsRectEmpty(&rect) ? nullptr : ReadMonitors();
+    if (const Monitor *met = monitors ? MostMet(*monitors, rect) : nullptr) return met->work;
+    MONITORINFO info = {};
+    info.cbSize = sizeof info;
+    HMONITOR monitor = MonitorFromRect(&rect, MONITOR_DEFAULTTONEAREST);
+    if (monitor && GetMonitorInfoA(monitor, &info)) return info.rcWork;
+    RECT work;
+    if (!SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0))
+        work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    return work;
+}
+
+bool OnSomeMonitor(const RECT &rect) {
+    const std::vector<Monitor> *monitors = IsRectEmpty(&rect) ? nullptr : ReadMonitors();
+    if (monitors) return MostMet(*monitors, rect) != nullptr;
+    return MonitorFromRect(&rect, MONITOR_DEFAULTTONULL) != nullptr;
+}

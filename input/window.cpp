@@ -16,8 +16,9 @@ static LRESULT OnCreate(HWND window, const CREATESTRUCTA *create) {
 }
 
 static void OnSize(HWND window) {
-    InvalidateRect(window, nullptr, TRUE);
+    // A window being made has nothing on the screen yet to paint again.
     if (ToolbarWindowsInCreation()) return;
+    InvalidateRect(window, nullptr, TRUE);
     RefitToolbar(window, ROLE_SELF);
 }
 
@@ -195,8 +196,10 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         return 0;
     case WM_SHOWWINDOW: // the platform also hides and shows owned frames here
         // A hidden frame's place is taken before anyone sees it (its owner
-        // restored shows it without the library).
-        if (wParam) PlaceWaitingWindow(window);
+        // restored shows it without the library). A pane shown while packing
+        // is deferred takes its place from the packing, which comes before
+        // anything is painted.
+        if (wParam && !(IsToolbarPane(window) && DeferDockPacking::Active())) PlaceWaitingWindow(window);
         AccessShowWindow(window, wParam, lParam);
         return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETOBJECT:

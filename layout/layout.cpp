@@ -368,6 +368,7 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
 
 extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     if (!manager) return 1;
+    ScreenReadings screen;
     // A table written at another scale is applied at that scale, as it was
     // measured, and then measured again for the frame's: each toolbar keeps
     // its items and its rows.

@@ -121,6 +121,9 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     int frames = 0; // a floating frame for each toolbar that floats, none for the others (made when they float)
     EnumThreadWindows(GetCurrentThreadId(), CountFrame, LPARAM(&frames));
     EXPECT_EQ(2, frames);
+    const RECT was = WindowRectInParent(QBR_GetToolbar(manager, 1)), is = WindowRectInParent(QBR_GetToolbar(other, 1));
+    EXPECT_EQ(Rect(0, 0, was.right - was.left, was.bottom - was.top), Rect(0, 0, is.right - is.left, is.bottom - is.top))
+        << "the hidden pane of the floating toolbar is sized for its dock";
     EXPECT_EQ(entries, Capture(other));
     HWND restoredTop = QBR_GetDock(other, DOCK_TOP), restoredBottom = QBR_GetDock(other, DOCK_BOTTOM);
     const RECT pane = WindowRectInParent(QBR_GetToolbar(other, 0)); // the docks shown and packed

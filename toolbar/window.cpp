@@ -193,10 +193,10 @@ static int Height(const RECT &r) { return r.bottom - r.top; }
 // from this place while it waits, so rows, sizes and stored layouts come out
 // as if the window had been moved at once.
 //
-// A shown pane whose size changes while its dock's packing is deferred (a new
-// button size or scale for every toolbar) waits the same way, for the
-// packing: that places it once, moved and sized in one call, where it would
-// otherwise be sized now and moved again a moment later.
+// A pane whose size changes while its dock's packing is deferred (a new
+// button size or scale for every toolbar, a layout applied) waits the same
+// way, for the packing: that places it once, moved and sized in one call,
+// where it would otherwise be sized now and moved again a moment later.
 namespace {
 struct WaitingPlace {
     HWND twin;   // the twin when the place was taken: a handle used again is not this window
@@ -241,8 +241,9 @@ static void MovePlace(WaitingPlace &place, const RECT &target, bool moved, bool 
     RECT &outer = place.outer;
     if (moved) OffsetRect(&outer, target.left - outer.left, target.top - outer.top);
     if (!sized) return;
-    outer.right = outer.left + (border ? std::min<int>(Width(target), GetSystemMetrics(SM_CXMAXTRACK)) : Width(target));
-    outer.bottom = outer.top + (border ? std::min<int>(Height(target), GetSystemMetrics(SM_CYMAXTRACK)) : Height(target));
+    const SIZE largest = border ? LargestWindowSize() : SIZE{Width(target), Height(target)};
+    outer.right = outer.left + std::min<int>(Width(target), largest.cx);
+    outer.bottom = outer.top + std::min<int>(Height(target), largest.cy);
 }
 
 // Takes a place for a hidden frame, or a new size for a shown pane while
@@ -250,7 +251,7 @@ static void MovePlace(WaitingPlace &place, const RECT &target, bool moved, bool 
 static bool WaitToPlace(HWND window, const RECT &target, bool moved, bool sized) {
     if (IsFloatingFrame(window)) {
         if (IsWindowVisible(window)) return false;
-    } else if (moved || !DeferDockPacking::Active() || !IsToolbarPane(window) || !IsWindowVisible(window)) {
+    } else if (moved || !DeferDockPacking::Active() || !IsToolbarPane(window)) {
         return false;
     }
     WaitingPlace place;
@@ -371,7 +372,7 @@ static HWND FloatingFrameOf(HWND pane) {
     // is made; one placed off every monitor stays where it was put.
     RECT r;
     RectsOfPlace(UnbornPlaceOf(pane), &r, nullptr);
-    if (UnbornPlaceOf(pane).onMonitor && !MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) MoveIntoWorkArea(pane);
+    if (UnbornPlaceOf(pane).onMonitor && !OnSomeMonitor(r)) MoveIntoWorkArea(pane);
     const WaitingPlace place = UnbornPlaceOf(pane);
     RECT client;
     RectsOfPlace(place, nullptr, &client);
@@ -390,6 +391,9 @@ static HWND FloatingFrameOf(HWND pane) {
     ApplyFrameScheme(frame);
     SetTwinWindow(frame, pane);
     SetTwinWindow(pane, frame);
+    // A place the pane waits for is still its own, now with a twin.
+    auto waiting = waitingPlaces.find(pane);
+    if (waiting != waitingPlaces.end()) waiting->second.twin = frame;
     RECT now;
     GetClientRect(frame, &now);
     if (!EqualRect(&now, &client)) ComputeRowBreaks(pane, ROLE_FLOATING);
@@ -403,7 +407,7 @@ static void PlaceRoleWindow(HWND target, int role, const RECT &placing, bool mov
     if (IsUnborn(target, role)) {
         WaitingPlace &place = UnbornPlaceOf(target);
         MovePlace(place, placing, moved, sized, true);
-        place.onMonitor = MonitorFromRect(&place.outer, MONITOR_DEFAULTTONULL) != nullptr;
+        place.onMonitor = OnSomeMonitor(place.outer);
     } else
         PlaceWindow(target, placing, moved, sized);
 }
@@ -510,7 +514,7 @@ static void PlaceWindow(HWND window, const RECT &placing, bool moved, bool sized
     SetWindowPos(window, nullptr, moved ? target.left : 0, moved ? target.top : 0, sized ? Width(target) : 0,
                  sized ? Height(target) : 0, flags);
     if (quiet) {
-        InvalidateRect(GetParent(window), &left, TRUE);
+        if (!IsRectEmpty(&left)) InvalidateRect(GetParent(window), &left, TRUE); // a pane of no size left nothing
         RedrawWindow(window, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE | RDW_FRAME);
     }
 }
@@ -568,19 +572,6 @@ void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
 
 // ---- The screen --------------------------------------------------------------------
 
-// The work area of the monitor nearest to a rectangle: the screen less the
-// taskbar and the like.
-static RECT NearestWorkArea(const RECT &rect) {
-    MONITORINFO info = {};
-    info.cbSize = sizeof info;
-    HMONITOR monitor = MonitorFromRect(&rect, MONITOR_DEFAULTTONEAREST);
-    if (monitor && GetMonitorInfoA(monitor, &info)) return info.rcWork;
-    RECT work;
-    if (!SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0))
-        work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
-    return work;
-}
-
 // Moves a floating frame (`target`) into the nearest work area by the
 // shortest way, its size kept.
 static void MoveIntoWorkArea(HWND target) {
@@ -625,7 +616,7 @@ void KeepFloatingFrameOnScreen(HWND window) {
     if (!target) return;
     RECT r;
     RolePlacedRects(target, ROLE_FLOATING, &r, nullptr);
-    if (MonitorFromRect(&r, MONITOR_DEFAULTTONULL)) return;
+    if (OnSomeMonitor(r)) return;
     MoveIntoWorkArea(target);
 }
 
