@@ -73,9 +73,10 @@ int FocusBorderAt(int metric, UINT dpi) {
 
 } // namespace
 
-void WindowBordersAt(DWORD style, DWORD exStyle, UINT dpi, RECT *borders) {
+// At `dpi`, or with no scale (0) as AdjustWindowRectEx gives them.
+static void AskWindowBorders(DWORD style, DWORD exStyle, UINT dpi, RECT *borders) {
     *borders = RECT{0, 0, 0, 0};
-    if (AdjustWindowRectExForDpiProc call = AdjustForDpiCall())
+    if (AdjustWindowRectExForDpiProc call = dpi ? AdjustForDpiCall() : nullptr)
         if (call(borders, style, FALSE, exStyle, dpi)) return;
     *borders = RECT{0, 0, 0, 0};
     AdjustWindowRectEx(borders, style, FALSE, exStyle);
@@ -205,10 +206,16 @@ namespace {
 struct Monitor {
     RECT area, work;
 };
+struct Borders {
+    DWORD style, exStyle;
+    UINT dpi;
+    RECT borders;
+};
 struct Readings {
     bool monitorsRead = false, sizeRead = false;
     std::vector<Monitor> monitors;
     SIZE largest = {0, 0};
+    std::vector<Borders> borders; // a few styles at a scale or two
 };
 UINT readingsOpen = 0;
 Readings readings;
@@ -271,6 +278,23 @@ RECT NearestWorkArea(const RECT &rect) {
         work = RECT{0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
     return work;
 }
+
+static void ReadWindowBorders(DWORD style, DWORD exStyle, UINT dpi, RECT *borders) {
+    if (readingsOpen)
+        for (const Borders &b : readings.borders)
+            if (b.style == style && b.exStyle == exStyle && b.dpi == dpi) {
+                *borders = b.borders;
+                return;
+            }
+    AskWindowBorders(style, exStyle, dpi, borders);
+    if (readingsOpen) readings.borders.push_back(Borders{style, exStyle, dpi, *borders});
+}
+
+void WindowBordersAt(DWORD style, DWORD exStyle, UINT dpi, RECT *borders) {
+    ReadWindowBorders(style, exStyle, dpi, borders);
+}
+
+void PlatformWindowBorders(DWORD style, DWORD exStyle, RECT *borders) { ReadWindowBorders(style, exStyle, 0, borders); }
 
 bool OnSomeMonitor(const RECT &rect) {
     const std::vector<Monitor> *monitors = IsRectEmpty(&rect) ? nullptr : ReadMonitors();

@@ -113,6 +113,8 @@ UINT WindowDpi(HWND window);
 // AdjustWindowRectEx gives them); on a system without per-scale metrics, at
 // the screen's one scale.
 void WindowBordersAt(DWORD style, DWORD exStyle, UINT dpi, RECT *borders);
+// The same as AdjustWindowRectEx gives them, at the screen's scale.
+void PlatformWindowBorders(DWORD style, DWORD exStyle, RECT *borders);
 UINT ManagerDpi(const ToolbarManager *manager);
 // MulDiv(value, dpi, 96), rounded; the one scaling of the library.
 int ScaleToDpi(int value, UINT dpi);

@@ -252,8 +252,8 @@ static void KeepRoomInsideBorders(HWND pane, UINT writtenDpi, RECT *rect) {
     GetToolbarPlacedRects(pane, ROLE_FLOATING, &outer, &client);
     int nowWidth = (outer.right - outer.left) - client.right, nowHeight = (outer.bottom - outer.top) - client.bottom;
     if (client.right <= 0 || client.bottom <= 0) {
-        RECT platform = {0, 0, 0, 0};
-        AdjustWindowRectEx(&platform, style, FALSE, exStyle);
+        RECT platform;
+        PlatformWindowBorders(style, exStyle, &platform);
         nowWidth = platform.right - platform.left;
         nowHeight = platform.bottom - platform.top;
     }
@@ -369,6 +369,7 @@ static void PlaceFloatingInProportion(ToolbarManager *manager, const WrittenScal
 extern "C" UINT QBR_ApplyLayout(ToolbarManager *manager, HWND frame) {
     if (!manager) return 1;
     ScreenReadings screen;
+    ActivationWatchPause quiet;
     // A table written at another scale is applied at that scale, as it was
     // measured, and then measured again for the frame's: each toolbar keeps
     // its items and its rows.

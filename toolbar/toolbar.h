@@ -121,6 +121,17 @@ void KeepFloatingFramesAbove(ToolbarManager *manager);
 // their floating frames; one call for each manager made and destroyed.
 void WatchHostActivation();
 void UnwatchHostActivation();
+// The watch is a thread hook that the window system calls for every window
+// made or destroyed (under Wine a round trip each: half again a child
+// window's cost). While the library makes many windows of its own in one call
+// (a layout applied), the watch is out: nothing is activated meanwhile.
+class ActivationWatchPause {
+  public:
+    ActivationWatchPause();
+    ~ActivationWatchPause();
+    ActivationWatchPause(const ActivationWatchPause &) = delete;
+    ActivationWatchPause &operator=(const ActivationWatchPause &) = delete;
+};
 UINT SwitchToFloating(HWND window);
 UINT SwitchToDocked(HWND window);
 

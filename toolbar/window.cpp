@@ -542,8 +542,8 @@ static SIZE OutsideItemArea(HWND target, int role) {
     GetToolbarWindowRect(target, role, &outer);
     GetItemArea(target, role, &area);
     RolePlacedRects(target, role, nullptr, &client);
-    RECT borders = {0, 0, 0, 0};
-    AdjustWindowRectEx(&borders, RoleStyle(target, role, GWL_STYLE), FALSE, RoleStyle(target, role, GWL_EXSTYLE));
+    RECT borders;
+    PlatformWindowBorders(RoleStyle(target, role, GWL_STYLE), RoleStyle(target, role, GWL_EXSTYLE), &borders);
     const int outsideW = std::max(Width(outer) - Width(client), Width(borders));
     const int outsideH = std::max(Height(outer) - Height(client), Height(borders));
     return SIZE{outsideW + Width(client) - Width(area), outsideH + Height(client) - Height(area)};
@@ -564,7 +564,8 @@ void SizeToolbarToContent(HWND window, int role, const RECT *rect) {
 void RepaintToolbarWindow(HWND window, int role, const RECT *rect) {
     if (!SettleRole(window, role)) return;
     HWND target = RoleTarget(window, role);
-    if (!target || IsUnborn(target, role)) return;
+    // A window off the screen is painted whole as it comes on: nothing to mark.
+    if (!target || IsUnborn(target, role) || !IsWindowVisible(target)) return;
     InvalidateRect(target, rect, FALSE);
     if (role == ROLE_DOCKED && DeferDockPacking::Active()) return;
     UpdateWindow(target);
@@ -817,6 +818,7 @@ void OnRestackTimer(HWND frame, UINT_PTR timer) {
 // it lives as long as one of them.
 static HHOOK activationHook = nullptr;
 static UINT activationWatchers = 0;
+static UINT watchPauses = 0; // ActivationWatchPause scopes open
 
 static void OnWindowActivating(HWND window) {
     // The keyboard stays with the toolbars only while their frame is active.
@@ -833,7 +835,7 @@ static LRESULT CALLBACK ActivationHookProc(int code, WPARAM wParam, LPARAM lPara
 }
 
 void WatchHostActivation() {
-    if (activationWatchers++ == 0)
+    if (activationWatchers++ == 0 && watchPauses == 0)
         activationHook = SetWindowsHookExA(WH_CBT, ActivationHookProc, nullptr, GetCurrentThreadId());
 }
 
@@ -841,6 +843,19 @@ void UnwatchHostActivation() {
     if (activationWatchers == 0 || --activationWatchers != 0) return;
     if (activationHook) UnhookWindowsHookEx(activationHook);
     activationHook = nullptr;
+}
+
+
+ActivationWatchPause::ActivationWatchPause() {
+    if (watchPauses++ == 0 && activationHook) {
+        UnhookWindowsHookEx(activationHook);
+        activationHook = nullptr;
+    }
+}
+
+ActivationWatchPause::~ActivationWatchPause() {
+    if (--watchPauses == 0 && activationWatchers != 0 && !activationHook)
+        activationHook = SetWindowsHookExA(WH_CBT, ActivationHookProc, nullptr, GetCurrentThreadId());
 }
 
 UINT ShowToolbarWindow(HWND window, UINT show) {
