@@ -830,7 +830,10 @@ void ProfileScale() {
         std::vector<double> t(names.size() + 1);
         t[0] = NowUs();
         s.manager->dpi = dpi;
-        RewrapManagerToolbars(s.manager, width, height);
+        {
+            DeferDockPacking deferred; // as the scale change does: the panes wait for the packing
+            RewrapManagerToolbars(s.manager, width, height);
+        }
         t[1] = NowUs();
         if (s.manager->imageResource) ChooseImageStrip(s.manager);
         t[2] = NowUs();

@@ -295,12 +295,22 @@ void PlaceDock(HWND window, RECT *rect) {
     const int width = rect->right - rect->left, height = rect->bottom - rect->top;
     const bool moved = rect->left != topLeft.x || rect->top != topLeft.y;
     const bool resized = width != bottomRight.x - topLeft.x || height != bottomRight.y - topLeft.y;
-    if (moved && resized)
-        SetWindowPos(window, nullptr, rect->left, rect->top, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
-    else if (moved)
-        SetWindowPos(window, nullptr, rect->left, rect->top, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
-    else if (resized)
-        SetWindowPos(window, nullptr, 0, 0, width, height, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    // A shown dock is placed as a shown pane is: without the window system's
+    // own redraw, which erases and paints at once, inside the call, the dock
+    // and the frame around it. The same parts are marked instead and painted
+    // together: the dock by the update below (its panes too when it moved
+    // them on the screen: Windows keeps a moved child's old bits; Wine paints
+    // it again anyway), the frame by its next paint.
+    const bool quiet = (moved || resized) && IsWindowVisible(window);
+    if (moved || resized)
+        SetWindowPos(window, nullptr, rect->left, rect->top, width, height,
+                     SWP_NOZORDER | SWP_NOACTIVATE | (moved ? 0 : SWP_NOMOVE) | (resized ? 0 : SWP_NOSIZE) |
+                         (quiet ? SWP_NOREDRAW : 0));
+    if (quiet) {
+        RECT left = {topLeft.x, topLeft.y, bottomRight.x, bottomRight.y};
+        InvalidateRect(parent, &left, TRUE);
+        RedrawWindow(window, nullptr, nullptr, RDW_INVALIDATE | RDW_ERASE | RDW_FRAME | (moved ? RDW_ALLCHILDREN : 0));
+    }
 
     // A hidden dock comes through here on every relayout, changed or not, and
     // so tells the frame each time; a visible dock only when it changed.

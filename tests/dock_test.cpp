@@ -158,3 +158,43 @@ TEST_F(DockTest, DropIndexes) {
 }
 
 } // namespace
+
+namespace {
+// What the screen shows at a point of the frame's client area, or a window's pixels by rows.
+COLORREF ScreenAt(HWND frame, int x, int y) {
+    POINT p = {x, y};
+    ClientToScreen(frame, &p);
+    HDC screen = GetDC(nullptr);
+    const COLORREF c = ReadPixelsFrom(screen, p.x, p.y, 1, 1).colors[0];
+    return ReleaseDC(nullptr, screen), c;
+}
+std::vector<COLORREF> ScreenOf(HWND window) {
+    RECT r;
+    GetWindowRect(window, &r);
+    HDC screen = GetDC(nullptr);
+    const Pixels px = ReadPixelsFrom(screen, r.left, r.top, r.right - r.left, r.bottom - r.top);
+    return ReleaseDC(nullptr, screen), px.colors;
+}
+} // namespace
+
+// A top dock losing its second row and getting it back: the frame shows its own background where the row
+// was, the dock its face beside the row's pane, and the side dock's pane, moved up and down, itself.
+TEST_F(DockTest, DocksPlacedAgainLeaveNoOldPixels) {
+    SetWindowPos(frame, nullptr, 0, 0, L + 40, 420, SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    HWND top = MakeDock(DOCK_TOP), left = MakeDock(DOCK_LEFT);
+    const std::vector<HWND> panes = Packed(top, {300, L - 297});
+    const UINT ids[] = {7, 8};
+    HWND side = QBR_CreateToolbar("S", TBF_VISIBLE | TBF_DOCKED, 0, 0, 0, 0, left, ids, 2);
+    UpdateWindow(frame), Pump();
+    const std::vector<COLORREF> sidePixels = ScreenOf(side);
+    const RECT row = WindowRectInParent(panes[1]);
+    const POINT inRow = {row.right - 40, (row.top + row.bottom) / 2}, besideRow = {row.right + 10, inRow.y};
+    for (UINT flags : {TBF_HIDDEN, TBF_VISIBLE}) {
+        QBR_SetToolbarFlags(panes[1], flags);
+        UpdateWindow(frame), Pump();
+        EXPECT_EQ(GetSysColor(flags == TBF_HIDDEN ? COLOR_WINDOW : COLOR_BTNFACE),
+                  ScreenAt(frame, (flags == TBF_HIDDEN ? inRow : besideRow).x, inRow.y))
+            << (flags == TBF_HIDDEN ? "the frame where the row was" : "the dock beside the row");
+        EXPECT_TRUE(ScreenOf(side) == sidePixels) << "the side dock's pane";
+    }
+}

@@ -370,9 +370,7 @@ static HWND FloatingFrameOf(HWND pane) {
     // A made frame hears of a display change and comes back onto a monitor.
     // One whose place was on a monitor that is gone since comes there as it
     // is made; one placed off every monitor stays where it was put.
-    RECT r;
-    RectsOfPlace(UnbornPlaceOf(pane), &r, nullptr);
-    if (UnbornPlaceOf(pane).onMonitor && !OnSomeMonitor(r)) MoveIntoWorkArea(pane);
+    if (UnbornPlaceOf(pane).onMonitor && !OnSomeMonitor(UnbornPlaceOf(pane).outer)) MoveIntoWorkArea(pane);
     const WaitingPlace place = UnbornPlaceOf(pane);
     RECT client;
     RectsOfPlace(place, nullptr, &client);
@@ -407,7 +405,8 @@ static void PlaceRoleWindow(HWND target, int role, const RECT &placing, bool mov
     if (IsUnborn(target, role)) {
         WaitingPlace &place = UnbornPlaceOf(target);
         MovePlace(place, placing, moved, sized, true);
-        place.onMonitor = OnSomeMonitor(place.outer);
+        // Asked only as it moves: a new size keeps its corner where it was.
+        if (moved) place.onMonitor = OnSomeMonitor(place.outer);
     } else
         PlaceWindow(target, placing, moved, sized);
 }
