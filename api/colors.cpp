@@ -20,9 +20,11 @@ void RepaintEverything() {
         for (UINT d = 0; DockArea *dock = ListAt<DockArea>(manager->docks, d); ++d)
             RedrawWindow(dock->window, nullptr, nullptr, kRedrawAll); // the panes too
         for (UINT t = 0; ToolbarRecord *record = ListAt<ToolbarRecord>(manager->toolbars, t); ++t) {
-            HWND frame = GetTwinWindow(record->paneWindow);
-            ApplyFrameScheme(frame);
-            RedrawWindow(frame, nullptr, nullptr, kRedrawAll);
+            // A frame not made yet takes the scheme as it is made.
+            if (HWND frame = GetTwinWindow(record->paneWindow)) {
+                ApplyFrameScheme(frame);
+                RedrawWindow(frame, nullptr, nullptr, kRedrawAll);
+            }
         }
     }
     if (client->helpWindow) InvalidateRect(client->helpWindow, nullptr, TRUE);

@@ -31,13 +31,14 @@ constexpr int kTextBufferSize = 256;
 // One entry per toolbar. A title that is empty or cannot be read gives no
 // entry, but the index still counts, so every other id stays 201 + index.
 void AppendToolbarEntry(HMENU menu, const ToolbarRecord *record, UINT index) {
-    HWND frame = ResolveRoleWindow(record->paneWindow, ROLE_FLOATING);
-    int length = GetWindowTextLengthA(frame);
+    // The title is the pane's (its floating frame, if made, has the same).
+    HWND pane = record->paneWindow;
+    int length = GetWindowTextLengthA(pane);
     if (length <= 0) return;
     void *block = nullptr;
     if (!MemoryBlockAlloc(&block, static_cast<UINT>(length) + 1, 0)) return;
     LPSTR title = static_cast<LPSTR>(block);
-    if (GetWindowTextA(frame, title, length + 1) > 0)
+    if (GetWindowTextA(pane, title, length + 1) > 0)
         AppendMenuA(menu, (record->flags & TBF_VISIBLE) ? MF_CHECKED : MF_STRING, kFirstToolbarCommand + index, title);
     MemoryBlockFree(block);
 }

@@ -128,9 +128,6 @@ UINT GetDockSide(HWND window, UINT *side);
 // lay theirs as columns.
 bool IsAcrossDock(UINT side);
 
-// While one lives, PackDock does nothing: a whole arrangement being rebuilt
-// packs each dock once at its end, not once for every toolbar it receives
-// (which with many toolbars costs minutes).
 // ---- Screen readings ---------------------------------------------------------
 // The monitors, their work areas and the largest size of a window cost a trip
 // to the window system's display list to ask (under Wine about 0.2 ms each),
@@ -153,7 +150,10 @@ RECT NearestWorkArea(const RECT &rect);
 // Whether a rectangle lies on some monitor, in part at least.
 bool OnSomeMonitor(const RECT &rect);
 
-// A change to many toolbars at once (it reads the screen once, too).
+// A change to many toolbars at once. While one lives, PackDock does nothing:
+// a whole arrangement being rebuilt packs each dock once at its end, not once
+// for every toolbar it receives (which with many toolbars costs minutes). It
+// reads the screen once, too.
 class DeferDockPacking {
   public:
     DeferDockPacking();

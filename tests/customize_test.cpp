@@ -82,6 +82,7 @@ TEST_F(CustomizeTest, TheToolbarMenuOffersWhatAppliesAndActs) {
         EXPECT_TRUE(!IsWindow(gamma) || QBR_GetToolbarFlags(gamma) & TBF_FLOATING) << "Gamma stays where it was";
     }
     EXPECT_FALSE(IsWindow(gamma));
+    EXPECT_EQ(nullptr, GetTwinWindow(QBR_GetToolbar(manager, 1))) << "no floating frame made for Beta's entry";
 }
 
 // In the dark scheme, from the keyboard: the dialog opens a third of the way down on the first category;
