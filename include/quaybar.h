@@ -189,8 +189,9 @@ void QBR_ShowNewToolbarDialog(ToolbarManager *manager);
 HWND QBR_GetToolbar(ToolbarManager *manager, UINT index);
 
 /* Toolbars. A toolbar is named by the handle of its docked pane. x and y
-   place its floating frame on the screen; width and height, like the button
-   metrics, are 96-DPI sizes that the frame's scale enlarges. */
+   place its floating frame on the screen (a top-level window made the first
+   time the toolbar floats); width and height, like the button metrics, are
+   96-DPI sizes that the frame's scale enlarges. */
 HWND QBR_CreateToolbar(LPCSTR name, UINT flags, int x, int y, int width, int height, HWND dock, const UINT *ids,
                        UINT idCount);
 void QBR_DestroyToolbar(HWND pane);

@@ -36,14 +36,16 @@ Entries Capture(ToolbarManager *manager) {
     return QBR_CaptureLayout(manager, &count) ? Read(count) : Entries();
 }
 
-// Every move, size, show and paint of the thread's windows: {moves, sizes, shows, paints}.
+// Every move, size, show and paint of the thread's windows: {moves, sizes, shows, paints}; and restacks.
 std::map<HWND, std::array<int, 4>> acts;
+std::map<HWND, int> restacks;
 LRESULT CALLBACK CountSent(int code, WPARAM wParam, LPARAM lParam) {
     const CWPSTRUCT *m = reinterpret_cast<const CWPSTRUCT *>(lParam);
     if (code == HC_ACTION && m->message == WM_WINDOWPOSCHANGING) {
         const UINT f = reinterpret_cast<const WINDOWPOS *>(m->lParam)->flags;
         std::array<int, 4> &a = acts[m->hwnd];
         a[0] += !(f & SWP_NOMOVE), a[1] += !(f & SWP_NOSIZE), a[2] += (f & SWP_SHOWWINDOW) != 0;
+        restacks[m->hwnd] += !(f & SWP_NOZORDER);
     }
     if (code == HC_ACTION && m->message == WM_PAINT) ++acts[m->hwnd][3];
     return CallNextHookEx(nullptr, code, wParam, lParam);
@@ -128,9 +130,14 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     HWND restoredTop = QBR_GetDock(other, DOCK_TOP), restoredBottom = QBR_GetDock(other, DOCK_BOTTOM);
     const RECT pane = WindowRectInParent(QBR_GetToolbar(other, 0)); // the docks shown and packed
     EXPECT_EQ(Rect(-1, -1, pane.right, ClientRectOf(restoredTop).bottom), pane);
-    EXPECT_TRUE(IsWindowVisible(ResolveRoleWindow(QBR_GetToolbar(other, 1), ROLE_FLOATING)) &&
-                IsWindowVisible(restoredBottom) &&
+    HWND floats = ResolveRoleWindow(QBR_GetToolbar(other, 1), ROLE_FLOATING);
+    EXPECT_TRUE(IsWindowVisible(floats) && IsWindowVisible(restoredBottom) &&
                 ClientRectOf(GetParent(restoredBottom)).bottom == WindowRectInParent(restoredBottom).bottom);
+    SetActiveWindow(frame), Pump(); // the host's activation is watched again: its frame goes back on top once settled
+    const HHOOK watch = SetWindowsHookExA(WH_CALLWNDPROC, CountSent, nullptr, GetCurrentThreadId());
+    SetActiveWindow(others.back().first), Pump(), restacks.clear(), PumpFor(400);
+    UnhookWindowsHookEx(watch);
+    EXPECT_EQ(1, restacks[floats]);
 }
 
 // Values are read as they stand and used up (rows: key, value, what is left): short lines read 0,
