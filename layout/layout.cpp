@@ -128,9 +128,7 @@ static void FreeEntries(LPSTR *keys, LPSTR *values, UINT count) {
     MemoryBlockFree(values);
 }
 
-static bool HasTitle(const ToolbarRecord *toolbar) {
-    return GetWindowTextLengthA(toolbar->paneWindow) > 0;
-}
+static bool HasTitle(const ToolbarRecord *toolbar) { return GetWindowTextLengthA(toolbar->paneWindow) > 0; }
 
 // The dock's toolbars that are stored: an empty title at the end of the
 // dock's value is read as the value's end and never comes back, so such

@@ -124,7 +124,8 @@ TEST_F(LayoutTest, CaptureWritesTheFormatAndRestoreRebuildsIt) {
     EnumThreadWindows(GetCurrentThreadId(), CountFrame, LPARAM(&frames));
     EXPECT_EQ(2, frames);
     const RECT was = WindowRectInParent(QBR_GetToolbar(manager, 1)), is = WindowRectInParent(QBR_GetToolbar(other, 1));
-    EXPECT_EQ(Rect(0, 0, was.right - was.left, was.bottom - was.top), Rect(0, 0, is.right - is.left, is.bottom - is.top))
+    EXPECT_EQ(Rect(0, 0, was.right - was.left, was.bottom - was.top),
+              Rect(0, 0, is.right - is.left, is.bottom - is.top))
         << "the hidden pane of the floating toolbar is sized for its dock";
     EXPECT_EQ(entries, Capture(other));
     HWND restoredTop = QBR_GetDock(other, DOCK_TOP), restoredBottom = QBR_GetDock(other, DOCK_BOTTOM);

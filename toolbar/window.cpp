@@ -199,9 +199,9 @@ static int Height(const RECT &r) { return r.bottom - r.top; }
 // where it would otherwise be sized now and moved again a moment later.
 namespace {
 struct WaitingPlace {
-    HWND twin;   // the twin when the place was taken: a handle used again is not this window
-    RECT outer;  // screen coordinates
-    SIZE around; // what the window system puts around the client area
+    HWND twin;             // the twin when the place was taken: a handle used again is not this window
+    RECT outer;            // screen coordinates
+    SIZE around;           // what the window system puts around the client area
     bool onMonitor = true; // of a frame not made: whether its place lay on a monitor when taken
 };
 std::unordered_map<HWND, WaitingPlace> waitingPlaces;
@@ -475,7 +475,6 @@ void GetItemArea(HWND window, int role, RECT *rect) {
     const RECT margins = AreaMargins(target, role);
     *rect = RECT{margins.left, margins.top, client.right - margins.right, client.bottom - margins.bottom};
 }
-
 
 // SetWindowPos for the library's own moves: never activating, never touching
 // the z-order, and only with the parts that change.
@@ -843,7 +842,6 @@ void UnwatchHostActivation() {
     if (activationHook) UnhookWindowsHookEx(activationHook);
     activationHook = nullptr;
 }
-
 
 ActivationWatchPause::ActivationWatchPause() {
     if (watchPauses++ == 0 && activationHook) {
