@@ -662,6 +662,8 @@ void BenchDestroyAndLongLines() {
     Row(name, MeasureOnce(setup("Long", items), apply, teardown, reps));
 }
 
+void PhaseTable(const char *title, const std::vector<const char *> &names, const std::vector<double> &spent);
+
 // Where an apply spends its time: the steps that restoring one toolbar takes,
 // each on its own clock, summed over all toolbars, then the queue drained.
 void ProfileApply(UINT toolbars) {
@@ -715,15 +717,9 @@ void ProfileApply(UINT toolbars) {
     t0 = NowUs();
     Pump();
     spent[kPump] += NowUs() - t0;
-    double total = 0;
-    for (double x : spent)
-        total += x;
-    printf("\n### Where an apply of %u toolbars spends its time (one run)\n\n", toolbars);
-    printf("| %-34s | %10s | %6s |\n|%s|%s|%s|\n", "phase", "time", "share", std::string(36, '-').c_str(),
-           std::string(12, '-').c_str(), std::string(8, '-').c_str());
-    for (int i = 0; i < kPhases; ++i)
-        printf("| %-34s | %10s | %5.1f%% |\n", names[i], Fmt(spent[i]).c_str(), 100 * spent[i] / total);
-    printf("| %-34s | %10s | %5.1f%% |\n", "total", Fmt(total).c_str(), 100.0);
+    char title[80];
+    snprintf(title, sizeof title, "Where an apply of %u toolbars spends its time (one run)", toolbars);
+    PhaseTable(title, std::vector<const char *>(names, names + kPhases), std::vector<double>(spent, spent + kPhases));
     t0 = NowUs();
     QBR_DestroyManager(manager);
     const double dm = NowUs() - t0;
