@@ -110,7 +110,7 @@ static void OnDoubleClick(HWND window, LPARAM lParam) {
     int x = static_cast<int>(LOWORD(lParam)), y = static_cast<int>(HIWORD(lParam));
     HWND pane = ResolveRoleWindow(window, ROLE_DOCKED);
     if (HitTestToolbar(pane, x, y, nullptr, nullptr)) return; // on a button: the click did it all
-    if (InChevron(window, x, y)) return;                       // the chevron: a second menu, nothing more
+    if (InChevron(window, x, y)) return;                      // the chevron: a second menu, nothing more
     // A locked toolbar stays where it is; its close box still hides it.
     UINT flags = QBR_GetToolbarFlags(pane) | (QBR_GetLocked() ? TBF_LOCKED_PLACE : 0);
     if (IsFloatingFrame(window)) {
@@ -196,10 +196,8 @@ LRESULT CALLBACK ToolbarWindowProc(HWND window, UINT message, WPARAM wParam, LPA
         return 0;
     case WM_SHOWWINDOW: // the platform also hides and shows owned frames here
         // A hidden frame's place is taken before anyone sees it (its owner
-        // restored shows it without the library). A pane shown while packing
-        // is deferred takes its place from the packing, which comes before
-        // anything is painted.
-        if (wParam && !(IsToolbarPane(window) && DeferDockPacking::Active())) PlaceWaitingWindow(window);
+        // restored shows it without the library).
+        if (wParam) WaitingWindowShows(window);
         AccessShowWindow(window, wParam, lParam);
         return DefWindowProcA(window, message, wParam, lParam);
     case WM_GETOBJECT:

@@ -90,6 +90,8 @@ void GetPlacedRects(HWND window, RECT *outer, RECT *client);
 void GetToolbarPlacedRects(HWND window, int role, RECT *outer, RECT *client);
 DWORD GetToolbarWindowStyle(HWND window, int role, int which);
 void PlaceWaitingWindow(HWND window);
+// A window that waits is shown (WM_SHOWWINDOW): placed now, or by the packing to come.
+void WaitingWindowShows(HWND window);
 void ForgetWaitingWindow(HWND window);
 void WaitingWindowPlacedByOthers(HWND window, const WINDOWPOS *pos);
 void GetToolbarWindowRect(HWND window, int role, RECT *rect);

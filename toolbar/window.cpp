@@ -370,8 +370,9 @@ static HWND FloatingFrameOf(HWND pane) {
     // A made frame hears of a display change and comes back onto a monitor.
     // One whose place was on a monitor that is gone since comes there as it
     // is made; one placed off every monitor stays where it was put.
-    if (UnbornPlaceOf(pane).onMonitor && !OnSomeMonitor(UnbornPlaceOf(pane).outer)) MoveIntoWorkArea(pane);
-    const WaitingPlace place = UnbornPlaceOf(pane);
+    const WaitingPlace &unborn = UnbornPlaceOf(pane);
+    if (unborn.onMonitor && !OnSomeMonitor(unborn.outer)) MoveIntoWorkArea(pane);
+    const WaitingPlace place = unborn; // a copy: the entry goes once the frame is made
     RECT client;
     RectsOfPlace(place, nullptr, &client);
     std::vector<char> title(static_cast<size_t>(GetWindowTextLengthA(pane)) + 1, '\0');
@@ -417,6 +418,13 @@ void PlaceWaitingWindow(HWND window) {
         PlaceFrame(window, nullptr, SWP_NOZORDER | SWP_NOACTIVATE);
     else
         PlaceWindow(window, RECT{}, false, false); // a pane: placed as the packing places it
+}
+
+void WaitingWindowShows(HWND window) {
+    // A pane shown while packing is deferred takes its place from the
+    // packing, which comes before anything is painted.
+    if (IsToolbarPane(window) && DeferDockPacking::Active()) return;
+    PlaceWaitingWindow(window);
 }
 
 void ForgetWaitingWindow(HWND window) {
